@@ -1,0 +1,289 @@
+/** @file raster.h
+ *
+ * Raster operations on surfaces in ordinary memory.
+ *
+ * There is no surface record.  A surface is a pointer to the first byte of its
+ * pixel (0, 0), a line increment (bytes from a pixel to the one below it) and a
+ * pixel size or layout.  Pixel (x, y) starts at
+ *
+ *     buffer + y * lineIncrement + x * bytesPerPixel
+ *
+ * computed at pointer width.  No alignment is demanded.  Pixels are
+ * little-endian: a 24-bit pixel is B G R in memory, a 32-bit one B G R A.  If
+ * red and blue look swapped, the pixels came from a library that has red first.
+ *
+ * Nothing clips: a rectangle must lie inside memory that the caller provides,
+ * and no byte outside it is read or written.  No pointer is tested for null,
+ * but an empty rectangle touches no memory.  No function allocates (the scaler
+ * apart) or has any state; calls may run at once on separate memory.
+ *
+ * How rows follow each other when a line increment is not a whole number of
+ * pixels differs by family, and each function tells:
+ *   - exact: by the line increment, at every pixel size;
+ *   - rounded steps: the first row exactly, then by the line increment rounded
+ *     down to whole pixels, at 2 and 4 bytes per pixel;
+ *   - rounded: by the line increment rounded down to whole pixels, for the
+ *     first row too, at 2 and 4 bytes per pixel.
+ *
+ * An argument that no caller may pass (a depth outside the tables) ends in
+ * Warning and Panic, see hearth.h, before anything is written.
+ */
+#ifndef QUILLON_RASTER_H
+#define QUILLON_RASTER_H
+
+#include "quillonTypes.h"
+#include "rect.h"
+
+QUILLON_BEGIN_DECLS
+
+/** @name Fill, copy, alpha
+ * @{
+ */
+
+/** Fills a rectangle with one pixel value.
+ *
+ * Rows: rounded steps.
+ *
+ * @param bytesPerPixel  1 to 4, anything else is a Panic
+ * @param pixel          of which the low bytesPerPixel bytes are stored, low
+ *                       byte first
+ */
+QUILLON_API void Raster_RectFill(uint8 *frameBuffer, int32 lineIncrement, int32 bytesPerPixel,
+                                 uint32 pixel, uint32 x, uint32 y, uint32 width, uint32 height);
+
+/** Copies a rectangle between two surfaces or within one.
+ *
+ * Safe for overlap: on one surface the result is that of a copy through a
+ * temporary buffer.  Rectangles on surfaces of different line increments that
+ * overlap in memory are copied row by row, from the last row when srcY < dstY,
+ * from the first otherwise.  Line increments may be negative.
+ *
+ * Rows: exact.
+ *
+ * @param bytesPerPixel  scales byte counts and is not checked; 0 or less copies
+ *                       nothing
+ */
+QUILLON_API void Raster_RectCopy(uint8 *dstBuffer, int32 dstLineIncrement, const uint8 *srcBuffer,
+                                 int32 srcLineIncrement, int32 bytesPerPixel, uint32 srcX,
+                                 uint32 srcY, uint32 dstX, uint32 dstY, uint32 width,
+                                 uint32 height);
+
+/** Sets the alpha byte of 32-bit pixels; their colour stays.
+ *
+ * Rows: exact.
+ */
+QUILLON_API void Raster_RectFillAlpha(uint8 *frameBuffer, int32 lineIncrement, uint8 alpha,
+                                      uint32 x, uint32 y, uint32 width, uint32 height);
+
+/** Composites premultiplied 32-bit pixels over 32-bit pixels.
+ *
+ * For each colour byte: dst = min(255, src + dst * (255 - srcAlpha) / 255), the
+ * division dropping its remainder.  The alpha byte of the destination keeps its
+ * value.
+ *
+ * Where the surfaces overlap, the outcome is that of going through the rows
+ * from top to bottom and through each row from left to right, each pixel of
+ * both surfaces being read whole before it is written.
+ *
+ * Rows: exact.
+ */
+QUILLON_API void Raster_AlphaBlendOver(uint8 *dstBuffer, uint32 dstX, uint32 dstY,
+                                       int32 dstLineIncrement, const uint8 *srcBuffer, uint32 srcX,
+                                       uint32 srcY, int32 srcLineIncrement, uint32 width,
+                                       uint32 height);
+
+/** @} */
+
+/** @name Pixel layouts
+ *
+ * A layout is named by its depth:
+ *
+ * | depth | bytes | red      | green    | blue     | rest                          |
+ * |-------|-------|----------|----------|----------|-------------------------------|
+ * | 3     | 1     | 0x04     | 0x20     | 0x80     | written as 0                  |
+ * | 6     | 1     | 0x30     | 0x0C     | 0x03     | written as 0                  |
+ * | 8     | 1     | 0x07     | 0x38     | 0xC0     | none                          |
+ * | 15    | 2     | 0x7C00   | 0x03E0   | 0x001F   | ignored, written as 0         |
+ * | 16    | 2     | 0xF800   | 0x07E0   | 0x001F   | none                          |
+ * | 24    | 3     | 0xFF0000 | 0x00FF00 | 0x0000FF | none; B G R in memory         |
+ * | 32    | 4     | 0xFF0000 | 0x00FF00 | 0x0000FF | alpha on top; B G R A in memory |
+ *
+ * A channel narrows by dropping its low bits, and widens by repeating its top
+ * bits below itself; there is no rounding and no dithering.
+ *
+ * A palette is an array of 32-bit pixels, the caller's, indexed by a one-byte
+ * source pixel; pseudoColor says that the source pixels are such indices.
+ * There is no pseudo-colour destination.  Entries that no pixel uses are not
+ * read; without pseudoColor the palette is not looked at and may be null.
+ * @{
+ */
+
+/** Whether a mode is one that the raster code works in: depth 24 in 24 or 32
+ * bits, depth 15 or 16 in 16 bits, or any depth in 8 bits of pseudo colour.
+ *
+ * @param depth         significant colour bits
+ * @param bitsPerPixel  bits of storage
+ */
+QUILLON_API bool Raster_IsModeReasonable(int32 depth, int32 bitsPerPixel, bool pseudoColor);
+
+/** Converts one pixel value.
+ *
+ * From 15 and 16 the alpha of a 32-bit result is 0.  From 24, 32 and a palette
+ * the top byte goes along to 24 and 32.  Equal depths give the value unchanged.
+ *
+ * @param pixel     in the low bits; with pseudoColor the index, which is not
+ *                  cut to 8 bits: the palette must cover it
+ * @param srcDepth  15, 16, 24 or 32, or 8 with pseudoColor; else a Panic
+ * @param dstDepth  one of the seven layouts; else a Panic
+ */
+QUILLON_API uint32 Raster_ConvertOnePixel(uint32 pixel, int32 srcDepth, int32 dstDepth,
+                                          bool pseudoColor, const uint32 *palette);
+
+/** How to place a colour component in a channel:
+ * ((component * multiplier) >> shift) & mask, multiplied modulo 2^32.
+ */
+typedef struct RasterRGBParam {
+    uint32 multiplier;
+    uint32 shift;
+    uint32 mask;
+} RasterRGBParam;
+
+/** Works out how to place a component in a channel.
+ *
+ * Only the lowest run of set bits of mask counts as the channel.  The component
+ * is truncated to a narrower channel, repeated to fill a wider one.
+ *
+ * @param param          output
+ * @param componentBits  bits of the component, 1 to 31
+ * @param mask           neither 0 nor all ones; the channel's bits, rounded up
+ *                       to a multiple of componentBits, must not be above 31
+ */
+QUILLON_API void RasterRGB_MakeRGBParam(RasterRGBParam *param, int32 componentBits, uint32 mask);
+
+/** @} */
+
+/** @name Conversion of rectangles
+ *
+ * Line increments and coordinates are unsigned.  Rows: rounded, except where
+ * the layouts are equal and in Raster_ConvertIndexTo32, where they are exact.
+ * Where layouts differ, the two rectangles must not overlap: the result is
+ * unspecified then.
+ *
+ * From 15, 16 and 24 the alpha of a 32-bit pixel is 255; from a palette and
+ * from 32 it goes along.
+ *
+ * Depths are looked at before anything else, so a wrong one is a Panic also for
+ * an empty rectangle.
+ * @{
+ */
+
+/** Converts a rectangle from one layout to another.
+ *
+ * @param dstDepth  3, 6, 8, 15, 16, 24 or 32
+ * @param srcDepth  15, 16, 24 or 32; or the same as dstDepth, which is a plain
+ *                  copy; or at most 8 with pseudoColor, one byte an index
+ * @param palette   must cover every index in the rectangle
+ */
+QUILLON_API void Raster_ConvertPixels(uint8 *dstBuffer, uint32 dstLineIncrement, int32 dstDepth,
+                                      const uint8 *srcBuffer, uint32 srcLineIncrement,
+                                      int32 srcDepth, bool pseudoColor, const uint32 *palette,
+                                      uint32 srcX, uint32 srcY, uint32 dstX, uint32 dstY,
+                                      uint32 width, uint32 height);
+
+/** Converts a rectangle of any source layout to 32 bits.
+ *
+ * @param srcDepth  15, 16, 24 or 32, or at most 8 with pseudoColor
+ */
+QUILLON_API void Raster_ConvertPixelsTo32(uint8 *dstBuffer, uint32 dstLineIncrement,
+                                          const uint8 *srcBuffer, uint32 srcLineIncrement,
+                                          int32 srcDepth, bool pseudoColor, const uint32 *palette,
+                                          uint32 srcX, uint32 srcY, uint32 dstX, uint32 dstY,
+                                          uint32 width, uint32 height);
+
+/** Converts a rectangle of 32-bit pixels to any layout.
+ *
+ * @param dstDepth  3, 6, 8, 15, 16, 24 or 32
+ */
+QUILLON_API void Raster_ConvertPixelsFrom32(uint8 *dstBuffer, uint32 dstLineIncrement,
+                                            int32 dstDepth, const uint8 *srcBuffer,
+                                            uint32 srcLineIncrement, uint32 srcX, uint32 srcY,
+                                            uint32 dstX, uint32 dstY, uint32 width, uint32 height);
+
+/** Expands palette indices to whole palette entries, top byte included.
+ *
+ * Rows: exact.
+ */
+QUILLON_API void Raster_ConvertIndexTo32(uint8 *dstBuffer, uint32 dstLineIncrement,
+                                         const uint8 *srcBuffer, uint32 srcLineIncrement,
+                                         const uint32 *palette, uint32 srcX, uint32 srcY,
+                                         uint32 dstX, uint32 dstY, uint32 width, uint32 height);
+
+/** Copies a rectangle between surfaces of one layout; overlap is safe as in
+ * Raster_RectCopy.
+ *
+ * Rows: exact.
+ *
+ * @param depth  not checked: 3 and 6 are one byte a pixel, 15 is two, anything
+ *               else depth / 8, truncated; 0 or less copies nothing
+ */
+QUILLON_API void RasterCopyPixels(uint8 *dstBuffer, uint32 dstLineIncrement,
+                                  const uint8 *srcBuffer, uint32 srcLineIncrement, int32 depth,
+                                  uint32 srcX, uint32 srcY, uint32 dstX, uint32 dstY, uint32 width,
+                                  uint32 height);
+
+/** @} */
+
+/** @name Scaling
+ * @{
+ */
+
+/** Resamples a 32-bit image into a rectangle of another.
+ *
+ * All four channels of a pixel are treated alike.  Each axis is resampled by
+ * itself: with filter 0 by the nearest sample; otherwise it is copied at factor
+ * 1, interpolated when it grows, averaged when it shrinks.  Destination pixel 0
+ * lies at source position 0, and only the rectangle is written: scaling a part
+ * writes there exactly what scaling the whole does.
+ *
+ * The arithmetic is integer and the same on every processor.  Weights are 8
+ * bits wide and products are truncated, so an interpolated or averaged value
+ * may come out one or two levels low.  A shrink by more than 32 averages only
+ * the first 32 rows of each span, and comes out darker accordingly.
+ *
+ * Takes one block of scratch memory for the call: a few destination rows.
+ *
+ * Rows: exact; the line increments may be negative, srcLineIncrement may be 0.
+ *
+ * @param dstWidth, dstHeight  size of the destination; only tested, at most 32767
+ * @param left, top, right, bottom  the rectangle to write, right and bottom
+ *                exclusive, inside the destination; an empty one writes nothing
+ * @param srcWidth, srcHeight  size of the source, at most 32767; the images
+ *                must not overlap
+ * @param scaleX, scaleY  destination pixels per source pixel, above 1/32767 and
+ *                at most 65536
+ * @param filter  0 for nearest sampling, anything else for filtered
+ * @return 1 when the arguments are acceptable, also when there was nothing to
+ *         do; 0, with nothing written, when a size or factor is out of range or
+ *         the scratch memory cannot be had
+ */
+QUILLON_API uint32 Raster_Scale(uint8 *dstBuffer, int32 dstLineIncrement, uint32 dstWidth,
+                                uint32 dstHeight, int32 left, int32 top, int32 right, int32 bottom,
+                                const uint8 *srcBuffer, int32 srcLineIncrement, uint32 srcWidth,
+                                uint32 srcHeight, double scaleX, double scaleY, uint32 filter);
+
+/** Maps a rectangle of source coordinates to the destination pixels that depend
+ * on it when the source is scaled: scaled, grown by one source pixel (at least
+ * one destination pixel) on each side, and cut to the scaled image.
+ *
+ * left and top have no upper limit, right and bottom no lower one.
+ *
+ * @param rect  in source coordinates; changed in place to destination ones
+ */
+QUILLON_API void Raster_ScaleSrcCoordinates(Rect *rect, uint32 srcWidth, uint32 srcHeight,
+                                            double scaleX, double scaleY);
+
+/** @} */
+
+QUILLON_END_DECLS
+
+#endif /* QUILLON_RASTER_H */
