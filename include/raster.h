@@ -94,6 +94,155 @@ QUILLON_API void Raster_AlphaBlendOver(uint8 *dstBuffer, uint32 dstX, uint32 dst
 
 /** @} */
 
+/** @name Raster operations
+ *
+ * A raster operation combines two operands bit by bit: S, the source, and D,
+ * what the destination holds; the result replaces D.  The code is its truth
+ * table: bit 3 - (2 * s + d) is the result for the operand bits s and d.
+ *
+ * Codes above 15 do nothing, as RASTER_ROP_NOOP does.
+ * @{
+ */
+
+/** The sixteen raster operations. */
+enum {
+    RASTER_ROP_CLEAR = 0,          /**< 0 */
+    RASTER_ROP_AND = 1,            /**< S & D */
+    RASTER_ROP_AND_REVERSE = 2,    /**< S & ~D */
+    RASTER_ROP_COPY = 3,           /**< S */
+    RASTER_ROP_AND_INVERTED = 4,   /**< ~S & D */
+    RASTER_ROP_NOOP = 5,           /**< D; nothing is read or written */
+    RASTER_ROP_XOR = 6,            /**< S ^ D */
+    RASTER_ROP_OR = 7,             /**< S | D */
+    RASTER_ROP_NOR = 8,            /**< ~(S | D) */
+    RASTER_ROP_EQUIV = 9,          /**< ~(S ^ D) */
+    RASTER_ROP_INVERT = 10,        /**< ~D */
+    RASTER_ROP_OR_REVERSE = 11,    /**< S | ~D */
+    RASTER_ROP_COPY_INVERTED = 12, /**< ~S */
+    RASTER_ROP_OR_INVERTED = 13,   /**< ~S | D */
+    RASTER_ROP_NAND = 14,          /**< ~(S & D) */
+    RASTER_ROP_SET = 15            /**< all bits 1 */
+};
+
+/** Combines a rectangle with one pixel value.
+ *
+ * Rows: rounded steps.
+ *
+ * @param bytesPerPixel  1 to 4, anything else is a Panic, whatever the code and
+ *                       the size of the rectangle
+ * @param pixel          S, of which the low bytesPerPixel bytes count
+ * @param rop            the code, all 32 bits of it
+ */
+QUILLON_API void Raster_RectROPfill(uint8 *frameBuffer, int32 lineIncrement, int32 bytesPerPixel,
+                                    uint32 pixel, uint32 rop, uint32 x, uint32 y, uint32 width,
+                                    uint32 height);
+
+/** Combines a rectangle with one of another surface or of the same one.
+ *
+ * On one surface whose line increment is a whole number of pixels, the result
+ * is that of combining the rectangles as they were, however they overlap.
+ * Surfaces that overlap in any other way are gone through in a fixed order:
+ * from the last row where srcY < dstY; else from the first row, and in it from
+ * the right where srcY = dstY and dstX > srcX; from the left otherwise.  A pixel
+ * of 1, 2 or 4 bytes is read whole before it is written, one of 3 bytes byte by
+ * byte, in the direction of the row.
+ *
+ * RASTER_ROP_COPY is Raster_RectCopy, with its row rule and without a check of
+ * the pixel size.  Codes 0, 10 and 15 do not read the source.
+ *
+ * Rows: the first one walked exactly, then by the signed step rounded down to
+ * whole pixels, at 2 and 4 bytes per pixel; going upwards the step is the
+ * negated line increment.
+ *
+ * @param bytesPerPixel  1 to 4, anything else is a Panic (unless the code is
+ *                       RASTER_ROP_COPY), whatever the size of the rectangle
+ * @param rop            the code, all 32 bits of it
+ */
+QUILLON_API void Raster_RectROPcopy(uint8 *dstBuffer, int32 dstLineIncrement,
+                                    const uint8 *srcBuffer, int32 srcLineIncrement,
+                                    int32 bytesPerPixel, uint32 srcX, uint32 srcY, uint32 rop,
+                                    uint32 dstX, uint32 dstY, uint32 width, uint32 height);
+
+/** @} */
+
+/** @name Bit expansion
+ *
+ * A bitmap has one bit per pixel; a row begins on a byte, and bit 7 of a byte
+ * is its leftmost pixel.  Of each row the first (width + 7) / 8 bytes are read,
+ * and the bits behind the last pixel are ignored.  bitmap and surface must not
+ * overlap.
+ *
+ * There are no coordinates: srcBits and dstBuffer are the first bitmap byte and
+ * the first pixel of the rectangle.  A width below 1 writes nothing.
+ *
+ * Rows: exact, on both sides.
+ * @{
+ */
+
+/** Writes foreground where a bit is set and background where it is clear.
+ *
+ * @param bytesPerPixel  1 to 4; anything else writes nothing
+ * @param foreground, background  of which the low bytesPerPixel bytes are stored
+ */
+QUILLON_API void Raster_BitsToPixels(const uint8 *srcBits, int32 srcLineIncrement, uint8 *dstBuffer,
+                                     int32 dstLineIncrement, int32 bytesPerPixel, int32 width,
+                                     uint32 height, uint32 foreground, uint32 background);
+
+/** Raster_BitsToPixels at 1 byte per pixel. */
+QUILLON_API void RasterBitsToPixels8(const uint8 *srcBits, int32 srcLineIncrement, uint8 *dstBuffer,
+                                     int32 dstLineIncrement, int32 width, uint32 height,
+                                     uint32 foreground, uint32 background);
+
+/** Raster_BitsToPixels at 2 bytes per pixel. */
+QUILLON_API void RasterBitsToPixels16(const uint8 *srcBits, int32 srcLineIncrement,
+                                      uint8 *dstBuffer, int32 dstLineIncrement, int32 width,
+                                      uint32 height, uint32 foreground, uint32 background);
+
+/** Raster_BitsToPixels at 3 bytes per pixel. */
+QUILLON_API void RasterBitsToPixels24(const uint8 *srcBits, int32 srcLineIncrement,
+                                      uint8 *dstBuffer, int32 dstLineIncrement, int32 width,
+                                      uint32 height, uint32 foreground, uint32 background);
+
+/** Raster_BitsToPixels at 4 bytes per pixel. */
+QUILLON_API void RasterBitsToPixels32(const uint8 *srcBits, int32 srcLineIncrement,
+                                      uint8 *dstBuffer, int32 dstLineIncrement, int32 width,
+                                      uint32 height, uint32 foreground, uint32 background);
+
+/** Writes a pixel value where a bit is set.
+ *
+ * Memory under a clear bit is neither read nor written, so that it may belong
+ * to another thread or lie in a page that cannot be written.
+ *
+ * @param bytesPerPixel  1 to 4; anything else writes nothing
+ * @param pixel          of which the low bytesPerPixel bytes are stored
+ */
+QUILLON_API void Raster_BitsToPixelsStencil(const uint8 *srcBits, int32 srcLineIncrement,
+                                            uint8 *dstBuffer, int32 dstLineIncrement,
+                                            int32 bytesPerPixel, int32 width, uint32 height,
+                                            uint32 pixel);
+
+/** Raster_BitsToPixelsStencil at 1 byte per pixel. */
+QUILLON_API void RasterBitsToPixelsStencil8(const uint8 *srcBits, int32 srcLineIncrement,
+                                            uint8 *dstBuffer, int32 dstLineIncrement, int32 width,
+                                            uint32 height, uint32 pixel);
+
+/** Raster_BitsToPixelsStencil at 2 bytes per pixel. */
+QUILLON_API void RasterBitsToPixelsStencil16(const uint8 *srcBits, int32 srcLineIncrement,
+                                             uint8 *dstBuffer, int32 dstLineIncrement, int32 width,
+                                             uint32 height, uint32 pixel);
+
+/** Raster_BitsToPixelsStencil at 3 bytes per pixel. */
+QUILLON_API void RasterBitsToPixelsStencil24(const uint8 *srcBits, int32 srcLineIncrement,
+                                             uint8 *dstBuffer, int32 dstLineIncrement, int32 width,
+                                             uint32 height, uint32 pixel);
+
+/** Raster_BitsToPixelsStencil at 4 bytes per pixel. */
+QUILLON_API void RasterBitsToPixelsStencil32(const uint8 *srcBits, int32 srcLineIncrement,
+                                             uint8 *dstBuffer, int32 dstLineIncrement, int32 width,
+                                             uint32 height, uint32 pixel);
+
+/** @} */
+
 /** @name Pixel layouts
  *
  * A layout is named by its depth:
