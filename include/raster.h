@@ -14,7 +14,7 @@
  *
  * Nothing clips: a rectangle must lie inside memory that the caller provides,
  * and no byte outside it is read or written.  No pointer is tested for null,
- * but an empty rectangle touches no memory.  No function allocates (the scaler
+ * but an empty rectangle touches no memory.  No function allocates (the scalers
  * apart) or has any state; calls may run at once on separate memory.
  *
  * How rows follow each other when a line increment is not a whole number of
@@ -32,6 +32,7 @@
 #define QUILLON_RASTER_H
 
 #include "quillonTypes.h"
+#include "rasterCursor.h"
 #include "rect.h"
 
 QUILLON_BEGIN_DECLS
