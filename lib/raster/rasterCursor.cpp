@@ -179,12 +179,12 @@ Block<uint8> padImage(const ScaledShape &shape, const uint8 *image, uint8 fill) 
     return padded;
 }
 
-// Scales from src into the rectangle of dst up to (right, bottom).
-bool scalePadded(const ScaledShape &shape, uint8 *dst, uint32 right, uint32 bottom,
+// Scales the padded image src into the first width columns and height rows of dst.
+bool scalePadded(const ScaledShape &shape, uint8 *dst, uint32 width, uint32 height,
                  const uint8 *src, uint32 filter) {
     const ScaledAxis &x = shape.x, &y = shape.y;
     return Raster_Scale(dst, static_cast<int32>(lineBytes(x.dstSize)), x.dstSize, y.dstSize, 0, 0,
-                        static_cast<int32>(right), static_cast<int32>(bottom), src,
+                        static_cast<int32>(width), static_cast<int32>(height), src,
                         static_cast<int32>(lineBytes(x.paddedSize)), x.paddedSize, y.paddedSize,
                         x.scale, y.scale, filter) != 0;
 }
