@@ -67,8 +67,8 @@ void modelExpansion(uint32 width, uint32 height, uint32 depth, const uint8 *bits
         for (uint32 x = 0; x < width; ++x) {
             const uint8 byte = bits[size_t{y} * modelSize(width, 1, 1) + x / 8];
             const bool isSet = (byte >> (7 - x % 8) & 1) != 0;
-            std::memset(dst + size_t{y} * modelSize(width, 1, depth) + size_t{x} * pixelBytes,
-                        isSet ? 0xFF : 0, pixelBytes);
+            std::fill_n(dst + size_t{y} * modelSize(width, 1, depth) + size_t{x} * pixelBytes,
+                        pixelBytes, isSet ? uint8{0xFF} : uint8{0});
         }
 }
 
