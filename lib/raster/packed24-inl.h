@@ -21,10 +21,15 @@ HWY_ALIGN constexpr uint8_t kSpreadBytes[16] = {0, 1, 2, 0x80, 3, 4,  5,  0x80,
                                                 6, 7, 8, 0x80, 9, 10, 11, 0x80};
 HWY_ALIGN constexpr uint8_t kPackBytes[16] = {0,  1,  2,  4,  5,    6,    8,    9,
                                               10, 12, 13, 14, 0x80, 0x80, 0x80, 0x80};
-// Across groups of 16 bytes: three words a group to four, and back.
-HWY_ALIGN constexpr uint32_t kSpreadWords[16] = {0, 1, 2, 2, 3, 4, 5, 5, 6, 7, 8, 8, 9, 10, 11, 11};
-HWY_ALIGN constexpr uint32_t kPackWords[16] = {0,  1,  2,  4,  5, 6, 8,  9,
-                                               10, 12, 13, 14, 3, 7, 11, 15};
+// Across groups of 16 bytes: three words a group to four, and back.  The words
+// behind the packed ones are not used, but have to be words of the vector.
+HWY_ALIGN constexpr uint32_t kSpreadWords[16] = {0, 1, 2, 2, 3, 4,  5,  5,
+                                                 6, 7, 8, 8, 9, 10, 11, 11};
+template <size_t kWords>
+HWY_ALIGN constexpr uint32_t kPackWords[kWords] = {0,  1,  2,  4,  5, 6, 8,  9,
+                                                   10, 12, 13, 14, 3, 7, 11, 15};
+template <>
+HWY_ALIGN constexpr uint32_t kPackWords<8>[8] = {0, 1, 2, 4, 5, 6, 3, 7};
 
 // Exactly three bytes a pixel are read: half a vector, and a quarter.
 template <class D>
@@ -65,7 +70,7 @@ HWY_INLINE void store24([[maybe_unused]] D d, hn::Vec<D> v, uint8_t *dst) {
         auto bytes = hn::TableLookupBytesOr0(hn::BitCast(d8, v), hn::LoadDup128(d8, kPackBytes));
         if constexpr (n > 4)
             bytes = hn::BitCast(d8, hn::TableLookupLanes(hn::BitCast(d, bytes),
-                                                         hn::SetTableIndices(d, kPackWords)));
+                                                         hn::SetTableIndices(d, kPackWords<n>)));
         hn::StoreU(hn::LowerHalf(half, bytes), half, dst);
         hn::StoreU(hn::LowerHalf(quarter, hn::UpperHalf(half, bytes)), quarter, dst + 2 * n);
 #endif
