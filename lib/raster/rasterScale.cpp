@@ -25,7 +25,6 @@ ScaleAxis makeAxis(double scale, bool isFiltered, int32 first, int32 end, uint32
     const Extended factor(scale), one(kScaleOne);
     ScaleAxis axis{};
     axis.step = (one / factor).truncated();
-    axis.normaliser = (factor * one).truncated();
     axis.start = axis.step * static_cast<uint32>(first);
     axis.srcSize = srcSize;
     axis.dstSize = static_cast<uint32>(end) - static_cast<uint32>(first);
@@ -33,6 +32,7 @@ ScaleAxis makeAxis(double scale, bool isFiltered, int32 first, int32 end, uint32
         axis.method = ScaleMethod::kNearest;
     } else if (axis.step > kScaleOne) {
         axis.method = ScaleMethod::kBox;
+        axis.normaliser = (factor * one).truncated();
     } else {
         axis.method = ScaleMethod::kLinear;
         axis.start -= kScaleOne / 2;
