@@ -29,6 +29,10 @@ namespace {
 
 constexpr size_t kPixelBytes = 4;
 
+// The pixels in a vector.
+template <class D>
+constexpr auto kPixels = static_cast<uint32>(kLanes<D>);
+
 // Pixels at any address.  With a single lane Highway reads through a pointer,
 // which would have to be aligned.
 template <class D>
@@ -172,14 +176,11 @@ HWY_INLINE void walkWindows(size_t count, size_t limit, const Body &body) {
     walkWindows<kLanes<Widest<uint32>>>(count, limit, body);
 }
 
-// Pixels by their index in the source row.  All lie within kWindows vectors from
-// first on, and in the row.
+// Source pixels by their offset from the start of kWindows vectors that lie end
+// to end.
 template <uint32 kWindows, class D>
-HWY_INLINE hn::Vec<D> pick(D d, const uint8 *src, uint32 srcSize, uint32 first, hn::Vec<D> index) {
-    constexpr auto n = static_cast<uint32>(kLanes<D>);
-    const uint32 base = std::min(first, srcSize - kWindows * n);
-    const uint8 *window = src + size_t{base} * kPixelBytes;
-    const auto offset = hn::Sub(index, hn::Set(d, base));
+HWY_INLINE hn::Vec<D> pick(D d, const uint8 *window, hn::Vec<D> offset) {
+    constexpr uint32 n = kPixels<D>;
     const auto lane = hn::IndicesFromVec(d, hn::And(offset, hn::Set(d, n - 1)));
     auto picked = hn::TableLookupLanes(loadPixels(d, window), lane);
     for (uint32 i = 1; i < kWindows; ++i) {
@@ -235,10 +236,11 @@ struct NearestBody {
     template <class D>
     HWY_INLINE void operator()(D d, size_t i) const {
         const uint32 first = axis.start + static_cast<uint32>(i) * axis.step;
-        const auto index = hn::Min(hn::ShiftRight<16>(positionsFrom(d, first, axis.step)),
-                                   hn::Set(d, axis.srcSize - 1));
-        storePixels(pick<kWindows>(d, src, axis.srcSize, first >> 16, index), d,
-                    dst + i * kPixelBytes);
+        const uint32 base = std::min(first >> 16, axis.srcSize - kWindows * kPixels<D>);
+        const auto index = hn::ShiftRight<16>(positionsFrom(d, first, axis.step));
+        storePixels(
+            pick<kWindows>(d, src + size_t{base} * kPixelBytes, hn::Sub(index, hn::Set(d, base))),
+            d, dst + i * kPixelBytes);
     }
 };
 
@@ -297,10 +299,11 @@ struct LinearBody {
         using Channels = ChannelPairs<D>;
         const uint32 first = start + static_cast<uint32>(i) * step;
         const auto x = positionsFrom(d, first, step);
-        const auto index = hn::ShiftRight<16>(x);
-        // The right neighbours lie at the same index one pixel further on.
-        const auto left = pick<1>(d, src, srcSize - 1, first >> 16, index);
-        const auto right = pick<1>(d, src + kPixelBytes, srcSize - 1, first >> 16, index);
+        const uint32 base = std::min(first >> 16, srcSize - 1 - kPixels<D>);
+        const uint8 *window = src + size_t{base} * kPixelBytes;
+        const auto offset = hn::Sub(hn::ShiftRight<16>(x), hn::Set(d, base));
+        const auto left = pick<1>(d, window, offset);
+        const auto right = pick<1>(d, window + kPixelBytes, offset);
         const auto full = hn::Set(d, 0xFFu);
         const auto rightWeight = hn::And(hn::ShiftRight<8>(x), full);
         const auto leftWeight = hn::Sub(full, rightWeight);
@@ -370,12 +373,20 @@ struct HalfBody {
     }
 };
 
-// Averages over kWhole pixels and a fraction.
+// Averages over kWhole pixels and a fraction, none of which reaches to the last
+// pixel.
 template <uint32 kWhole>
 struct BoxBody {
+    static constexpr uint32 kWindows = kWhole + 1;
+
     uint8 *dst;
     const uint8 *src;
     const ScaleAxis &axis;
+
+    // How wide vectors can be for a source row.
+    static size_t limit(uint32 srcSize) {
+        return srcSize > kWindows ? (srcSize - kWindows) / kWindows : 0;
+    }
 
     template <class D>
     HWY_INLINE void operator()(D d, size_t i) const {
@@ -391,22 +402,19 @@ struct BoxBody {
         const auto tail = hn::ShiftRight<8>(hn::And(end, fraction));
         // The pixel kWhole behind the first is the last one, or one before it.
         const auto isLast = hn::Eq(last, hn::Add(first, hn::Set(d, kWhole)));
-        const auto middleWeight = hn::IfThenElse(isLast, tail, hn::Set(d, 256u));
-        const auto lastWeight = hn::IfThenZeroElse(isLast, tail);
+        const auto middle = hn::IfThenElse(isLast, tail, hn::Set(d, 256u));
+        const auto behind = hn::IfThenZeroElse(isLast, tail);
 
+        const uint32 base = std::min(start >> 16, axis.srcSize - kWindows - kWindows * kPixels<D>);
+        const auto offset = hn::Sub(first, hn::Set(d, base));
+        const uint8 *window = src + size_t{base} * kPixelBytes;
         ChannelSums<D> sums;
-        sums.add(pickAt(d, start >> 16, first, 0), Channels::weights(head));
-        for (uint32 offset = 1; offset < kWhole; ++offset)
-            sums.add(pickAt(d, start >> 16, first, offset));
-        sums.add(pickAt(d, start >> 16, first, kWhole), Channels::weights(middleWeight));
-        sums.add(pickAt(d, (start + axis.step) >> 16, last, 0), Channels::weights(lastWeight));
+        sums.add(pick<kWindows>(d, window, offset), Channels::weights(head));
+        for (uint32 whole = 1; whole < kWhole; ++whole)
+            sums.add(pick<kWindows>(d, window += kPixelBytes, offset));
+        sums.add(pick<kWindows>(d, window += kPixelBytes, offset), Channels::weights(middle));
+        sums.add(pick<kWindows>(d, window += kPixelBytes, offset), Channels::weights(behind));
         storePixels(sums.average(axis.normaliser), d, dst + i * kPixelBytes);
-    }
-
-    template <class D>
-    HWY_INLINE hn::Vec<D> pickAt(D d, uint32 first, hn::Vec<D> index, uint32 offset) const {
-        return pick<kWhole + 1>(d, src, axis.srcSize, first + offset,
-                                hn::Add(index, hn::Set(d, offset)));
     }
 };
 
@@ -444,17 +452,17 @@ private:
         return hn::PromoteTo(d, hn::LoadU(d8, channel_ + index * kPixelBytes));
     }
 
-    template <size_t kPixels>
+    template <size_t kCount>
     HWY_INLINE V tail(size_t index, [[maybe_unused]] size_t count, V sum) const {
-        if constexpr (kPixels == 0) {
+        if constexpr (kCount == 0) {
             return sum;
         } else {
-            if (count & kPixels) {
-                const hn::CappedTag<T, 4 * kPixels> d;
+            if (count & kCount) {
+                const hn::CappedTag<T, 4 * kCount> d;
                 sum = hn::Add(sum, folded(d, load(d, index)));
-                index += kPixels;
+                index += kCount;
             }
-            return tail<kPixels / 2>(index, count, sum);
+            return tail<kCount / 2>(index, count, sum);
         }
     }
 
@@ -509,27 +517,37 @@ public:
 
 private:
     HWY_INLINE void averageInside(uint8 *dst, const uint8 *src, size_t count) const {
-        switch (axis_.step >> 16) {
-        case 1:
-            return walkWindows(count, axis_.srcSize / 2, BoxBody<1>{dst, src, axis_});
-        case 2:
-            if (axis_.step == 2 * kScaleOne && axis_.normaliser == kScaleOne / 2)
-                return walkAgain<uint32>(
-                    count, HalfBody{dst, src + size_t{axis_.start >> 16} * kPixelBytes});
-            return walkWindows(count, axis_.srcSize / 3, BoxBody<2>{dst, src, axis_});
-        case 3:
-            return walkWindows(count, axis_.srcSize / 4, BoxBody<3>{dst, src, axis_});
-        default:
-            break;
-        }
+        if (axis_.step == 2 * kScaleOne && axis_.normaliser == kScaleOne / 2)
+            return walkAgain<uint32>(count,
+                                     HalfBody{dst, src + size_t{axis_.start >> 16} * kPixelBytes});
+        const uint32 whole = axis_.step >> 16;
+        if (whole <= kMostClose && averageClose<kMostClose>(whole, dst, src, count))
+            return;
         // The number of pixels between the ends changes by one.  The extra one
         // is weighted away instead of branched over, which would be mistaken
         // every few pixels.
-        const size_t whole = axis_.step >> 16;
         uint32 start = axis_.start;
         for (size_t i = 0; i < count; ++i, start += axis_.step) {
             const BoxSpan span(start, start + axis_.step);
             averageOf(span, whole - 1, dst + i * kPixelBytes, src);
+        }
+    }
+
+    // The most whole pixels for which picking from windows is the faster way.
+    static constexpr uint32 kMostClose = sizeof(T) == sizeof(uint16) ? 4 : 0;
+
+    // False when the source row is too short for windows.
+    template <uint32 kWhole>
+    HWY_INLINE bool averageClose(uint32 whole, uint8 *dst, const uint8 *src, size_t count) const {
+        if constexpr (kWhole == 0) {
+            return false;
+        } else {
+            if (whole != kWhole)
+                return averageClose<kWhole - 1>(whole, dst, src, count);
+            const size_t limit = BoxBody<kWhole>::limit(axis_.srcSize);
+            if (limit != 0)
+                walkWindows(count, limit, BoxBody<kWhole>{dst, src, axis_});
+            return limit != 0;
         }
     }
 
