@@ -255,7 +255,8 @@ public:
         if (wraps_)
             return pickAnywhere(dst, src);
         if (axis_.step == kScaleOne)
-            walkAgain<uint32>(inner_, CopyBody{dst, src + size_t{axis_.start >> 16} * kPixelBytes});
+            std::memcpy(dst, src + size_t{axis_.start >> 16} * kPixelBytes,
+                        size_t{inner_} * kPixelBytes);
         else if (axis_.step < kScaleOne)
             walkWindows(inner_, axis_.srcSize, NearestBody<1>{dst, src, axis_});
         else if (axis_.step <= 2 * kScaleOne)
@@ -269,9 +270,20 @@ public:
     }
 
 private:
+    // Four a turn, read before they are written: the compiler cannot know that
+    // the rows do not overlap.
     HWY_INLINE void pickSingly(uint8 *dst, const uint8 *src) const {
+        const uint32 step = axis_.step;
         uint32 x = axis_.start;
-        for (size_t i = 0; i < inner_; ++i, x += axis_.step)
+        size_t i = 0;
+        for (; inner_ - i >= 4; i += 4, x += 4 * step) {
+            uint32 pixels[4];
+            for (uint32 k = 0; k < 4; ++k)
+                std::memcpy(&pixels[k], src + size_t{(x + k * step) >> 16} * kPixelBytes,
+                            kPixelBytes);
+            std::memcpy(dst + i * kPixelBytes, pixels, sizeof(pixels));
+        }
+        for (; i < inner_; ++i, x += step)
             std::memcpy(dst + i * kPixelBytes, src + size_t{x >> 16} * kPixelBytes, kPixelBytes);
     }
 
