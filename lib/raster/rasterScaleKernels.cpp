@@ -28,10 +28,6 @@ HWY_INLINE uint32 rowOf(const ScaleAxis &axis, uint32 position) {
     return isAbove ? 0 : std::min(position >> 16, axis.srcSize - 1);
 }
 
-HWY_INLINE const uint8 *srcRow(const ScaleJob &job, uint32 row) {
-    return advance(job.src.first, uint64_t{row} * static_cast<uint64_t>(job.src.step));
-}
-
 // The source rows that neighbouring destination rows share, already scaled.
 template <class Row>
 class RowCache {
@@ -52,7 +48,7 @@ public:
         RasterScaleRowSlot &slot = slots_[index == 0 ? 0 : 1 + index % period_];
         if (slot.rowIndex != index) {
             slot.rowIndex = index;
-            row_(slot.pixels, srcRow(job_, index));
+            row_(slot.pixels, job_.src.row(index));
         }
         return slot.pixels;
     }
@@ -76,7 +72,7 @@ HWY_INLINE void walkDirect(const ScaleJob &job, const Row &row) {
         if (index == previous)
             std::memmove(dst, dst - job.dst.step, size_t{job.x.dstSize} * kPixelBytes);
         else
-            row(dst, srcRow(job, index));
+            row(dst, job.src.row(index));
         previous = index;
         dst += job.dst.step;
     }
