@@ -176,6 +176,9 @@ HWY_INLINE void walkWindows(size_t count, size_t limit, const Body &body) {
     walkWindows<kLanes<Widest<uint32>>>(count, limit, body);
 }
 
+// With four pixels in a vector, or one, several windows cost more than they save.
+constexpr bool kVectorsAreWide = kLanes < Widest < uint32 >>> 4;
+
 // Source pixels by their offset from the start of kWindows vectors that lie end
 // to end.
 template <uint32 kWindows, class D>
@@ -259,9 +262,9 @@ public:
                         size_t{inner_} * kPixelBytes);
         else if (axis_.step < kScaleOne)
             walkWindows(inner_, axis_.srcSize, NearestBody<1>{dst, src, axis_});
-        else if (axis_.step <= 2 * kScaleOne)
+        else if (kVectorsAreWide && axis_.step <= 2 * kScaleOne)
             walkWindows(inner_, axis_.srcSize / 2, NearestBody<2>{dst, src, axis_});
-        else if (axis_.step <= 4 * kScaleOne && axis_.srcSize >= 4)
+        else if (kVectorsAreWide && axis_.step <= 4 * kScaleOne && axis_.srcSize >= 4)
             walkWindows(inner_, axis_.srcSize / 4, NearestBody<4>{dst, src, axis_});
         else
             pickSingly(dst, src);
@@ -546,7 +549,7 @@ private:
     }
 
     // The most whole pixels for which picking from windows is the faster way.
-    static constexpr uint32 kMostClose = sizeof(T) == sizeof(uint16) ? 4 : 0;
+    static constexpr uint32 kMostClose = kVectorsAreWide && sizeof(T) == sizeof(uint16) ? 4 : 0;
 
     // False when the source row is too short for windows.
     template <uint32 kWhole>
