@@ -195,7 +195,7 @@ RasterRectList randomList(Random &random) {
     return list;
 }
 
-// A list in normal form but for one entry that is cut in two.
+// A list in normal form but for one entry that is cut in two, which still touch.
 RasterRectList randomSplitList(Random &random) {
     Bitmap bitmap;
     for (int i = 0; i < 3; ++i)
@@ -209,6 +209,10 @@ RasterRectList randomSplitList(Random &random) {
         first.width = random.between(1, first.width);
         second.x += first.width;
         second.width -= first.width;
+        Entry &shortened = random.oneIn(2) ? first : second;
+        const int32 rows = random.between(0, first.height - 1);
+        shortened.y += rows;
+        shortened.height -= rows;
     } else {
         first.height = random.between(1, first.height);
         second.y += first.height;
