@@ -177,7 +177,7 @@ HWY_INLINE void walkWindows(size_t count, size_t limit, const Body &body) {
 }
 
 // With four pixels in a vector, or one, several windows cost more than they save.
-inline constexpr bool kVectorsAreWide = kLanes < Widest < uint32 >>> 4;
+inline constexpr bool kVectorsAreWide = hn::MaxLanes(Widest<uint32>()) > 4;
 
 // Source pixels by their offset from the start of kWindows vectors that lie end
 // to end.
