@@ -398,7 +398,8 @@ QUILLON_API void RasterCopyPixels(uint8 *dstBuffer, uint32 dstLineIncrement, con
  * may come out one or two levels low.  A shrink by more than 32 averages only
  * the first 32 rows of each span, and comes out darker accordingly.
  *
- * Takes one block of scratch memory for the call: a few destination rows.
+ * Where rows are mixed (filtered, at a vertical factor other than 1), takes one
+ * block of scratch memory for the call: a few destination rows, 33 at most.
  *
  * Rows: exact; the line increments may be negative, srcLineIncrement may be 0.
  *
@@ -423,7 +424,8 @@ QUILLON_API uint32 Raster_Scale(uint8 *dstBuffer, int32 dstLineIncrement, uint32
  * on it when the source is scaled: scaled, grown by one source pixel (at least
  * one destination pixel) on each side, and cut to the scaled image.
  *
- * left and top have no upper limit, right and bottom no lower one.
+ * left and top have no upper limit, right and bottom no lower one.  Factors that
+ * are infinite or no number leave the rectangle as it is.
  *
  * @param rect  in source coordinates; changed in place to destination ones
  */
