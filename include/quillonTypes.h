@@ -1,6 +1,6 @@
 /** @file quillonTypes.h
  *
- * Integer types, the export mark and the version: what every header of
+ * Integer types and the export mark: what every header of
  * libquillon shares.  Usable from C99 and from C++.
  */
 #ifndef QUILLON_TYPES_H
