@@ -106,8 +106,8 @@ enum {
 };
 
 enum {
-    FILEIO_OPEN = 0,        /**< the file must exist */
-    FILEIO_OPEN_CREATE = 4  /**< the file is created, or emptied when it exists */
+    FILEIO_OPEN = 0,       /**< the file must exist */
+    FILEIO_OPEN_CREATE = 4 /**< the file is created, or emptied when it exists */
 };
 
 /** Makes file a record of no file, ready for FileIO_Open. */

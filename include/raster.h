@@ -226,10 +226,9 @@ QUILLON_API void Raster_ConvertIndexTo32(uint8 *dstBuffer, uint32 dstLineIncreme
  * @param depth  not checked: 3 and 6 are one byte a pixel, 15 is two, anything
  *               else depth / 8, truncated; 0 or less copies nothing
  */
-QUILLON_API void RasterCopyPixels(uint8 *dstBuffer, uint32 dstLineIncrement,
-                                  const uint8 *srcBuffer, uint32 srcLineIncrement, int32 depth,
-                                  uint32 srcX, uint32 srcY, uint32 dstX, uint32 dstY, uint32 width,
-                                  uint32 height);
+QUILLON_API void RasterCopyPixels(uint8 *dstBuffer, uint32 dstLineIncrement, const uint8 *srcBuffer,
+                                  uint32 srcLineIncrement, int32 depth, uint32 srcX, uint32 srcY,
+                                  uint32 dstX, uint32 dstY, uint32 width, uint32 height);
 
 /** @} */
 

@@ -9,17 +9,8 @@
 
 namespace quillon {
 
-// The rows of a rectangle: its first pixel, and the bytes from row to row.
-template <class Byte>
-struct Rows {
-    Byte *first;
-    ptrdiff_t step;
-};
-using DstRows = Rows<uint8>;
-using SrcRows = Rows<const uint8>;
-
 struct Size {
-    size_t width;  // in whatever unit the kernel counts: pixels, or bytes
+    size_t width; // in whatever unit the kernel counts: pixels, or bytes
     size_t height;
 
     bool empty() const { return width == 0 || height == 0; }
@@ -40,6 +31,17 @@ Byte *pixelAddress(Byte *buffer, int64_t lineIncrement, int64_t bytesPerPixel, u
     return advance(buffer, uint64_t{y} * static_cast<uint64_t>(lineIncrement) +
                                uint64_t{x} * static_cast<uint64_t>(bytesPerPixel));
 }
+
+// The rows of a rectangle: its first pixel, and the bytes from row to row.
+template <class Byte>
+struct Rows {
+    Byte *first;
+    ptrdiff_t step;
+
+    Byte *row(size_t index) const { return advance(first, index * static_cast<size_t>(step)); }
+};
+using DstRows = Rows<uint8>;
+using SrcRows = Rows<const uint8>;
 
 // A line increment rounded down (towards minus infinity) to whole pixels of 2
 // or 4 bytes.  Pixels of 1 and 3 bytes step exactly.

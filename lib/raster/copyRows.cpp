@@ -1,0 +1,42 @@
+#include "raster/copyRows.h"
+
+#include <cstring>
+
+namespace quillon {
+namespace {
+
+// The lowest byte of a rectangle and the byte behind its highest one.
+struct Span {
+    uintptr_t begin;
+    uintptr_t end;
+};
+
+Span spanOf(const uint8 *first, ptrdiff_t step, Size size) {
+    const auto top = reinterpret_cast<uintptr_t>(first);
+    const uintptr_t bottom = top + (size.height - 1) * static_cast<uintptr_t>(step);
+    return step < 0 ? Span{bottom, top + size.width} : Span{top, bottom + size.width};
+}
+
+bool overlap(Span a, Span b) {
+    return a.begin < b.end && b.begin < a.end;
+}
+
+} // namespace
+
+void copyRows(DstRows dst, SrcRows src, Size size, RowOrder order) {
+    if (overlap(spanOf(dst.first, dst.step, size), spanOf(src.first, src.step, size))) {
+        if (order == RowOrder::Upwards) {
+            dst = {dst.row(size.height - 1), -dst.step};
+            src = {src.row(size.height - 1), -src.step};
+        }
+        for (size_t y = 0; y < size.height; ++y)
+            std::memmove(dst.row(y), src.row(y), size.width);
+        return;
+    }
+
+    size = joinedRows(size, size.width, dst.step, size.width, src.step);
+    for (size_t y = 0; y < size.height; ++y)
+        std::memcpy(dst.row(y), src.row(y), size.width);
+}
+
+} // namespace quillon
