@@ -31,6 +31,7 @@ install(FILES cmake/quillonConfig.cmake ${PROJECT_BINARY_DIR}/quillonConfigVersi
 # The .pc files name their prefix by where they themselves lie.
 file(RELATIVE_PATH prefixFromPkgConfig
     ${CMAKE_INSTALL_FULL_LIBDIR}/pkgconfig ${CMAKE_INSTALL_PREFIX})
+string(REGEX REPLACE "/$" "" prefixFromPkgConfig ${prefixFromPkgConfig})
 file(RELATIVE_PATH libDirInPrefix ${CMAKE_INSTALL_PREFIX} ${CMAKE_INSTALL_FULL_LIBDIR})
 file(RELATIVE_PATH includeDirInPrefix ${CMAKE_INSTALL_PREFIX} ${CMAKE_INSTALL_FULL_INCLUDEDIR})
 foreach(library IN ITEMS hearth quillon)

@@ -109,18 +109,21 @@ Picture whole(const Picture &source, uint32 width) {
     return cut(source, {0, 0, -1, -1}, width, height);
 }
 
-// The middle of a picture, of at most the given size.
-Rect middle(const Picture &source, uint32 width, uint32 height) {
+// A part of a picture, of at most the given size, around the point that divides
+// the width by the golden section: that is where pictures have their subject.
+Rect subject(const Picture &source, uint32 width, uint32 height) {
     width = std::min(width, source->width);
     height = std::min(height, source->height);
+    const auto centre = static_cast<uint32>(0.618 * source->width);
+    const uint32 left = std::min(std::max(centre, width / 2) - width / 2, source->width - width);
     Rect part;
-    Rect_SetFromXYWH(&part, static_cast<int32>((source->width - width) / 2),
+    Rect_SetFromXYWH(&part, static_cast<int32>(left),
                      static_cast<int32>((source->height - height) / 2), static_cast<int32>(width),
                      static_cast<int32>(height));
     return part;
 }
 
-// The middle of a picture, each pixel of it a square of factor by factor.
+// A part of a picture, each pixel of it a square of factor by factor.
 Picture enlargedNearest(const Picture &source, const Rect &part, uint32 factor) {
     const Picture small = cut(source, part, static_cast<uint32>(part.right - part.left),
                               static_cast<uint32>(part.bottom - part.top));
@@ -192,12 +195,12 @@ int main(int argc, char **argv) {
         save(thumbnails.back(), folder + "thumbnail-" + std::to_string(width) + ".bmp");
     }
 
-    const Rect part = middle(picture, 480, 320);
+    const Rect part = subject(picture, 480, 320);
     const Picture crop = cut(picture, part, static_cast<uint32>(part.right - part.left),
                              static_cast<uint32>(part.bottom - part.top));
     save(crop, folder + "crop.png");
 
-    const Rect detail = middle(picture, 120, 80);
+    const Rect detail = subject(picture, 120, 80);
     const Picture nearest = enlargedNearest(picture, detail, 4);
     const Picture filtered = cut(picture, detail, nearest->width, nearest->height);
     save(nearest, folder + "enlarged-nearest.png");
