@@ -20,7 +20,7 @@ void premultiply(Surface &surface, Content content) {
         if (content == Content::noise) {
             alpha = bytes[i + 3];
         } else if (content == Content::runs && left-- == 0) {
-            left = random() % 24;
+            left = static_cast<uint32>(random() % 24);
             alpha = random() & 1 ? 255 : 0;
         }
         for (size_t channel = 0; channel < 3; ++channel)

@@ -1,5 +1,5 @@
-// Files and composition, on a real picture.  The bytes are those of the pixels,
-// not of the files.
+// Files and composition, on a real picture.  Pixels and bytes are counted of the
+// picture itself: not of its file, nor of the result.
 #include "imageUtil.h"
 #include "measure.h"
 
@@ -42,7 +42,7 @@ double pixelBytes(const ImageInfo &image) {
 template <class Prepare>
 void measureImage(const std::string &operation, bool alpha, Prepare prepare, int count = 1) {
     const Image image = picture(alpha);
-    measure(operation + (alpha ? "32/" : "24/") + std::to_string(image->width) + "x" +
+    measure(operation + (alpha ? "Bgra/" : "Bgr/") + std::to_string(image->width) + "x" +
                 std::to_string(image->height) + "/quillon",
             double{1} * count * image->width * image->height, count * pixelBytes(*image),
             [=] { return prepare(image); });
@@ -50,7 +50,7 @@ void measureImage(const std::string &operation, bool alpha, Prepare prepare, int
 
 void registerPng(bool alpha) {
     for (const int32 level : {1, 6}) {
-        measureImage("pngWrite" + std::to_string(level) + "Of", alpha, [=](const Image &image) {
+        measureImage("pngWrite" + std::to_string(level), alpha, [=](const Image &image) {
             return [=] {
                 const ImageUtilPngOptions options = {level, false};
                 DynBuf buffer;
@@ -121,7 +121,7 @@ void registerImage() {
         registerCombine("combineGap", alpha, 1);
     }
     registerCropAndScale("crop", -1);
-    registerCropAndScale("cropTo240", 240);
+    registerCropAndScale("cropAndScale", 240);
 }
 
 } // namespace quillon::bench

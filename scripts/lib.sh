@@ -29,13 +29,13 @@ need() {
     done
     [ ${#missing[@]} -gt 0 ] || return 0
 
-    say "Installing ${missing[*]}"
     local asRoot=()
     if [ "$(id -u)" -ne 0 ]; then
         command -v sudo >/dev/null ||
             fail "Missing, and only root can install them: apt-get install ${missing[*]}"
         asRoot=(sudo)
     fi
+    say "Installing ${missing[*]}"
     { "${asRoot[@]}" apt-get update -q &&
         "${asRoot[@]}" env DEBIAN_FRONTEND=noninteractive \
             apt-get install -y -q --no-install-recommends "${missing[@]}"; } ||
