@@ -84,8 +84,7 @@ void measure(const std::string &name, double pixels, double bytes, Prepare prepa
         }
         using benchmark::Counter;
         state.counters["pixels"] = Counter(pixels, Counter::kIsIterationInvariantRate);
-        state.counters["bytes"] =
-            Counter(bytes, Counter::kIsIterationInvariantRate, Counter::kIs1024);
+        state.counters["bytes"] = Counter(bytes, Counter::kIsIterationInvariantRate);
     });
 }
 
