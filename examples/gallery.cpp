@@ -8,6 +8,8 @@
 #include <algorithm>
 #include <cstdio>
 #include <cstdlib>
+#include <exception>
+#include <stdexcept>
 #include <string>
 #include <utility>
 #include <vector>
@@ -15,8 +17,7 @@
 namespace {
 
 [[noreturn]] void fail(const std::string &what) {
-    std::fprintf(stderr, "gallery: %s\n", what.c_str());
-    std::exit(1);
+    throw std::runtime_error(what);
 }
 
 // An ImageInfo that gives its pixels back.
@@ -175,15 +176,7 @@ private:
     int32 x = 0, y = 0, rowHeight = 0;
 };
 
-} // namespace
-
-int main(int argc, char **argv) {
-    if (argc != 4)
-        fail("usage: gallery PICTURE.png SPRITE.png FOLDER");
-    const std::string folder = std::string(argv[3]) + "/";
-    const Picture file = read(argv[1]);
-    const Picture sprite = read(argv[2]);
-
+void makeGallery(const Picture &file, const Picture &sprite, const std::string &folder) {
     // What is transparent shows white.
     Picture picture = blank(file->width, file->height, 0xFFFFFFFF);
     blend(picture, file, 0, 0);
@@ -227,5 +220,20 @@ int main(int argc, char **argv) {
     sheet.add(nearest);
     sheet.add(filtered);
     save(sheet.drawn(), folder + "sheet.png");
-    return 0;
+}
+
+} // namespace
+
+int main(int argc, char **argv) {
+    if (argc != 4) {
+        std::fputs("usage: gallery PICTURE.png SPRITE.png FOLDER\n", stderr);
+        return 2;
+    }
+    try {
+        makeGallery(read(argv[1]), read(argv[2]), std::string(argv[3]) + "/");
+        return 0;
+    } catch (const std::exception &error) {
+        std::fprintf(stderr, "gallery: %s\n", error.what());
+        return 1;
+    }
 }

@@ -321,7 +321,7 @@ Vec look(Vec direction) {
 
 // Where a sample lies in an array of all of them.
 size_t sampleIndex(int i, int j) {
-    return static_cast<size_t>(j) * (kWidth * kSamples) + static_cast<size_t>(i);
+    return static_cast<size_t>(j) * kWidth * kSamples + static_cast<size_t>(i);
 }
 
 // Reeds in front, each a bent, tapering blade: where they cover the picture.
@@ -335,17 +335,21 @@ std::vector<float> drawReeds() {
         const float root = right ? 1285 - 330 * spread : 230 * spread - 12;
         const float length = (90 + 260 * random(2)) * (1.1F - 0.7F * spread);
         const float bend = (random(3) - 0.45F) * 0.5F * length;
-        for (float s = 0; s < 1; s += 0.0007F) {
+        for (int j = 0; j < height; ++j) {
+            // s goes from the root, 0, to the tip.
+            const float y = (static_cast<float>(j) + 0.5F) / kSamples;
+            const float s = (kHeight + 6 - y) / length;
+            if (s > 1)
+                continue;
             const float x = (root + bend * s * s) * kSamples;
-            const float y = (kHeight + 6 - length * s) * kSamples;
             const bool head = blade % 3 == 0 && s > 0.86F && s < 0.97F; // a bulrush
             const float half = kSamples * (head ? 3.2F : 0.35F + 1.9F * (1 - s));
-            for (float dx = -half; dx <= half; dx += 0.5F) {
-                const int i = static_cast<int>(x + dx), j = static_cast<int>(y);
-                if (i >= 0 && i < width && j >= 0 && j < height) {
-                    shade[sampleIndex(i, j)] =
-                        (head ? 1.0F : 0.0F) + 0.45F + 0.45F * std::clamp(-dx / half, -1.0F, 1.0F);
-                }
+            const int first = std::max(static_cast<int>(x - half), 0);
+            const int last = std::min(static_cast<int>(x + half), width - 1);
+            for (int i = first; i <= last; ++i) {
+                const float across = (x - static_cast<float>(i)) / half;
+                shade[sampleIndex(i, j)] =
+                    (head ? 1.0F : 0.0F) + 0.45F + 0.45F * std::clamp(across, -1.0F, 1.0F);
             }
         }
     }
@@ -356,7 +360,7 @@ uint8 toByte(float light) {
     // A soft shoulder, the display's curve, and some contrast.
     const float toned = std::clamp(1.2F * light / (1 + 0.3F * light), 0.0F, 1.0F);
     const float shown = std::pow(toned, 1 / 2.2F);
-    return static_cast<uint8>(255 * std::lerp(shown, smoothstep(0, 1, shown), 0.5F) + 0.5F);
+    return static_cast<uint8>(std::lround(255 * std::lerp(shown, smoothstep(0, 1, shown), 0.5F)));
 }
 
 } // namespace

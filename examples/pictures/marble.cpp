@@ -72,7 +72,7 @@ Colour pixelAt(float x, float y) {
 }
 
 uint8 toByte(float channel) {
-    return static_cast<uint8>(255 * std::clamp(channel, 0.0F, 1.0F) + 0.5F);
+    return static_cast<uint8>(std::lround(255 * std::clamp(channel, 0.0F, 1.0F)));
 }
 
 } // namespace
