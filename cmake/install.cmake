@@ -1,10 +1,6 @@
 # What `cmake --install` lays down: two shared libraries, their headers, and the
 # files by which pkg-config and find_package find them.  All of it may be moved
 # as one tree.
-option(QUILLON_INSTALL "Install the libraries and their headers" ${PROJECT_IS_TOP_LEVEL})
-if(NOT QUILLON_INSTALL)
-    return()
-endif()
 
 include(CMakePackageConfigHelpers)
 
