@@ -7,7 +7,7 @@ cd "$(dirname "${BASH_SOURCE[0]}")/.."
 buildPackages=(cmake g++ ninja-build pkg-config libpng-dev libhwy-dev libgtest-dev)
 benchPackages=(libbenchmark-dev)
 formatPackages=(clang-format)
-clangPackages=(clang)
+clangPackages=(clang libclang-rt-dev)
 lintPackages=(clang clang-tidy)
 
 say() { printf '\n== %s\n' "$*"; }
