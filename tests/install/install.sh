@@ -1,10 +1,10 @@
 #!/bin/bash
 # Installs into an empty folder, moves the tree, and builds a C and a C++ program
 # against it through pkg-config and through find_package.
-# Usage: install.sh BUILD_DIR CC CXX
+# Usage: install.sh BUILD_DIR CC CXX CMAKE_GENERATOR
 set -euo pipefail
 here=$(cd "$(dirname "$0")" && pwd)
-buildDir=$1 cc=$2 cxx=$3
+buildDir=$1 cc=$2 cxx=$3 generator=$4
 work=$(mktemp -d)
 trap 'rm -rf "$work"' EXIT
 
@@ -30,7 +30,8 @@ LD_LIBRARY_PATH=$libDir "$work/host"
 
 echo "find_package"
 # Looking for any package but this one is an error.
-cmake -S "$here/consumer" -B "$work/build" -DCMAKE_C_COMPILER="$cc" -DCMAKE_CXX_COMPILER="$cxx" \
+cmake -S "$here/consumer" -B "$work/build" -G "$generator" \
+    -DCMAKE_C_COMPILER="$cc" -DCMAKE_CXX_COMPILER="$cxx" \
     -DCMAKE_PREFIX_PATH="$work/moved" -DCMAKE_DISABLE_FIND_PACKAGE_PNG=ON >"$work/log" ||
     { cat "$work/log"; exit 1; }
 cmake --build "$work/build" >"$work/log" || { cat "$work/log"; exit 1; }
