@@ -17,7 +17,7 @@ namespace {
 
 constexpr int kWidth = 1280;
 constexpr int kHeight = 853;
-constexpr int kSamples = 3; // per pixel, across and down
+constexpr int kSamples = 2; // per pixel, across and down
 constexpr float kFar = 3000;
 
 struct Vec {
