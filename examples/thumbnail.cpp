@@ -22,6 +22,7 @@
 #include <string>
 #include <string_view>
 #include <strings.h>
+#include <system_error>
 #include <unistd.h>
 #include <utility>
 
@@ -61,7 +62,7 @@ struct Request {
 
 // An image record that gives its pixels back.
 struct Image : ImageInfo {
-    Image() : ImageInfo{} {}
+    Image() { static_cast<ImageInfo &>(*this) = ImageInfo{}; }
     Image(const Image &) = delete;
     Image &operator=(const Image &) = delete;
     ~Image() { ImageUtil_FreeImageData(this); }
@@ -114,6 +115,7 @@ std::optional<Request> parseArguments(int argc, char **argv) {
     Request request;
     int found = 0;
     // The leading colon keeps getopt from printing messages of its own.
+    // NOLINTNEXTLINE(concurrency-mt-unsafe): there is one thread
     while ((found = getopt_long(argc, argv, ":", kOptions.data(), nullptr)) != -1) {
         switch (found) {
         case 'w':
@@ -167,7 +169,7 @@ void expandPalette(const Image &indexed, Image &colored) {
 // Reads the input as 32-bit pixels, which is what the scaler takes.
 void readInput(const Request &request, Image &picture) {
     if (access(request.input.c_str(), R_OK) != 0) {
-        throw std::runtime_error(request.input + ": " + std::strerror(errno));
+        throw std::runtime_error(request.input + ": " + std::generic_category().message(errno));
     }
     Image read;
     if (!ImageUtil_ReadPNG(&read, request.input.c_str(),
@@ -222,7 +224,7 @@ void writeOutput(const Request &request, const Image &thumbnail, bool keepAlpha)
     if (std::rename(part.c_str(), request.output.c_str()) != 0) {
         const int error = errno;
         std::remove(part.c_str());
-        throw std::runtime_error(request.output + ": " + std::strerror(error));
+        throw std::runtime_error(request.output + ": " + std::generic_category().message(error));
     }
 }
 

@@ -155,6 +155,11 @@ TEST(PngWrite, WhatCannotBeWritten) {
     expectRefusal([](ImageInfo &image) { image.bytesPerLine = 11; }); // shorter than its pixels
     expectRefusal([](ImageInfo &image) { image.bpp = 8; });           // without colours
     expectRefusal([](ImageInfo &image) { image.bpp = 16, image.depth = 32; });
+    expectRefusal([](ImageInfo &image) { // found out when the pixels are written already
+        image.bpp = 8;
+        image.numColors = 3;
+        image.data[0] = 3;
+    });
 
     Buffer untouched;
     const Buffer pattern;

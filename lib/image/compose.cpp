@@ -41,6 +41,11 @@ uint32 bytesPerPixel(const ImageInfo &image) {
     return image.bpp / 8;
 }
 
+// Wraps in 32 bits; only the sum of several is wider.
+uint32 areaOf(const ImageInfo &image) {
+    return image.width * image.height;
+}
+
 // Sizes and format of the canvas; nothing is allocated yet.
 Canvas planCanvas(const ImageInfo *images, const RectPoint *positions, uint32 count) {
     Canvas canvas;
@@ -51,14 +56,14 @@ Canvas planCanvas(const ImageInfo *images, const RectPoint *positions, uint32 co
         Rect_SetFromXYWH(&rect, positions[i].x, positions[i].y, static_cast<int32>(images[i].width),
                          static_cast<int32>(images[i].height));
         Rect_Union(&canvas.bounds, &rect);
-        coveredArea += images[i].width * images[i].height; // the product in 32 bits
+        coveredArea += areaOf(images[i]);
     }
     ImageInfo &info = canvas.info;
     info.width = extent(canvas.bounds.left, canvas.bounds.right);
     info.height = extent(canvas.bounds.top, canvas.bounds.bottom);
 
     // A test of areas alone: a gap and an overlap of the same size pass unseen.
-    canvas.needsAlpha = coveredArea != info.width * info.height && images[0].bpp != 32;
+    canvas.needsAlpha = coveredArea != areaOf(info) && images[0].bpp != 32;
     canvas.srcDepth = static_cast<int32>(images[0].depth);
     info.depth = canvas.needsAlpha ? 24 : images[0].depth;
     info.bpp = canvas.needsAlpha ? 32 : images[0].bpp;
@@ -156,7 +161,9 @@ bool ImageUtil_Combine(const ImageInfo *images, const RectPoint *positions, uint
         return false;
     }
     canvas.info.bytesPerLine = static_cast<uint32>(bytesPerLine);
-    canvas.info.data = static_cast<uint8 *>(std::calloc(canvas.info.height, bytesPerLine));
+    // Never 0 bytes, for which null could be the answer to success.
+    canvas.info.data = static_cast<uint8 *>(
+        std::calloc(std::max(canvas.info.height, 1u), std::max<uint64_t>(bytesPerLine, 1)));
     if (canvas.info.data == nullptr) {
         return false;
     }

@@ -51,6 +51,7 @@ HWY_ALIGN constexpr uint8_t kPackBytes[16] = {0,  1,  2,  4,  5,    6,    8,    
                                               10, 12, 13, 14, 0x80, 0x80, 0x80, 0x80};
 // Across groups of 16 bytes: three words a group to four, and back.
 HWY_ALIGN constexpr uint32_t kSpreadWords[16] = {0, 1, 2, 2, 3, 4, 5, 5, 6, 7, 8, 8, 9, 10, 11, 11};
+HWY_ALIGN constexpr uint32_t kPackWords8[8] = {0, 1, 2, 4, 5, 6, 3, 7};
 HWY_ALIGN constexpr uint32_t kPackWords[16] = {0,  1,  2,  4,  5, 6, 8,  9,
                                                10, 12, 13, 14, 3, 7, 11, 15};
 
@@ -92,8 +93,9 @@ HWY_INLINE void store24([[maybe_unused]] D d, hn::Vec<D> v, uint8_t *dst) {
         const hn::Half<decltype(half)> quarter;
         auto bytes = hn::TableLookupBytesOr0(hn::BitCast(d8, v), hn::LoadDup128(d8, kPackBytes));
         if constexpr (n > 4)
-            bytes = hn::BitCast(d8, hn::TableLookupLanes(hn::BitCast(d, bytes),
-                                                         hn::SetTableIndices(d, kPackWords)));
+            bytes = hn::BitCast(d8, hn::TableLookupLanes(
+                                        hn::BitCast(d, bytes),
+                                        hn::SetTableIndices(d, n == 8 ? kPackWords8 : kPackWords)));
         hn::StoreU(hn::LowerHalf(half, bytes), half, dst);
         hn::StoreU(hn::LowerHalf(quarter, hn::UpperHalf(half, bytes)), quarter, dst + 2 * n);
 #endif
