@@ -6,12 +6,12 @@
 #include "raster.h"
 #include "support/fence.h"
 #include "support/random.h"
+#include "support/surfaces.h"
 #include "support/targets.h"
 
 #include <cmath>
 #include <cstdlib>
 #include <limits>
-#include <optional>
 #include <vector>
 
 namespace {
@@ -111,19 +111,7 @@ double drawScale(Random &random) {
 }
 
 int32 drawIncrement(Random &random, uint32 width) {
-    const auto rowBytes = static_cast<int32>(4 * width);
-    switch (random.below(6)) {
-    case 0:
-        return rowBytes;
-    case 1:
-        return -rowBytes - random.between(0, 9);
-    case 2: // rows that overlap
-        return random.between(-rowBytes, rowBytes);
-    case 3:
-        return 0;
-    default:
-        return rowBytes + random.between(0, 9);
-    }
+    return static_cast<int32>(randomLine(random, size_t{4} * width, true));
 }
 
 // Where the rectangle starts: mostly near the source, else anywhere, so that

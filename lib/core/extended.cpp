@@ -8,42 +8,48 @@
 namespace quillon {
 namespace {
 
-constexpr uint64_t kHalf = uint64_t{1} << 63;
+constexpr uint64_t kTopBit = uint64_t{1} << 63;
 
 } // namespace
 
-Extended::Extended(bool negative, int exponent, Wide value)
-    : negative_(false), exponent_(0), significand_(0) {
+Extended Extended::normalised(bool negative, int exponent, uint64_t value) {
     if (value == 0)
-        return;
-    const auto top = static_cast<uint64_t>(value >> 64);
-    const int zeros =
-        top != 0 ? std::countl_zero(top) : 64 + std::countl_zero(static_cast<uint64_t>(value));
-    value <<= zeros;
-    negative_ = negative;
-    exponent_ = exponent - zeros + 64;
-    significand_ = static_cast<uint64_t>(value >> 64);
-    const auto rest = static_cast<uint64_t>(value);
-    if (rest > kHalf || (rest == kHalf && (significand_ & 1) != 0)) {
-        if (++significand_ == 0) {
-            significand_ = kHalf;
-            ++exponent_;
-        }
-    }
+        return {false, 0, 0};
+    const int zeros = std::countl_zero(value);
+    return {negative, exponent - zeros, value << zeros};
 }
 
-Extended::Extended(double value) : negative_(false), exponent_(0), significand_(0) {
-    int exponent = 0;
-    const double fraction = std::frexp(std::fabs(value), &exponent);
-    // 53 bits at most, so the product is a whole number.
-    *this = Extended(std::signbit(value), exponent - 64,
-                     static_cast<uint64_t>(std::ldexp(fraction, 64)));
+Extended Extended::rounded(bool negative, int exponent, uint64_t significand, uint64_t rest) {
+    constexpr uint64_t kHalf = kTopBit;
+    const bool isUp = rest > kHalf || (rest == kHalf && (significand & 1) != 0);
+    if (isUp && ++significand == 0)
+        return {negative, exponent + 1, kTopBit};
+    return {negative, exponent, significand};
+}
+
+Extended Extended::rounded(bool negative, int exponent, Wide value) {
+    const auto top = static_cast<uint64_t>(value >> 64);
+    if (top == 0)
+        return normalised(negative, exponent, static_cast<uint64_t>(value));
+    const int zeros = std::countl_zero(top);
+    value <<= zeros;
+    return rounded(negative, exponent - zeros + 64, static_cast<uint64_t>(value >> 64),
+                   static_cast<uint64_t>(value));
+}
+
+Extended::Extended(double value) : Extended(false, 0, 0) {
+    // Sign, 11 bits of exponent, 52 of mantissa, which is lacking its top bit
+    // unless the exponent is 0.
+    const auto bits = std::bit_cast<uint64_t>(value);
+    const auto exponent = static_cast<int>(bits >> 52 & 0x7FF);
+    const uint64_t mantissa = bits & ((uint64_t{1} << 52) - 1);
+    const bool negative = bits >> 63 != 0;
+    *this = exponent == 0 ? normalised(negative, -1074, mantissa)
+                          : Extended(negative, exponent - 1086, mantissa << 11 | kTopBit);
 }
 
 Extended Extended::negated() const {
-    Extended result = *this;
-    result.negative_ = !negative_ && significand_ != 0;
-    return result;
+    return {!negative_ && significand_ != 0, exponent_, significand_};
 }
 
 Extended operator+(Extended a, Extended b) {
@@ -67,16 +73,18 @@ Extended operator+(Extended a, Extended b) {
         const bool isExact = (small >> distance) << distance == small;
         small = (small >> distance) | (isExact ? 0 : 1);
     }
-    return {a.negative_, a.exponent_ - 63,
-            a.negative_ == b.negative_ ? large + small : large - small};
+    return Extended::rounded(a.negative_, a.exponent_ - 63,
+                             a.negative_ == b.negative_ ? large + small : large - small);
 }
 
 Extended operator*(Extended a, Extended b) {
-    return {a.negative_ != b.negative_, a.exponent_ + b.exponent_,
-            Extended::Wide{a.significand_} * b.significand_};
+    return Extended::rounded(a.negative_ != b.negative_, a.exponent_ + b.exponent_,
+                             Extended::Wide{a.significand_} * b.significand_);
 }
 
 Extended operator/(Extended a, Extended b) {
+    if (a.significand_ == 0)
+        return a;
     // The shift makes a quotient of exactly 64 bits.
     const int shift = a.significand_ < b.significand_ ? 64 : 63;
     const Extended::Wide dividend = Extended::Wide{a.significand_} << shift;
@@ -86,20 +94,20 @@ Extended operator/(Extended a, Extended b) {
 
     // The bits behind the quotient, as far as rounding asks for them: nothing,
     // below a half, a half, above.
-    const uint64_t toHalf = b.significand_ - remainder;
+    const uint64_t toNext = b.significand_ - remainder;
     uint64_t rest = 0;
     if (remainder != 0)
-        rest = remainder < toHalf ? 1 : kHalf + (remainder > toHalf ? 1 : 0);
-    return {a.negative_ != b.negative_, a.exponent_ - b.exponent_ - shift - 64,
-            (Extended::Wide{quotient} << 64) | rest};
+        rest = remainder < toNext ? 1 : kTopBit + (remainder > toNext ? 1 : 0);
+    return Extended::rounded(a.negative_ != b.negative_, a.exponent_ - b.exponent_ - shift,
+                             quotient, rest);
 }
 
 double Extended::toDouble() const {
     constexpr int kDropped = 64 - std::numeric_limits<double>::digits;
-    constexpr uint64_t kDroppedHalf = uint64_t{1} << (kDropped - 1);
-    const uint64_t rest = significand_ & (2 * kDroppedHalf - 1);
+    constexpr uint64_t kHalf = uint64_t{1} << (kDropped - 1);
+    const uint64_t rest = significand_ & (2 * kHalf - 1);
     uint64_t kept = significand_ >> kDropped;
-    if (rest > kDroppedHalf || (rest == kDroppedHalf && (kept & 1) != 0))
+    if (rest > kHalf || (rest == kHalf && (kept & 1) != 0))
         ++kept;
     const double magnitude = std::ldexp(static_cast<double>(kept), exponent_ + kDropped);
     return negative_ ? -magnitude : magnitude;

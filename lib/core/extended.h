@@ -21,10 +21,11 @@ class Extended {
 public:
     // All exact.
     explicit Extended(double value); // must be finite
-    explicit Extended(uint32 value) : Extended(false, 0, value) {}
+    explicit Extended(uint32 value) : Extended(normalised(false, 0, value)) {}
     explicit Extended(int32 value)
-        : Extended(value < 0, 0,
-                   value < 0 ? 0 - static_cast<uint32>(value) : static_cast<uint32>(value)) {}
+        : Extended(normalised(value < 0, 0,
+                              value < 0 ? 0 - static_cast<uint32>(value)
+                                        : static_cast<uint32>(value))) {}
 
     friend Extended operator+(Extended a, Extended b);
     friend Extended operator-(Extended a, Extended b) { return a + b.negated(); }
@@ -44,8 +45,18 @@ public:
 private:
     using Wide = unsigned __int128;
 
-    // The nearest to value * 2^exponent.
-    Extended(bool negative, int exponent, Wide value);
+    Extended(bool negative, int exponent, uint64_t significand)
+        : negative_(negative), exponent_(exponent), significand_(significand) {}
+
+    // value * 2^exponent.
+    static Extended normalised(bool negative, int exponent, uint64_t value);
+
+    // The number nearest to value * 2^exponent.
+    static Extended rounded(bool negative, int exponent, Wide value);
+
+    // The number nearest to (significand + rest / 2^64) * 2^exponent; the
+    // significand has its top bit set.
+    static Extended rounded(bool negative, int exponent, uint64_t significand, uint64_t rest);
 
     Extended negated() const;
 

@@ -3,6 +3,7 @@
 #include "core/extended.h"
 #include "hearth.h"
 #include "raster.h"
+#include "raster/copyRows.h"
 #include "raster/rasterScaleKernels.h"
 
 #include <cmath>
@@ -25,7 +26,6 @@ ScaleAxis makeAxis(double scale, bool isFiltered, int32 first, int32 end, uint32
     const Extended factor(scale), one(kScaleOne);
     ScaleAxis axis{};
     axis.step = (one / factor).truncated();
-    axis.normaliser = (factor * one).truncated();
     axis.start = axis.step * static_cast<uint32>(first);
     axis.srcSize = srcSize;
     axis.dstSize = static_cast<uint32>(end) - static_cast<uint32>(first);
@@ -33,11 +33,17 @@ ScaleAxis makeAxis(double scale, bool isFiltered, int32 first, int32 end, uint32
         axis.method = ScaleMethod::kNearest;
     } else if (axis.step > kScaleOne) {
         axis.method = ScaleMethod::kBox;
+        axis.normaliser = (factor * one).truncated();
     } else {
         axis.method = ScaleMethod::kLinear;
         axis.start -= kScaleOne / 2;
     }
     return axis;
+}
+
+// Whether the pixels are those of the source, one by one.
+bool isCopy(const ScaleAxis &axis) {
+    return axis.step == kScaleOne && uint64_t{axis.start >> 16} + axis.dstSize <= axis.srcSize;
 }
 
 // One axis of Raster_ScaleSrcCoordinates.
@@ -77,6 +83,13 @@ uint32 Raster_Scale(uint8 *dstBuffer, int32 dstLineIncrement, uint32 dstWidth, u
         makeAxis(scaleX, filter != 0, left, right, srcWidth),
         makeAxis(scaleY, filter != 0, top, bottom, srcHeight),
     };
+    if (isCopy(job.x) && isCopy(job.y)) {
+        const uint8 *first =
+            pixelAddress(srcBuffer, srcLineIncrement, 4, job.x.start >> 16, job.y.start >> 16);
+        copyRows(job.dst, {first, srcLineIncrement}, {size_t{job.x.dstSize} * 4, job.y.dstSize},
+                 RowOrder::Downwards);
+        return 1;
+    }
     const ScaleCacheShape shape(job);
     if (shape.slots == 0) {
         RasterScaleRect(job, nullptr);
