@@ -165,7 +165,7 @@ QUILLON_API void RasterRGB_MakeRGBParam(RasterRGBParam *param, int32 componentBi
 /** @name Conversion of rectangles
  *
  * Line increments and coordinates are unsigned.  Rows: rounded, except where
- * the layouts are equal and in Raster_ConvertIndexTo32, where they are exact.
+ * the layouts are equal and from a palette to 32 bits, where they are exact.
  * Where layouts differ, the two rectangles must not overlap: the result is
  * unspecified then.
  *
