@@ -160,6 +160,16 @@ TEST(Scale, equalsItsStatementAtTheLimits) {
     });
 }
 
+// Vertical positions that wrap in the midst of a span, from the last row, which
+// the cache must still hold, to the first.
+TEST(Scale, spansThatWrap) {
+    forEachTarget([] {
+        Random random(1);
+        for (const uint32 height : {21u, 22u, 23u, 43u})
+            expectAsStated({{5, height, 20}, {5, 3, 20}, 0, 1637, 1, 0.05, 2, true}, random);
+    });
+}
+
 // --- Images in plain memory, for known values
 
 struct Image {

@@ -7,8 +7,8 @@
 // division of doubles gives 655360.
 //
 // Exponents have no limit that a few operations on doubles could reach, so
-// nothing overflows and nothing becomes denormal.  There are no infinities and
-// no NaN; zero has no sign.
+// nothing overflows and nothing becomes denormal.  There are no infinities (one
+// counts as 2^1024) and no NaN; zero has no sign.
 #pragma once
 
 #include "quillonTypes.h"
@@ -20,7 +20,7 @@ namespace quillon {
 class Extended {
 public:
     // All exact.
-    explicit Extended(double value); // must be finite
+    explicit Extended(double value); // no NaN
     explicit Extended(uint32 value) : Extended(normalised(false, 0, value)) {}
     explicit Extended(int32 value)
         : Extended(normalised(value < 0, 0,

@@ -22,8 +22,8 @@ struct RopPattern {
     BytePattern<kBytes> flip;
 };
 
-// One vector from byte i of a row on; kPeriod is 3 where the pattern does not
-// divide the vectors, and 1 where it is the same in all of them.
+// One vector from byte i of a row on; kPeriod is the number of bytes after which
+// the pattern repeats, and 1 where it is the same in all vectors.
 template <size_t kPeriod, size_t kBytes>
 struct RopFillBody {
     uint8_t *dst;
@@ -43,9 +43,11 @@ void RopFill(DstRows dst, Size bytes, int32 bytesPerPixel, uint32 keep, uint32 f
     const RopPattern<n> pattern = {BytePattern<n>(keep, bytesPerPixel),
                                    BytePattern<n>(flip, bytesPerPixel)};
     bytes = joinedRows(bytes, bytes.width, dst.step);
+    // Vectors of a single byte, on the scalar target, see a byte of the pixel each.
+    constexpr size_t kPeriod = n < 4 ? 12 : 3;
     for (size_t y = 0; y < bytes.height; ++y) {
-        if (bytesPerPixel == 3)
-            walkOnce<uint8_t>(bytes.width, RopFillBody<3, n>{dst.row(y), pattern});
+        if (bytesPerPixel == 3 || n < 4)
+            walkOnce<uint8_t>(bytes.width, RopFillBody<kPeriod, n>{dst.row(y), pattern});
         else
             walkOnce<uint8_t>(bytes.width, RopFillBody<1, n>{dst.row(y), pattern});
     }
@@ -106,7 +108,8 @@ HWY_INLINE void ropPixels(uint8_t *dst, const uint8_t *src, size_t bytes, bool b
 
 template <uint32_t kRop>
 void ropRows(DstRows dst, SrcRows src, Size bytes, int32 bytesPerPixel, bool backwards) {
-    constexpr size_t n = kLanes<Widest<uint8_t>>;
+    // A pixel is read whole also where vectors are smaller.
+    constexpr size_t n = HWY_MAX(kLanes<Widest<uint8_t>>, sizeof(uint32_t));
     for (size_t y = 0; y < bytes.height; ++y) {
         uint8_t *to = dst.row(y);
         const uint8_t *from = src.row(y);

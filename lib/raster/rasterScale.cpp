@@ -91,12 +91,8 @@ uint32 Raster_Scale(uint8 *dstBuffer, int32 dstLineIncrement, uint32 dstWidth, u
         return 1;
     }
     const ScaleCacheShape shape(job);
-    if (shape.slots == 0) {
-        RasterScaleRect(job, nullptr);
-        return 1;
-    }
-    void *cache = UtilSafeMalloc0(shape.bytes());
-    if (cache == nullptr)
+    void *cache = shape.slots == 0 ? nullptr : UtilSafeMalloc0(shape.bytes());
+    if (cache == nullptr && shape.slots != 0)
         return 0;
     RasterScaleRect(job, cache);
     std::free(cache);

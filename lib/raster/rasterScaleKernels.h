@@ -77,7 +77,8 @@ struct ScaleCacheShape {
     size_t rowBytes;
 };
 
-// Writes the rectangle.  cache is a block of ScaleCacheShape(job).bytes().
+// Writes the rectangle.  cache is a block of ScaleCacheShape(job).bytes(), not
+// looked at where there are no slots.
 void RasterScaleRect(const ScaleJob &job, void *cache);
 
 } // namespace quillon

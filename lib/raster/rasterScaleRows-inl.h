@@ -27,11 +27,11 @@ HWY_BEFORE_NAMESPACE();
 namespace quillon::HWY_NAMESPACE {
 namespace {
 
-constexpr size_t kPixelBytes = 4;
+inline constexpr size_t kPixelBytes = 4;
 
 // The pixels in a vector.
 template <class D>
-constexpr auto kPixels = static_cast<uint32>(kLanes<D>);
+inline constexpr auto kPixels = static_cast<uint32>(kLanes<D>);
 
 // Pixels at any address.  With a single lane Highway reads through a pointer,
 // which would have to be aligned.
@@ -177,7 +177,7 @@ HWY_INLINE void walkWindows(size_t count, size_t limit, const Body &body) {
 }
 
 // With four pixels in a vector, or one, several windows cost more than they save.
-constexpr bool kVectorsAreWide = kLanes < Widest < uint32 >>> 4;
+inline constexpr bool kVectorsAreWide = hn::MaxLanes(Widest<uint32>()) > 4;
 
 // Source pixels by their offset from the start of kWindows vectors that lie end
 // to end.
@@ -214,9 +214,9 @@ struct FillBody {
 HWY_INLINE void fillPixels(uint8 *dst, const uint8 *src, size_t index, size_t count) {
     if (count == 0)
         return;
-    FillBody body{dst, 0};
-    std::memcpy(&body.pixel, src + index * kPixelBytes, kPixelBytes);
-    walkAgain<uint32>(count, body);
+    uint32 pixel = 0;
+    std::memcpy(&pixel, src + index * kPixelBytes, kPixelBytes);
+    walkAgain<uint32>(count, FillBody{dst, pixel});
 }
 
 struct CopyBody {

@@ -136,8 +136,9 @@ void Raster_RectROPcopy(uint8 *dstBuffer, int32 dstLineIncrement, const uint8 *s
         return;
 
     // Going up, the walk begins at the exact address of the last row, and the
-    // step is what is left of the negated increment after rounding.
-    const uint32 toFirst = upwards ? height - 1 : 0;
+    // step is what is left of the negated increment after rounding.  The row's
+    // number can pass 32 bits.
+    const uint64_t toFirst = upwards ? uint64_t{height} - 1 : 0;
     const int64_t sign = upwards ? -1 : 1;
     const DstRows dst = {
         pixelAddress(dstBuffer, dstLineIncrement, bytesPerPixel, dstX, dstY + toFirst),
