@@ -1,0 +1,72 @@
+// Memory whose edges bite: a byte touched outside it ends the test at once,
+// whether it was read or written.
+#pragma once
+
+#include <gtest/gtest.h>
+
+#include <cstddef>
+#include <cstdint>
+
+namespace quillon::test {
+
+size_t pageSize();
+
+// Inaccessible address space, of which parts can be opened.  Takes no memory
+// until it is touched, so it may be far larger than the machine.
+class Mapping {
+public:
+    explicit Mapping(size_t size);
+    ~Mapping();
+    Mapping(const Mapping &) = delete;
+    Mapping &operator=(const Mapping &) = delete;
+
+    uint8_t *data() const { return data_; }
+    void open(size_t offset, size_t size); // in whole pages
+
+private:
+    uint8_t *data_;
+    size_t size_;
+};
+
+// A block of any size with one edge flush against an inaccessible page.  The
+// bytes between the other edge and its page's end are canaries; a size of whole
+// pages leaves none, and both edges bite.
+class FencedBuffer {
+public:
+    enum class Flush { kBehind, kBefore }; // where the page lies that the block touches
+
+    explicit FencedBuffer(size_t size, Flush flush = Flush::kBehind);
+
+    uint8_t *data() const { return data_; }
+    uint8_t *end() const { return data_ + size_; }
+    size_t size() const { return size_; }
+
+    // Whether every canary still has its value.
+    testing::AssertionResult canariesIntact() const;
+
+private:
+    Mapping mapping_;
+    uint8_t *open_; // the accessible pages
+    size_t openSize_;
+    uint8_t *data_;
+    size_t size_;
+};
+
+// Rows of one page, each alone between inaccessible pages, so that a rectangle
+// can have a fence at an edge of every one of its rows.
+class FencedRows {
+public:
+    explicit FencedRows(size_t height);
+
+    // The first row of a rectangle whose rows begin, or end, at a fence.
+    uint8_t *flushBefore() const { return mapping_.data() + pageSize(); }
+    uint8_t *flushBehind(size_t rowBytes) const { return flushBefore() + pageSize() - rowBytes; }
+
+    static ptrdiff_t step() { return static_cast<ptrdiff_t>(2 * pageSize()); }
+    uint8_t *page(size_t row) const { return flushBefore() + 2 * row * pageSize(); }
+
+private:
+    Mapping mapping_;
+};
+
+} // namespace quillon::test

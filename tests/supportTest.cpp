@@ -1,0 +1,85 @@
+// The support itself: a fence that does not bite, or a panic that goes
+// unnoticed, would let every other test pass.
+
+#include "hearth.h"
+#include "raster.h"
+#include "support/fence.h"
+#include "support/messages.h"
+#include "support/random.h"
+#include "support/targets.h"
+
+#include <set>
+
+namespace quillon::test {
+namespace {
+
+void touch(uint8_t *address) {
+    *const_cast<volatile uint8_t *>(address) = 1;
+}
+
+uint8_t look(const uint8_t *address) {
+    return *const_cast<const volatile uint8_t *>(address);
+}
+
+TEST(FenceDeathTest, bites) {
+    const FencedBuffer behind(100), before(100, FencedBuffer::Flush::kBefore);
+    touch(behind.data());
+    touch(behind.end() - 1);
+    touch(before.data());
+    touch(before.end() - 1);
+    EXPECT_DEATH(touch(behind.end()), "");
+    EXPECT_DEATH(look(behind.end()), "");
+    EXPECT_DEATH(touch(before.data() - 1), "");
+    EXPECT_DEATH(look(before.data() - 1), "");
+
+    const FencedBuffer pages(pageSize());
+    EXPECT_DEATH(look(pages.end()), "");
+    EXPECT_DEATH(look(pages.data() - 1), "");
+
+    const FencedRows rows(3);
+    for (size_t row = 0; row < 3; ++row) {
+        const ptrdiff_t offset = static_cast<ptrdiff_t>(row) * FencedRows::step();
+        touch(rows.flushBefore() + offset);
+        touch(rows.flushBehind(7) + offset + 6);
+        EXPECT_DEATH(look(rows.flushBefore() + offset - 1), "");
+        EXPECT_DEATH(look(rows.flushBehind(7) + offset + 7), "");
+    }
+}
+
+TEST(Fence, canaries) {
+    const FencedBuffer behind(100), before(100, FencedBuffer::Flush::kBefore);
+    EXPECT_TRUE(behind.canariesIntact());
+    EXPECT_TRUE(before.canariesIntact());
+    touch(behind.data() - 1);
+    touch(before.end());
+    EXPECT_FALSE(behind.canariesIntact());
+    EXPECT_FALSE(before.canariesIntact());
+}
+
+TEST(Messages, takeTheLibrarysPlace) {
+    Warning("from %s\n", "here");
+    Log("%d\n", 7);
+    EXPECT_EQ(warnings(), std::vector<std::string>{"from here\n"});
+    EXPECT_EQ(logs(), std::vector<std::string>{"7\n"});
+
+    // The library's own calls must land here too, past libhearth's functions.
+    uint8_t pixel = 0;
+    const std::string message =
+        expectPanic([&] { Raster_RectFill(&pixel, 1, 5, 0xFF, 0, 0, 1, 1); });
+    EXPECT_GT(panicLine(message, "NOT_IMPLEMENTED lib/raster/rasterops"), 0);
+    EXPECT_EQ(warnings().size(), 1u);
+    EXPECT_EQ(pixel, 0);
+}
+
+TEST(Random, isReproducible) {
+    if (onlyCase())
+        GTEST_SKIP() << "one case only";
+    std::vector<uint32_t> first, second;
+    forEachCase(50, [&](Random &random) { first.push_back(random.word()); });
+    forEachCase(50, [&](Random &random) { second.push_back(random.word()); });
+    EXPECT_EQ(first, second);
+    EXPECT_EQ(std::set<uint32_t>(first.begin(), first.end()).size(), 50u);
+}
+
+} // namespace
+} // namespace quillon::test
