@@ -32,6 +32,7 @@
 #define QUILLON_RASTER_H
 
 #include "quillonTypes.h"
+#include "rasterVideo.h"
 #include "rect.h"
 
 QUILLON_BEGIN_DECLS
