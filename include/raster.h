@@ -315,7 +315,7 @@ QUILLON_API void RasterRGB_MakeRGBParam(RasterRGBParam *param, int32 componentBi
 /** @name Conversion of rectangles
  *
  * Line increments and coordinates are unsigned.  Rows: rounded, except where
- * the layouts are equal and in Raster_ConvertIndexTo32, where they are exact.
+ * the layouts are equal and from a palette to 32 bits, where they are exact.
  * Where layouts differ, the two rectangles must not overlap: the result is
  * unspecified then.
  *
@@ -430,6 +430,82 @@ QUILLON_API uint32 Raster_Scale(uint8 *dstBuffer, int32 dstLineIncrement, uint32
  */
 QUILLON_API void Raster_ScaleSrcCoordinates(Rect *rect, uint32 srcWidth, uint32 srcHeight,
                                             double scaleX, double scaleY);
+
+/** @} */
+
+/** @name Rectangle lists
+ *
+ * A region of pixels in a record of fixed size, without allocation.  It may lie
+ * anywhere and be copied; all-zero memory is the empty region.
+ *
+ * A list that comes out of Raster_AddRect or Raster_SubRect is in normal form:
+ *   - at most 15 entries are in use.  They stand first; the rest is all zero.
+ *   - They are ordered by y, then by x.
+ *   - They do not overlap, and within a row they do not touch either.
+ *   - Each runs down as far as the rows hold a span with exactly its left and
+ *     right edges.  So stacked rectangles of equal edges are one entry, and
+ *     others never are.
+ * One region has one normal form: two such lists hold the same pixels exactly
+ * when their bytes are equal.  (The first rectangle added to an empty list is
+ * stored without touching the other entries.)
+ *
+ * A list may be filled by hand, in any order, with overlaps, and with all 16
+ * entries; the next call brings it to normal form.  The first entry of a width
+ * below 1 ends a list, and one that starts with an entry of a height below 1 is
+ * empty.
+ *
+ * Right and bottom edges should stay within int32.  An edge beyond it wraps, and
+ * such an entry as a rule covers nothing.
+ * @{
+ */
+
+/** One rectangle of a list: columns x to x + width - 1, rows y to y + height - 1. */
+typedef struct RasterRectListEntry {
+    int32 x;
+    int32 y;
+    int32 width;
+    int32 height;
+} RasterRectListEntry;
+
+/** A region.  256 bytes. */
+typedef struct RasterRectList {
+    RasterRectListEntry entries[16];
+} RasterRectList;
+
+/** Makes a list the empty region. */
+QUILLON_API void Raster_ClearRectList(RasterRectList *list);
+
+/** Adds a rectangle to a region.
+ *
+ * A region of more than 15 entries in normal form is replaced by its bounding
+ * box: a single entry, which covers pixels that were never added.  Should even
+ * the box be wider or higher than int32 can tell, the list stays as it was.
+ *
+ * @param width, height  not negative: a Panic with the list as it was, unless
+ *                       the other one is 0
+ * @return the number of pixels of the region, modulo 2^32; 0 with the list as it
+ *         was when width or height is 0, or when the box cannot be stored
+ */
+QUILLON_API uint32 Raster_AddRect(RasterRectList *list, int32 x, int32 y, int32 width,
+                                  int32 height);
+
+/** Cuts a rectangle out of a region.
+ *
+ * A negative width or height cuts nothing.
+ *
+ * A region of more than 15 entries in normal form cannot be stored: the list
+ * stays as it was, still holding the rectangle, and the result is 0.  A result
+ * of 0 with a list that is not empty thus says that the cut was not made (or
+ * that there was none to make, with a width or height of 0).
+ *
+ * A list filled by hand whose 16 entries make up 16 spans in one row is a Panic,
+ * with the list as it was, when one of them would have to be split.
+ *
+ * @return the number of pixels of the region, modulo 2^32; 0 with the list as it
+ *         was when width or height is 0, or when the region cannot be stored
+ */
+QUILLON_API uint32 Raster_SubRect(RasterRectList *list, int32 x, int32 y, int32 width,
+                                  int32 height);
 
 /** @} */
 

@@ -100,7 +100,7 @@ TEST(ConvertPixels, matchesReference) {
     FencedPalette fencedPalette;
     const std::vector<Pair> pairs = everyPair();
     forEachTarget([&] {
-        forEachCase(20000, [&](Random &random) {
+        forEachCase(12000, [&](Random &random) {
             const Pair pair = pairs[random.below(static_cast<uint32>(pairs.size()))];
             const int32 dstBytes = bytesOf(pair.dstDepth), srcBytes = srcBytesOf(pair);
             const RowRule rule = pair.isExact() ? RowRule::kExact : RowRule::kRounded;
@@ -141,7 +141,7 @@ TEST(ConvertPixels, staysInsideEveryRow) {
     random.fill(palette.data(), palette.size() * sizeof(uint32));
     forEachTarget([&] {
         for (uint32 width = 0; width <= 140; ++width) {
-            noteCase(width);
+            noteStep("width", width);
             dst.refill(random);
             src.refill(random);
             for (const Pair &pair : everyPair()) {
@@ -167,7 +167,7 @@ TEST(ConvertPixels, every16BitPixel) {
     constexpr uint32 kSide = 256;
     std::vector<uint16> pixels(size_t{kSide} * kSide);
     std::iota(pixels.begin(), pixels.end(), uint16{0});
-    Surface src = {reinterpret_cast<uint8 *>(pixels.data()), kSide * 2, 0, 0};
+    Surface src = {reinterpret_cast<uint8 *>(pixels.data()), int64_t{kSide} * 2, 0, 0};
     for (const int32 srcDepth : {15, 16})
         for (const int32 dstDepth : kLayouts) {
             const Pair pair = {srcDepth, dstDepth, false};
@@ -197,7 +197,7 @@ TEST(ConvertPixels, everyBitOfAColor) {
         const Pair pair = {32, dstDepth, false};
         const size_t dstRow = kWidth * static_cast<size_t>(bytesOf(dstDepth));
         std::vector<uint8> expected(dstRow), result(dstRow);
-        const Surface src = {reinterpret_cast<uint8 *>(colors.data()), 4 * kWidth, 0, 0};
+        const Surface src = {reinterpret_cast<uint8 *>(colors.data()), int64_t{kWidth} * 4, 0, 0};
         convertByReference(pair, {expected.data(), 0, 0, 0}, src, nullptr, {kWidth, 1});
         forEachTarget([&] {
             convert(pair, 0, {result.data(), 0, 0, 0}, src, nullptr, {kWidth, 1});
@@ -267,7 +267,8 @@ TEST(ConvertPixels, paletteIsReadWherePixelsPoint) {
     forEachTarget([&] {
         for (const int32 dstDepth : kLayouts) {
             const auto convertAll = [&](uint8 index, const uint32 *entry) {
-                std::vector<uint8> src(kWidth, index), dst(kWidth * 4), expected(kWidth * 4);
+                std::vector<uint8> src(kWidth, index), dst(size_t{kWidth} * 4),
+                    expected(dst.size());
                 const auto *palette = reinterpret_cast<const uint32 *>(
                     reinterpret_cast<uintptr_t>(entry) - index * sizeof(uint32));
                 const Pair pair = {8, dstDepth, true};

@@ -14,9 +14,6 @@
 namespace quillon::test {
 namespace {
 
-constexpr auto kBefore = FencedBuffer::Flush::kBefore;
-constexpr auto kBehind = FencedBuffer::Flush::kBehind;
-
 // The functions in one shape, so that the library's and the reference's are
 // called alike.
 const auto fill = [](auto function, const Surface &dst, int32 bytes, uint32 pixel, Size size) {
@@ -194,13 +191,13 @@ TEST(AlphaBlendOver, overlapAtEveryDistance) {
 TEST(RectCopy, withinOneSurface) {
     constexpr uint32 kWidth = 40, kHeight = 30;
     forEachCase(4000, [&](Random &random) {
-        const uint32 bytes = 1 + random.below(4), line = kWidth * bytes + random.below(3);
+        const size_t bytes = 1 + random.below(4), line = kWidth * bytes + random.below(3);
         const Size size = {random.below(kWidth + 1), random.below(kHeight + 1)};
         const auto [srcX, dstX] =
             std::pair(random.below(kWidth - size.width + 1), random.below(kWidth - size.width + 1));
         const auto [srcY, dstY] = std::pair(random.below(kHeight - size.height + 1),
                                             random.below(kHeight - size.height + 1));
-        std::vector<uint8> surface(size_t{kHeight} * line);
+        std::vector<uint8> surface(kHeight * line);
         random.fill(surface.data(), surface.size());
         const std::vector<uint8> before = surface;
         std::vector<uint8> expected = surface;
@@ -235,39 +232,41 @@ TEST(RectCopy, countOfBytesOfZeroOrLessCopiesNothing) {
 TEST(Raster, staysInsideEveryRow) {
     TwinRows dst, src;
     Random random(baseSeed());
-    const auto both = [&](auto function, auto library, auto reference, size_t rowBytes,
-                          auto... rest) {
-        for (const auto flush : {kBefore, kBehind}) {
-            function(library, dst.fenced(flush, rowBytes), rest...);
-            function(reference, dst.inModel(flush, rowBytes), rest...);
-        }
-    };
-    const auto bothOfTwo = [&](auto function, auto library, auto reference, size_t rowBytes,
-                               auto... rest) {
-        for (const auto flush : {kBefore, kBehind}) {
-            function(library, dst.fenced(flush, rowBytes), src.fenced(flush, rowBytes), rest...);
-            function(reference, dst.inModel(flush, rowBytes), src.inModel(flush, rowBytes),
-                     rest...);
+    uint32 width = 0;
+    // Each call does its operation with the library's or the reference's function.
+    const auto check = [&](int32 bytes, const auto &call, auto library, auto reference) {
+        const size_t rowBytes = width * static_cast<size_t>(bytes);
+        for (const auto flush : {FencedBuffer::Flush::kBefore, FencedBuffer::Flush::kBehind}) {
+            call(library, dst.fenced(flush, rowBytes), src.fenced(flush, rowBytes));
+            call(reference, dst.inModel(flush, rowBytes), src.inModel(flush, rowBytes));
+            ASSERT_TRUE(dst.agree()) << bytes << " bytes per pixel, width " << width;
         }
     };
     forEachTarget([&] {
-        for (uint32 width = 0; width <= 140; ++width) {
-            noteCase(width);
+        for (width = 0; width <= 140; ++width) {
+            noteStep("width", width);
             dst.refill(random);
             src.refill(random);
             const Size size = {width, TwinRows::kHeight};
             for (int32 bytes = 1; bytes <= 4; ++bytes) {
-                const size_t rowBytes = width * static_cast<size_t>(bytes);
-                both(fill, Raster_RectFill, reference::rectFill, rowBytes, bytes, random.word(),
-                     size);
-                bothOfTwo(copy, Raster_RectCopy, reference::rectCopy, rowBytes, bytes, size);
-                ASSERT_TRUE(dst.agree()) << bytes << " bytes per pixel, width " << width;
+                const uint32 pixel = random.word();
+                const auto filled = [&](auto function, const Surface &to, const Surface &) {
+                    fill(function, to, bytes, pixel, size);
+                };
+                const auto copied = [&](auto function, const Surface &to, const Surface &from) {
+                    copy(function, to, from, bytes, size);
+                };
+                check(bytes, filled, Raster_RectFill, reference::rectFill);
+                check(bytes, copied, Raster_RectCopy, reference::rectCopy);
             }
-            const size_t rowBytes = size_t{width} * 4;
-            both(fillAlpha, Raster_RectFillAlpha, reference::rectFillAlpha, rowBytes, uint8{77},
-                 size);
-            bothOfTwo(blend, Raster_AlphaBlendOver, reference::alphaBlendOver, rowBytes, size);
-            ASSERT_TRUE(dst.agree()) << "alpha, width " << width;
+            const auto alphaFilled = [&](auto function, const Surface &to, const Surface &) {
+                fillAlpha(function, to, 77, size);
+            };
+            const auto blended = [&](auto function, const Surface &to, const Surface &from) {
+                blend(function, to, from, size);
+            };
+            check(4, alphaFilled, Raster_RectFillAlpha, reference::rectFillAlpha);
+            check(4, blended, Raster_AlphaBlendOver, reference::alphaBlendOver);
             ASSERT_TRUE(src.agree());
         }
     });

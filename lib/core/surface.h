@@ -27,9 +27,10 @@ Byte *advance(Byte *pointer, uint64_t bytes) {
 // The address of pixel (x, y).  At 64 bits: y * lineIncrement alone can pass 32.
 // Unsigned, so that a negative increment wraps to the right address.
 template <class Byte>
-Byte *pixelAddress(Byte *buffer, int64_t lineIncrement, int64_t bytesPerPixel, uint32 x, uint32 y) {
-    return advance(buffer, uint64_t{y} * static_cast<uint64_t>(lineIncrement) +
-                               uint64_t{x} * static_cast<uint64_t>(bytesPerPixel));
+Byte *pixelAddress(Byte *buffer, int64_t lineIncrement, int64_t bytesPerPixel, uint64_t x,
+                   uint64_t y) {
+    return advance(buffer, y * static_cast<uint64_t>(lineIncrement) +
+                               x * static_cast<uint64_t>(bytesPerPixel));
 }
 
 // The rows of a rectangle: its first pixel, and the bytes from row to row.

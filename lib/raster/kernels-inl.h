@@ -84,6 +84,31 @@ HWY_INLINE void walkSingly(size_t count, const Body &body) {
         body(hn::CappedTag<T, 1>(), i);
 }
 
+// The same from the right end of the row to the left.
+template <class T, size_t kCap, class Body>
+HWY_INLINE void walkTailBackwards(size_t count, const Body &body) {
+    if (count & kCap)
+        body(hn::CappedTag<T, kCap>(), count &= ~kCap);
+    if constexpr (kCap > 1)
+        walkTailBackwards<T, kCap / 2>(count & (kCap - 1), body);
+}
+
+template <class T, class Body>
+HWY_INLINE void walkOnceBackwards(size_t count, const Body &body) {
+    const Widest<T> d;
+    constexpr size_t n = kLanes<decltype(d)>;
+    for (; count >= n; count -= n)
+        body(d, count - n);
+    if constexpr (n > 1)
+        walkTailBackwards<T, n / 2>(count, body);
+}
+
+template <class T, class Body>
+HWY_INLINE void walkSinglyBackwards(size_t count, const Body &body) {
+    while (count-- > 0)
+        body(hn::CappedTag<T, 1>(), count);
+}
+
 // Whether a vector of the given size would read a byte that walking pixel by
 // pixel would have written before: the destination lies ahead of the source by
 // less than the vector.

@@ -5,6 +5,7 @@
 #include "hwy/foreach_target.h"
 #include "hwy/highway.h"
 
+#include "raster/bytePattern-inl.h"
 #include "raster/kernels-inl.h"
 
 HWY_BEFORE_NAMESPACE();
@@ -13,56 +14,31 @@ namespace {
 
 // ---- Fill ---------------------------------------------------------------
 
-// The bytes of a row repeat every 12 bytes at every pixel size, in three words.
-struct FillWords {
-    uint32_t word[3];
-};
-
-FillWords fillWords(uint32_t pixel, int32 bytesPerPixel) {
-    switch (bytesPerPixel) {
-    case 1:
-        pixel = (pixel & 0xFF) * 0x01010101u;
-        return {{pixel, pixel, pixel}};
-    case 2:
-        pixel = (pixel & 0xFFFF) * 0x00010001u;
-        return {{pixel, pixel, pixel}};
-    case 3:
-        pixel &= 0xFFFFFF;
-        return {{pixel | pixel << 24, pixel >> 8 | pixel << 16, pixel >> 16 | pixel << 8}};
-    default:
-        return {{pixel, pixel, pixel}};
-    }
-}
-
 // Rows too short for the smallest vector, of 1 to 3 bytes.
-void fillFewBytes(DstRows dst, Size bytes, const FillWords &words) {
+void fillFewBytes(DstRows dst, Size bytes, const uint8_t *pattern) {
     for (size_t y = 0; y < bytes.height; ++y) {
         uint8_t *row = dst.row(y);
         for (size_t i = 0; i < bytes.width; ++i)
-            row[i] = static_cast<uint8_t>(words.word[0] >> (8 * i));
+            row[i] = pattern[i];
     }
 }
 
 // Whole vectors, three in turn so that each holds its part of the pattern, and
 // one that ends with the row.
-template <size_t kLanes>
-void fillVectors(DstRows dst, Size bytes, const FillWords &words) {
-    constexpr size_t n = 4 * kLanes;
-    const hn::CappedTag<uint32_t, kLanes> d;
-    uint32_t pattern[kLanes + 3];
-    for (size_t i = 0; i < kLanes + 3; ++i)
-        pattern[i] = words.word[i % 3];
+template <size_t kCap>
+void fillVectors(DstRows dst, Size bytes, const BytePattern<kCap> &pattern) {
+    const hn::CappedTag<uint32_t, kCap / 4>
+        d; // in words: the fallback has no other lanes of 4 bytes
+    constexpr size_t n = kCap;
     const auto from = [&](size_t offset) HWY_ATTR {
-        hn::Vec<decltype(d)> v;
-        hwy::CopyBytes<n>(reinterpret_cast<const uint8_t *>(pattern) + offset % 12, &v);
-        return v;
+        return hn::LoadU(d, reinterpret_cast<const uint32_t *>(pattern.from(offset)));
     };
+    const auto store = [&](hn::Vec<decltype(d)> v, uint8_t *to)
+                           HWY_ATTR { hn::StoreU(v, d, reinterpret_cast<uint32_t *>(to)); };
     const auto first = from(0);
     const auto second = from(n);
     const auto third = from(2 * n);
     const auto last = from(bytes.width - n);
-    const auto store = [&](hn::Vec<decltype(d)> v, uint8_t *to)
-                           HWY_ATTR { hn::StoreU(v, d, reinterpret_cast<uint32_t *>(to)); };
 
     for (size_t y = 0; y < bytes.height; ++y) {
         uint8_t *row = dst.row(y);
@@ -82,19 +58,19 @@ void fillVectors(DstRows dst, Size bytes, const FillWords &words) {
 
 // The widest vectors that fit a row.
 template <size_t kCap>
-void fillCapped(DstRows dst, Size bytes, const FillWords &words) {
-    if (bytes.width >= 4 * kCap)
-        fillVectors<kCap>(dst, bytes, words);
-    else if constexpr (kCap > 1)
-        fillCapped<kCap / 2>(dst, bytes, words);
+void fillCapped(DstRows dst, Size bytes, uint32_t pixel, int32_t bytesPerPixel) {
+    if (bytes.width >= kCap)
+        fillVectors<kCap>(dst, bytes, BytePattern<kCap>(pixel, bytesPerPixel));
+    else if constexpr (kCap > 4)
+        fillCapped<kCap / 2>(dst, bytes, pixel, bytesPerPixel);
     else
-        fillFewBytes(dst, bytes, words);
+        fillFewBytes(dst, bytes, BytePattern<4>(pixel, bytesPerPixel).bytes);
 }
 
 void Fill(DstRows dst, Size size, int32 bytesPerPixel, uint32 pixel) {
     const size_t rowBytes = size.width * static_cast<size_t>(bytesPerPixel);
     const Size bytes = joinedRows({rowBytes, size.height}, rowBytes, dst.step);
-    fillCapped<kLanes<Widest<uint32_t>>>(dst, bytes, fillWords(pixel, bytesPerPixel));
+    fillCapped<4 * kLanes<Widest<uint32_t>>>(dst, bytes, pixel, bytesPerPixel);
 }
 
 // ---- Alpha --------------------------------------------------------------

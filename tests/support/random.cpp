@@ -12,25 +12,31 @@ namespace {
 constexpr uint64_t kSeed = 20240229;
 
 std::optional<uint64_t> numberFrom(const char *name) {
-    const char *text = std::getenv(name);
+    const char *text = std::getenv(name); // NOLINT(concurrency-mt-unsafe): nobody sets it
     if (text == nullptr)
         return std::nullopt;
     return std::stoull(text);
 }
 
-// Written by the cases, read by the handler of a crash.
-volatile uint64_t currentCase = 0;
-const char *volatile currentTarget = "every target";
+// Written by the tests, read by the handler of a crash.
+const char *volatile currentStep = nullptr;
+volatile uint64_t currentNumber = 0;
+const char *volatile currentTarget = nullptr;
 struct sigaction previous;
 
-// Says which case crashed, and leaves the rest (a core, a sanitizer's report) to
+// Says what crashed, and leaves the rest (a core, a sanitizer's report) to
 // whoever was in charge before: the faulting instruction runs again.
-void report(int) {
+void report(int /*signal*/) {
     char text[160];
-    const int length = snprintf(text, sizeof(text),
-                                "crashed on %s: QUILLON_TEST_SEED=%llu QUILLON_TEST_CASE=%llu\n",
-                                currentTarget, static_cast<unsigned long long>(baseSeed()),
-                                static_cast<unsigned long long>(currentCase));
+    int length = snprintf(text, sizeof(text), "crashed: target %s, QUILLON_TEST_SEED=%llu",
+                          currentTarget == nullptr ? "not set" : currentTarget,
+                          static_cast<unsigned long long>(baseSeed()));
+    const auto room = sizeof(text) - static_cast<size_t>(length);
+    if (currentStep != nullptr)
+        length += snprintf(text + length, room, " %s=%llu\n", currentStep,
+                           static_cast<unsigned long long>(currentNumber));
+    else
+        length += snprintf(text + length, room, "\n");
     [[maybe_unused]] const ssize_t written =
         write(STDERR_FILENO, text, static_cast<size_t>(length));
     sigaction(SIGSEGV, &previous, nullptr);
@@ -56,9 +62,10 @@ std::optional<uint64_t> onlyCase() {
     return number;
 }
 
-void noteCase(uint64_t number) {
+void noteStep(const char *what, uint64_t number) {
     installReport();
-    currentCase = number;
+    currentStep = what;
+    currentNumber = number;
 }
 
 void noteTarget(const char *name) {

@@ -66,8 +66,9 @@ private:
 uint64_t baseSeed();                // QUILLON_TEST_SEED, or a fixed one
 std::optional<uint64_t> onlyCase(); // QUILLON_TEST_CASE
 
-// Notes what is running, for the report of a crash (a fence that bit).
-void noteCase(uint64_t number);
+// Notes what is running, for the report of a crash (a fence that bit): a number
+// that is called what, and the instruction set.  Null where there is none.
+void noteStep(const char *what, uint64_t number);
 void noteTarget(const char *name);
 
 // Runs run(random) for the cases 0 to count - 1, until one fails.
@@ -75,15 +76,16 @@ template <class Run>
 void forEachCase(uint64_t count, const Run &run) {
     const std::optional<uint64_t> only = onlyCase();
     for (uint64_t number = only.value_or(0); number < (only ? *only + 1 : count); ++number) {
-        noteCase(number);
+        noteStep("QUILLON_TEST_CASE", number);
         // Mixed once more, lest neighbouring cases share their numbers.
         Random random(Random(baseSeed() + number).bits());
         run(random);
         if (testing::Test::HasFailure()) {
             ADD_FAILURE() << "QUILLON_TEST_SEED=" << baseSeed() << " QUILLON_TEST_CASE=" << number;
-            return;
+            break;
         }
     }
+    noteStep(nullptr, 0);
 }
 
 } // namespace quillon::test

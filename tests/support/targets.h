@@ -18,7 +18,8 @@ void forEachTarget(const Run &run) {
     struct Restore {
         ~Restore() {
             hwy::SetSupportedTargetsForTest(0);
-            noteTarget("every target");
+            noteTarget(nullptr);
+            noteStep(nullptr, 0);
         }
     } const restore;
     const std::vector<int64_t> targets = hwy::SupportedAndGeneratedTargets();
