@@ -161,7 +161,7 @@ TEST(ApplyColorKey, staysInsideEveryRow) {
             for (const uint32 depth : {8u, 16u, 32u})
                 for (const auto flush :
                      {FencedBuffer::Flush::kBefore, FencedBuffer::Flush::kBehind}) {
-                    noteCase(width);
+                    noteStep("width", width);
                     background.refill(random);
                     dst.refill(random);
                     overlay.refill(random);

@@ -229,6 +229,9 @@ HWY_INLINE hn::Vec<D16> chromaSamples(D d, hn::Vec<D> words) {
 
 // ---- Frames -------------------------------------------------------------
 
+template <RasterVideoPixelLayout kLayout>
+constexpr size_t kPairBytes = size_t{2} * kLayout.bytesPerPixel;
+
 template <Group kGroup, RasterVideoPixelLayout kLayout>
 struct ConvertGroups {
     uint8_t *dst;
@@ -238,7 +241,7 @@ struct ConvertGroups {
     template <class D>
     HWY_INLINE void operator()([[maybe_unused]] D d, size_t i) const {
         const uint8_t *group = src + 4 * i;
-        uint8_t *pixels = dst + 2 * kLayout.bytesPerPixel * i;
+        uint8_t *pixels = dst + kPairBytes<kLayout> * i;
 #if HWY_TARGET == HWY_SCALAR
         convertPair<kLayout>(group[kGroup.luma], group[kGroup.luma + 2], group[kGroup.chromaLow],
                              group[kGroup.chromaHigh], pixels);
@@ -269,7 +272,7 @@ struct ConvertRowPair {
     // Pairs of columns i and on: as many as d has words.
     template <class D>
     HWY_INLINE void operator()([[maybe_unused]] D d, size_t i) const {
-        const size_t at = 2 * kLayout.bytesPerPixel * i;
+        const size_t at = kPairBytes<kLayout> * i;
 #if HWY_TARGET == HWY_SCALAR
         const auto convert = [&](const uint8_t *luma, uint8_t *pixels) {
             convertPair<kLayout>(luma[2 * i], luma[2 * i + 1], chromaLowRow[i], chromaHighRow[i],
@@ -298,25 +301,33 @@ struct ConvertRowPair {
     }
 };
 
+struct Run {
+    uint8_t *dst;
+    const uint8_t *src;
+    VideoGroupOrder order;
+    size_t groups;
+};
+
 template <RasterVideoPixelLayout kLayout>
-void convertGroups(uint8 *dst, const uint8 *src, VideoGroupOrder order, size_t groups) {
-    if (order == VideoGroupOrder::Yuy2)
-        walkAgain<uint32_t>(groups, ConvertGroups<kYuy2, kLayout>{dst, src});
+void convertGroups(const Run &run) {
+    if (run.order == VideoGroupOrder::Yuy2)
+        walkAgain<uint32_t>(run.groups, ConvertGroups<kYuy2, kLayout>{run.dst, run.src});
     else
-        walkAgain<uint32_t>(groups, ConvertGroups<kUyvy, kLayout>{dst, src});
+        walkAgain<uint32_t>(run.groups, ConvertGroups<kUyvy, kLayout>{run.dst, run.src});
 }
 
 void ConvertPacked(uint8 *dst, int32 bppdepth, const uint8 *src, VideoGroupOrder order,
                    size_t groups) {
+    const Run run = {dst, src, order, groups};
     switch (bppdepth) {
     case 15:
-        return convertGroups<kVideoLayout15>(dst, src, order, groups);
+        return convertGroups<kVideoLayout15>(run);
     case 16:
-        return convertGroups<kVideoLayout16>(dst, src, order, groups);
+        return convertGroups<kVideoLayout16>(run);
     case 24:
-        return convertGroups<kVideoLayout24>(dst, src, order, groups);
+        return convertGroups<kVideoLayout24>(run);
     default:
-        return convertGroups<kVideoLayout32>(dst, src, order, groups);
+        return convertGroups<kVideoLayout32>(run);
     }
 }
 
