@@ -33,6 +33,7 @@
 
 #include "quillonTypes.h"
 #include "rasterCursor.h"
+#include "rasterVideo.h"
 #include "rect.h"
 
 QUILLON_BEGIN_DECLS

@@ -1,0 +1,55 @@
+// The lower floor of the video routines.
+#pragma once
+
+#include "core/surface.h"
+
+namespace quillon {
+
+// What a pixel made from a frame looks like.  Three fields of 8 bits are cut to
+// their top bits and put together with the low one lowest; the low and the high
+// field have the same width.
+struct RasterVideoPixelLayout {
+    uint8 bytesPerPixel;
+    uint8 fieldShift; // bits cut off the low and the high field
+    uint8 midShift;   // and off the one between
+    uint8 midBits;
+    uint8 lowBits;
+    uint8 finalShift; // of the whole, to the left
+};
+inline constexpr RasterVideoPixelLayout kVideoLayout15 = {2, 3, 3, 5, 5, 1};
+inline constexpr RasterVideoPixelLayout kVideoLayout16 = {2, 3, 2, 6, 5, 0};
+inline constexpr RasterVideoPixelLayout kVideoLayout24 = {3, 0, 0, 8, 8, 0};
+inline constexpr RasterVideoPixelLayout kVideoLayout32 = {4, 0, 0, 8, 8, 0};
+
+// The order of the samples in a group: two luma samples and a pair of chroma.
+enum class VideoGroupOrder { Yuy2, Uyvy };
+
+// Converts a run of groups, each to two pixels.  bppdepth is 15, 16, 24 or 32.
+void convertPackedFrame(uint8 *dst, int32 bppdepth, const uint8 *src, VideoGroupOrder order,
+                        size_t groups);
+
+struct VideoPlanes {
+    SrcRows luma;
+    SrcRows chromaHigh;
+    SrcRows chromaLow;
+};
+
+// Converts blocks of two by two pixels that share their chroma; neither of
+// pairs' sizes is 0.
+void convertPlanarFrame(DstRows dst, int32 bppdepth, const VideoPlanes &src, Size pairs);
+
+// A pixel of a key surface, by its bytes.
+enum class KeyPixel { Bytes1 = 1, Bytes2 = 2, Bytes4 = 4 };
+
+struct KeyedRows {
+    DstRows dst;
+    SrcRows background;
+    SrcRows overlay;
+    SrcRows key;
+};
+
+// Takes each pixel from the overlay where the key surface matches and from the
+// background elsewhere, from the top left, row by row; no size is 0.
+void applyKeyRows(const KeyedRows &rows, Size size, KeyPixel keyPixel, uint32 key);
+
+} // namespace quillon

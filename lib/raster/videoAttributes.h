@@ -1,0 +1,19 @@
+// How a video frame lies in memory.
+#pragma once
+
+#include "quillonTypes.h"
+
+namespace quillon {
+
+// The bytes of a frame; for the planar format also the pitch of each of its
+// three planes (bytes from row to row) and its offset from the frame's first
+// byte.  All at pointer width: the last planes of a large frame lie beyond 4 GiB.
+//
+// pitches and offsets have three entries and may be null.  A packed format sets
+// offsets[0] alone, to 0, and no pitch.
+//
+// An unknown format gives false and a size of 0, and is logged the first time.
+bool RasterComputeVideoAttributes(uint32 format, uint32 width, uint32 height, size_t *size,
+                                  size_t *pitches, size_t *offsets);
+
+} // namespace quillon
