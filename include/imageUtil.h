@@ -135,6 +135,10 @@ QUILLON_API void ImageUtilReadPngCallback(struct png_struct_def *png, uint8 *des
  * An image of up to 8 bpp becomes a palette PNG, one of 24 or 16 bpp an RGB
  * PNG, one of 32 bpp an RGB or RGBA PNG.  The top row of the picture comes
  * first, whichever way the rows of the image run.
+ *
+ * There is no PNG, and the result is false, for an image without pixels, with
+ * rows shorter than its pixels, or with a pixel that the palette has no colour
+ * for.
  * @{
  */
 

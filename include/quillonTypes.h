@@ -1,7 +1,7 @@
 /** @file quillonTypes.h
  *
- * Integer types, the export mark and the version: what every header of
- * libquillon shares.  Usable from C99 and from C++.
+ * Integer types and the export mark: what every header of libquillon shares.
+ * Usable from C99 and from C++.
  */
 #ifndef QUILLON_TYPES_H
 #define QUILLON_TYPES_H

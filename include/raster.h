@@ -398,7 +398,8 @@ QUILLON_API void RasterCopyPixels(uint8 *dstBuffer, uint32 dstLineIncrement, con
  * may come out one or two levels low.  A shrink by more than 32 averages only
  * the first 32 rows of each span, and comes out darker accordingly.
  *
- * Takes one block of scratch memory for the call: a few destination rows.
+ * Where rows are mixed (filtered, at a vertical factor other than 1), takes one
+ * block of scratch memory for the call: a few destination rows, 33 at most.
  *
  * Rows: exact; the line increments may be negative, srcLineIncrement may be 0.
  *
@@ -423,12 +424,89 @@ QUILLON_API uint32 Raster_Scale(uint8 *dstBuffer, int32 dstLineIncrement, uint32
  * on it when the source is scaled: scaled, grown by one source pixel (at least
  * one destination pixel) on each side, and cut to the scaled image.
  *
- * left and top have no upper limit, right and bottom no lower one.
+ * left and top have no upper limit, right and bottom no lower one.  Factors that
+ * are infinite or no number leave the rectangle as it is.
  *
  * @param rect  in source coordinates; changed in place to destination ones
  */
 QUILLON_API void Raster_ScaleSrcCoordinates(Rect *rect, uint32 srcWidth, uint32 srcHeight,
                                             double scaleX, double scaleY);
+
+/** @} */
+
+/** @name Rectangle lists
+ *
+ * A region of pixels in a record of fixed size, without allocation.  It may lie
+ * anywhere and be copied; all-zero memory is the empty region.
+ *
+ * A list that comes out of Raster_AddRect or Raster_SubRect is in normal form:
+ *   - at most 15 entries are in use.  They stand first; the rest is all zero.
+ *   - They are ordered by y, then by x.
+ *   - They do not overlap, and within a row they do not touch either.
+ *   - Each runs down as far as the rows hold a span with exactly its left and
+ *     right edges.  So stacked rectangles of equal edges are one entry, and
+ *     others never are.
+ * One region has one normal form: two such lists hold the same pixels exactly
+ * when their bytes are equal.  (The first rectangle added to an empty list is
+ * stored without touching the other entries.)
+ *
+ * A list may be filled by hand, in any order, with overlaps, and with all 16
+ * entries; the next call brings it to normal form.  The first entry of a width
+ * below 1 ends a list, and one that starts with an entry of a height below 1 is
+ * empty.
+ *
+ * Right and bottom edges should stay within int32.  An edge beyond it wraps, and
+ * such an entry as a rule covers nothing.
+ * @{
+ */
+
+/** One rectangle of a list: columns x to x + width - 1, rows y to y + height - 1. */
+typedef struct RasterRectListEntry {
+    int32 x;
+    int32 y;
+    int32 width;
+    int32 height;
+} RasterRectListEntry;
+
+/** A region.  256 bytes. */
+typedef struct RasterRectList {
+    RasterRectListEntry entries[16];
+} RasterRectList;
+
+/** Makes a list the empty region. */
+QUILLON_API void Raster_ClearRectList(RasterRectList *list);
+
+/** Adds a rectangle to a region.
+ *
+ * A region of more than 15 entries in normal form is replaced by its bounding
+ * box: a single entry, which covers pixels that were never added.  Should even
+ * the box be wider or higher than int32 can tell, the list stays as it was.
+ *
+ * @param width, height  not negative: a Panic with the list as it was, unless
+ *                       the other one is 0
+ * @return the number of pixels of the region, modulo 2^32; 0 with the list as it
+ *         was when width or height is 0, or when the box cannot be stored
+ */
+QUILLON_API uint32 Raster_AddRect(RasterRectList *list, int32 x, int32 y, int32 width,
+                                  int32 height);
+
+/** Cuts a rectangle out of a region.
+ *
+ * A negative width or height cuts nothing.
+ *
+ * A region of more than 15 entries in normal form cannot be stored: the list
+ * stays as it was, still holding the rectangle, and the result is 0.  A result
+ * of 0 with a list that is not empty thus says that the cut was not made (or
+ * that there was none to make, with a width or height of 0).
+ *
+ * A list filled by hand whose 16 entries make up 16 spans in one row is a Panic,
+ * with the list as it was, when one of them would have to be split.
+ *
+ * @return the number of pixels of the region, modulo 2^32; 0 with the list as it
+ *         was when width or height is 0, or when the region cannot be stored
+ */
+QUILLON_API uint32 Raster_SubRect(RasterRectList *list, int32 x, int32 y, int32 width,
+                                  int32 height);
 
 /** @} */
 

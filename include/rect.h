@@ -117,6 +117,82 @@ QUILLON_API int32 Rect_PointDistance(const Rect *rect, const RectPoint *point);
  */
 QUILLON_API void Rect_Test(void);
 
+/** @name Diffs and mapping
+ *
+ * A pair of rectangles stands for a change (old and new) or a mapping (source
+ * and target), which is applied to a third rectangle or to a point.
+ *
+ * The extent of a rectangle on an axis is right - left or bottom - top, but 0
+ * when it covers nothing on that axis, and at most 2147483647.  Quotients are
+ * truncated towards zero unless a function says otherwise.
+ *
+ * Inputs are read before anything is stored, so outputs may be inputs.
+ * @{
+ */
+
+/** Adds the plain difference of two rectangles to a third, each field by itself:
+ * dst = rect + newRect - oldRect.
+ *
+ * @return true when no field was clamped
+ */
+QUILLON_API bool Rect_ApplyDiff(Rect *dst, const Rect *newRect, const Rect *oldRect,
+                                const Rect *rect);
+
+/** Adds the difference of two points to a third: dst = point + newPoint -
+ * oldPoint.
+ *
+ * @return true when no coordinate was clamped
+ */
+QUILLON_API bool Rect_ApplyDiffToPoint(RectPoint *dst, const RectPoint *newPoint,
+                                       const RectPoint *oldPoint, const RectPoint *point);
+
+/** Applies the change from oldRect to newRect to rect, in proportion to its size.
+ *
+ * Each field gets dst = rect + (newRect - oldRect) * n / d with the extents n of
+ * rect and d of oldRect on the field's axis: a rectangle of half the size moves
+ * its edges by half as much.  Where n and d agree, or d is 0, the difference is
+ * added as it is.
+ *
+ * The order of the rectangles differs from that of Rect_ApplyDiff.
+ *
+ * @return true when no field was clamped
+ */
+QUILLON_API bool Rect_ApplyDiffEx(Rect *dst, const Rect *rect, const Rect *oldRect,
+                                  const Rect *newRect);
+
+/** Clips a source rectangle and cuts its target rectangle accordingly.
+ *
+ * source as a whole maps to target as a whole.  The edges of the mapped part are
+ * rounded outward to whole pixels of the target.
+ *
+ * @param dstSource  gets the intersection of source and clip; may be null
+ * @param dstTarget  gets the part of target that it maps to; may be null
+ * @return true when both are not empty; otherwise both become all zero
+ */
+QUILLON_API bool Rect_IntersectPair(Rect *dstSource, const Rect *source, const Rect *clip,
+                                    Rect *dstTarget, const Rect *target);
+
+/** Maps a point from the space of source to that of target, axis by axis.
+ *
+ * Into a larger extent the first pixel maps to the first and the last to the
+ * last, that is with the factor (t - 1) / (s - 1) for the extents t of target
+ * and s of source; otherwise the factor is t / s.  A divisor below 1 counts as
+ * 1.  The scaled offset is rounded down, the result saturates.  The point may
+ * lie outside source, but its offset from the corner of source wraps at 32 bits.
+ */
+QUILLON_API void Rect_ScalePoint(const Rect *source, const Rect *target, const RectPoint *point,
+                                 RectPoint *dst);
+
+/** Expresses the part of rect within base relative to the corner of base.
+ *
+ * @param dst      gets that part, all zero when there is none
+ * @param clipped  gets the intersection as Rect_Intersect stores it; not null
+ * @return true when rect and base overlap
+ */
+QUILLON_API bool Rect_MapRect(const Rect *base, const Rect *rect, Rect *dst, Rect *clipped);
+
+/** @} */
+
 QUILLON_END_DECLS
 
 #endif /* QUILLON_RECT_H */

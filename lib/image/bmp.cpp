@@ -1,0 +1,144 @@
+// Writing BMP: 8-bit images with their palette, everything else at 24 bits.
+
+#include "imageRecord.h"
+
+#include <algorithm>
+#include <array>
+#include <cstdlib>
+#include <cstring>
+
+using namespace quillon;
+
+namespace {
+
+constexpr uint32 kFileHeaderBytes = 14;
+constexpr uint32 kInfoHeaderBytes = 40;
+constexpr uint32 kHeaderBytes = kFileHeaderBytes + kInfoHeaderBytes;
+
+// The sizes of a file: 64 bits hold them while width and height are below 2^31.
+struct BmpLayout {
+    bool hasPalette;
+    uint32 numColors;
+    uint64_t rowBytes;
+    uint64_t paletteBytes;
+    uint64_t imageBytes;
+
+    uint64_t pixelOffset() const { return kHeaderBytes + paletteBytes; }
+    uint64_t fileBytes() const { return pixelOffset() + imageBytes; }
+};
+
+BmpLayout layoutOf(const ImageInfo &image) {
+    BmpLayout layout = {};
+    layout.hasPalette = image.bpp <= 8;
+    layout.numColors = layout.hasPalette ? std::min(image.numColors, kMaxColors) : 0;
+    layout.paletteBytes = layout.numColors * sizeof(ImageUtilColor);
+    layout.rowBytes = roundUpTo4(uint64_t{image.width} * (layout.hasPalette ? 1 : 3));
+    layout.imageBytes = layout.rowBytes * image.height;
+    return layout;
+}
+
+// Whether there is a file for the image: its sizes fit the header's fields, of
+// which width and height are signed, and there are pixels.
+bool hasBmpForm(const ImageInfo &image, const BmpLayout &layout) {
+    return image.bpp >= 8 && image.width <= INT32_MAX && image.height <= INT32_MAX &&
+           layout.fileBytes() <= UINT32_MAX && (layout.imageBytes == 0 || image.data != nullptr);
+}
+
+bool isCopied(const ImageInfo &image) {
+    return image.bpp == 24 || image.bpp == 8;
+}
+
+// Stores little-endian fields one after another.
+class FieldWriter {
+public:
+    explicit FieldWriter(uint8 *out) : next(out) {}
+    void put16(uint32 value) { put(value, 2); }
+    void put32(uint64_t value) { put(value, 4); }
+
+private:
+    void put(uint64_t value, uint32 bytes) {
+        for (uint32 i = 0; i < bytes; ++i) {
+            *next++ = static_cast<uint8>(value >> (8 * i));
+        }
+    }
+    uint8 *next;
+};
+
+using BmpHeaders = std::array<uint8, kHeaderBytes>;
+
+BmpHeaders makeHeaders(const ImageInfo &image, const BmpLayout &layout) {
+    BmpHeaders headers;
+    FieldWriter fields(headers.data());
+    fields.put16('B' | 'M' << 8);
+    fields.put32(layout.fileBytes());
+    fields.put16(0); // reserved
+    fields.put16(0);
+    fields.put32(layout.pixelOffset());
+
+    fields.put32(kInfoHeaderBytes);
+    fields.put32(image.width);
+    fields.put32(image.height); // positive: the bottom row comes first
+    fields.put16(1);            // planes
+    fields.put16(layout.hasPalette ? 8 : 24);
+    fields.put32(0); // not compressed
+    fields.put32(layout.imageBytes);
+    fields.put32(0); // pixels per metre, horizontally and vertically
+    fields.put32(0);
+    fields.put32(layout.numColors);
+    fields.put32(0); // all colours are important
+    return headers;
+}
+
+// One row of the file.  Neither way reads behind the end of the source row;
+// what it lacks stays zero.
+void fillRow(uint8 *fileRow, const BmpLayout &layout, const ImageInfo &image, uint32 row) {
+    const uint8 *const source = rowAt(image, row);
+    if (isCopied(image)) {
+        // With the source's padding, as far as the file's row has room for it.
+        std::memcpy(fileRow, source, std::min<uint64_t>(layout.rowBytes, image.bytesPerLine));
+        return;
+    }
+    const int32 depth = conversionDepth(image);
+    const uint32 width = std::min(image.width, image.bytesPerLine / bytesAtDepth(depth));
+    Raster_ConvertPixels(fileRow, static_cast<uint32>(layout.rowBytes), 24, source,
+                         image.bytesPerLine, depth, false, nullptr, 0, 0, 0, 0, width, 1);
+}
+
+void fillRows(uint8 *block, const BmpLayout &layout, const ImageInfo &image) {
+    for (uint32 i = 0; i < image.height; ++i) {
+        const uint32 row = isBottomUp(image) ? i : image.height - 1 - i;
+        fillRow(block + i * layout.rowBytes, layout, image, row);
+    }
+}
+
+} // namespace
+
+bool ImageUtil_ConstructBMPBuffer(const ImageInfo *image, DynBuf *buffer) {
+    if (buffer == nullptr || image == nullptr) {
+        return false;
+    }
+    const BmpLayout layout = layoutOf(*image);
+    if (!hasBmpForm(*image, layout) ||
+        (!isCopied(*image) && !checkConvertible(conversionDepth(*image), 24))) {
+        return false;
+    }
+    const BmpHeaders headers = makeHeaders(*image, layout);
+    // Zeroed, for the padding of converted rows.
+    uint8 *const block = static_cast<uint8 *>(std::calloc(layout.imageBytes, 1));
+    if (block == nullptr) {
+        return false;
+    }
+    fillRows(block, layout, *image);
+
+    DynBuf_Init(buffer);
+    const bool isComplete =
+        DynBuf_Append(buffer, headers.data(), kFileHeaderBytes) &&
+        DynBuf_Append(buffer, headers.data() + kFileHeaderBytes, kInfoHeaderBytes) &&
+        (layout.paletteBytes == 0 || DynBuf_Append(buffer, image->palette, layout.paletteBytes)) &&
+        DynBuf_Append(buffer, block, layout.imageBytes);
+    std::free(block);
+    if (!isComplete) {
+        DynBuf_Destroy(buffer);
+    }
+    return isComplete;
+}

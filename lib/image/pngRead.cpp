@@ -1,0 +1,212 @@
+// Reading PNG: which files are taken, and how libpng is asked for their pixels.
+
+#include "imageRecord.h"
+
+#include <algorithm>
+#include <csetjmp>
+#include <cstdlib>
+#include <cstring>
+#include <png.h>
+
+using namespace quillon;
+
+namespace {
+
+constexpr uint32 kSignatureBytes = 8;
+
+// All that a decoding holds.  A libpng error jumps back over the frames between
+// without running destructors, so what has to be released is kept here, plain,
+// and outside the frame of the setjmp.
+struct PngReader {
+    ImageInfo *image;
+    uint32 flags;
+    ImageUtilPngReadState *state;
+    png_structp png;
+    png_infop info;
+    png_bytep *rows; // in the order of the file
+};
+
+bool openReader(PngReader &reader, const uint8 *buffer, uint32 size) {
+    reader.state =
+        static_cast<ImageUtilPngReadState *>(UtilSafeCalloc0(1, sizeof(ImageUtilPngReadState)));
+    if (reader.state == nullptr) {
+        return false;
+    }
+    *reader.state = ImageUtilPngReadState{buffer, 0, size};
+    if (size < kSignatureBytes || png_sig_cmp(buffer, 0, kSignatureBytes) != 0) {
+        return false;
+    }
+    reader.png = png_create_read_struct(PNG_LIBPNG_VER_STRING, nullptr, nullptr, nullptr);
+    if (reader.png == nullptr) {
+        return false;
+    }
+    reader.info = png_create_info_struct(reader.png);
+    return reader.info != nullptr;
+}
+
+void closeReader(PngReader &reader) {
+    png_destroy_read_struct(&reader.png, &reader.info, nullptr);
+    std::free(reader.rows);
+    std::free(reader.state);
+}
+
+void takePalette(const PngReader &reader) {
+    ImageInfo &image = *reader.image;
+    png_colorp colors = nullptr;
+    int count = 0;
+    png_get_PLTE(reader.png, reader.info, &colors, &count);
+    image.numColors = std::min(static_cast<uint32>(count), kMaxColors);
+    for (uint32 i = 0; i < image.numColors; ++i) {
+        image.palette[i] = ImageUtilColor{colors[i].blue, colors[i].green, colors[i].red, 0};
+    }
+}
+
+// Reads everything ahead of the pixels, and has libpng deliver them as one of
+// the three formats of the record.  False for a grey file.
+bool readHeader(const PngReader &reader) {
+    png_structp png = reader.png;
+    png_infop info = reader.info;
+    png_set_read_fn(png, reader.state, ImageUtilReadPngCallback);
+    png_read_info(png, info);
+
+    const int colorType = png_get_color_type(png, info);
+    const bool isPalette = colorType == PNG_COLOR_TYPE_PALETTE;
+    const bool isRgb = colorType == PNG_COLOR_TYPE_RGB;
+    const bool isRgba = colorType == PNG_COLOR_TYPE_RGB_ALPHA;
+    if (!isPalette && !isRgb && !isRgba) {
+        return false;
+    }
+
+    const bool reduce = png_get_bit_depth(png, info) == 16;
+    const bool dropAlpha = isRgba && (reader.flags & IMAGEUTIL_READ_KEEP_ALPHA) == 0;
+    const bool addAlpha = isRgb && (reader.flags & IMAGEUTIL_READ_ADD_ALPHA) != 0;
+    const bool unpack = isPalette && png_get_bit_depth(png, info) < 8;
+    if (reduce) {
+        png_set_scale_16(png);
+    }
+    if (dropAlpha) {
+        png_set_strip_alpha(png);
+    }
+    if (addAlpha) {
+        png_set_add_alpha(png, 255, PNG_FILLER_AFTER);
+    }
+    if (unpack) {
+        png_set_packing(png);
+    }
+    if (reduce || dropAlpha || addAlpha || unpack) {
+        // Without the first call png_read_image warns about interlaced files.
+        png_set_interlace_handling(png);
+        png_read_update_info(png, info);
+    }
+
+    ImageInfo &image = *reader.image;
+    image.depth = isPalette ? 8 : 24;
+    image.bpp = 8u * png_get_channels(png, info);
+    image.width = png_get_image_width(png, info);
+    image.height = png_get_image_height(png, info);
+    if (isPalette) {
+        takePalette(reader);
+    }
+    png_set_bgr(png);
+    return true;
+}
+
+// Takes the pixel block, and points libpng's rows into it.
+bool prepareRows(PngReader &reader) {
+    ImageInfo &image = *reader.image;
+    const uint64_t bytesPerLine = roundUpTo4(png_get_rowbytes(reader.png, reader.info));
+    if (bytesPerLine > UINT32_MAX / image.height) {
+        return false; // the block would pass 4 GiB
+    }
+    image.bytesPerLine = static_cast<uint32>(bytesPerLine);
+
+    image.data = static_cast<uint8 *>(UtilSafeMalloc0(size_t{image.height} * image.bytesPerLine));
+    if (image.data == nullptr) {
+        return false;
+    }
+    reader.rows =
+        static_cast<png_bytep *>(UtilSafeMalloc0(size_t{image.height} * sizeof(png_bytep)));
+    if (reader.rows == nullptr) {
+        ImageUtil_FreeImageData(&image);
+        return false;
+    }
+
+    const bool bottomUp = (reader.flags & IMAGEUTIL_READ_BOTTOM_UP) != 0;
+    for (uint32 i = 0; i < image.height; ++i) {
+        const uint32 row = bottomUp ? image.height - 1 - i : i;
+        reader.rows[i] = image.data + size_t{row} * image.bytesPerLine;
+    }
+    return true;
+}
+
+// The one frame that errors inside libpng come back to.
+bool decode(PngReader &reader) {
+    if (setjmp(png_jmpbuf(reader.png)) != 0) {
+        return false;
+    }
+    if (!readHeader(reader) || !prepareRows(reader)) {
+        return false;
+    }
+    png_read_image(reader.png, reader.rows);
+    png_read_end(reader.png, nullptr);
+    return true;
+}
+
+// The bytes of a whole file, to be released with free; null when it cannot be
+// opened, sized or read, or is empty.
+uint8 *readFile(const char *fileName, uint32 *size) {
+    FileIODescriptor file;
+    FileIO_Invalidate(&file);
+    if (FileIO_Open(&file, fileName, FILEIO_ACCESS_READ, FILEIO_OPEN) != 0) {
+        return nullptr;
+    }
+    const int64_t fileSize = FileIO_GetSize(&file);
+    if (fileSize < 0) {
+        FileIO_Close(&file);
+        return nullptr;
+    }
+    const uint32 wanted = static_cast<uint32>(fileSize); // the low 32 bits
+    size_t actual = 0;
+    uint8 *buffer = static_cast<uint8 *>(UtilSafeCalloc0(1, wanted));
+    const bool isRead = buffer != nullptr && FileIO_Read(&file, buffer, wanted, &actual) == 0;
+    FileIO_Close(&file);
+    if (!isRead) {
+        std::free(buffer);
+        return nullptr;
+    }
+    *size = static_cast<uint32>(actual);
+    return buffer;
+}
+
+} // namespace
+
+bool ImageUtil_ReadPNG(ImageInfo *image, const char *fileName, uint32 flags) {
+    uint32 size = 0;
+    uint8 *const buffer = readFile(fileName, &size);
+    const bool isRead = ImageUtil_ReadPNGBuffer(image, buffer, size, flags);
+    std::free(buffer);
+    return isRead;
+}
+
+bool ImageUtil_ReadPNGBuffer(ImageInfo *image, const uint8 *buffer, uint32 size, uint32 flags) {
+    if (buffer == nullptr || image == nullptr || size == 0) {
+        return false;
+    }
+    std::memset(image, 0, sizeof *image);
+
+    PngReader reader = {};
+    reader.image = image;
+    reader.flags = flags;
+    const bool isRead = openReader(reader, buffer, size) && decode(reader);
+    closeReader(reader);
+    return isRead;
+}
+
+void ImageUtilReadPngCallback(png_structp png, uint8 *dest, size_t length) {
+    auto *const state = static_cast<ImageUtilPngReadState *>(png_get_io_ptr(png));
+    if (state->offset > state->size || length > state->size - state->offset) {
+        png_error(png, "Unexpected end of data");
+    }
+    std::memcpy(dest, state->buffer + state->offset, length);
+    state->offset += static_cast<uint32>(length);
+}

@@ -1,0 +1,198 @@
+// Resampling: the walks over the destination rows, which blend what the row
+// kernels make.
+//
+// All arithmetic is on the four 8-bit channels of a pixel alike.  Weights have
+// 8 bits, so that a product, and the sum of two, fits 16; every product is
+// truncated by itself, and the results depend on it.
+
+#undef HWY_TARGET_INCLUDE
+#define HWY_TARGET_INCLUDE "raster/rasterScaleKernels.cpp"
+#include "raster/rasterScaleKernels.h"
+
+#include <algorithm>
+#include <cstring>
+
+#include "hwy/foreach_target.h" // IWYU pragma: keep
+
+#include "hwy/highway.h"
+#include "raster/kernels-inl.h"
+#include "raster/rasterScaleRows-inl.h"
+
+HWY_BEFORE_NAMESPACE();
+namespace quillon::HWY_NAMESPACE {
+namespace {
+
+// The source row of a vertical position.
+HWY_INLINE uint32 rowOf(const ScaleAxis &axis, uint32 position) {
+    const bool isAbove = position >> 31 != 0;
+    return isAbove ? 0 : std::min(position >> 16, axis.srcSize - 1);
+}
+
+// The source rows that neighbouring destination rows share, already scaled.
+template <class Row>
+class RowCache {
+public:
+    RowCache(const ScaleJob &job, const Row &row, void *block)
+        : job_(job), row_(row), slots_(static_cast<RasterScaleRowSlot *>(block)) {
+        const ScaleCacheShape shape(job);
+        period_ = static_cast<uint32>(shape.slots - 1);
+        const auto behindSlots = reinterpret_cast<uintptr_t>(slots_ + shape.slots);
+        auto *pixels = reinterpret_cast<uint8 *>((behindSlots + ScaleCacheShape::kAlignment - 1) &
+                                                 -ScaleCacheShape::kAlignment);
+        for (size_t i = 0; i < shape.slots; ++i)
+            slots_[i] = {pixels + i * shape.rowBytes, kScaleNoRow};
+    }
+
+    HWY_INLINE const uint8 *fetch(uint32 position) const {
+        const uint32 index = rowOf(job_.y, position);
+        RasterScaleRowSlot &slot = slots_[index == 0 ? 0 : 1 + index % period_];
+        if (slot.rowIndex != index) {
+            slot.rowIndex = index;
+            row_(slot.pixels, job_.src.row(index));
+        }
+        return slot.pixels;
+    }
+
+private:
+    const ScaleJob &job_;
+    const Row &row_;
+    RasterScaleRowSlot *slots_;
+    uint32 period_;
+};
+
+// Each destination row is one scaled source row.  No cache: a row that comes
+// again is copied from the destination row before.
+template <class Row>
+HWY_INLINE void walkDirect(const ScaleJob &job, const Row &row) {
+    uint8 *dst = job.dst.first;
+    uint32 y = job.y.start;
+    uint32 previous = kScaleNoRow;
+    for (uint32 i = 0; i < job.y.dstSize; ++i, y += job.y.step) {
+        const uint32 index = rowOf(job.y, y);
+        if (index == previous)
+            std::memmove(dst, dst - job.dst.step, size_t{job.x.dstSize} * kPixelBytes);
+        else
+            row(dst, job.src.row(index));
+        previous = index;
+        dst += job.dst.step;
+    }
+}
+
+struct BlendBody {
+    uint8 *dst;
+    const uint8 *upper, *lower;
+    uint32 lowerWeight; // 0 to 255
+
+    template <class D>
+    HWY_INLINE void operator()(D d, size_t i) const {
+        using Channels = ChannelPairs<D>;
+        const size_t offset = i * kPixelBytes;
+        storePixels(Channels::blend(loadPixels(d, upper + offset),
+                                    Channels::weight(255 - lowerWeight),
+                                    loadPixels(d, lower + offset), Channels::weight(lowerWeight)),
+                    d, dst + offset);
+    }
+};
+
+// Each destination row is a blend of two source rows, with weights that sum to
+// 255; at the edges both can be the same row.
+template <class Row>
+HWY_INLINE void walkLinear(const ScaleJob &job, const Row &row, void *block) {
+    const RowCache<Row> cache(job, row, block);
+    uint8 *dst = job.dst.first;
+    uint32 y = job.y.start;
+    for (uint32 i = 0; i < job.y.dstSize; ++i, y += job.y.step) {
+        const uint8 *upper = cache.fetch(y);
+        const uint8 *lower = cache.fetch(y + kScaleOne);
+        walkAgain<uint32>(job.x.dstSize, BlendBody{dst, upper, lower, (y & 0xFFFF) >> 8});
+        dst += job.dst.step;
+    }
+}
+
+// A source row and its weight in an average, 0 to 255.
+struct Tap {
+    const uint8 *row;
+    uint32 weight;
+};
+
+struct AverageBody {
+    uint8 *dst;
+    const Tap *taps;
+    size_t count;
+    uint32 normaliser;
+
+    template <class D>
+    HWY_INLINE void operator()(D d, size_t i) const {
+        const size_t offset = i * kPixelBytes;
+        ChannelSums<D> sums;
+        for (const Tap *tap = taps; tap != taps + count; ++tap)
+            sums.add(loadPixels(d, tap->row + offset), ChannelPairs<D>::weight(tap->weight));
+        storePixels(sums.average(normaliser), d, dst + offset);
+    }
+};
+
+// Each destination row is the average of the source rows that the step covers,
+// or of the first 32 of them.  A row covered whole has the weight 255 of 256.
+template <class Row>
+HWY_INLINE void walkBox(const ScaleJob &job, const Row &row, void *block) {
+    const RowCache<Row> cache(job, row, block);
+    uint8 *dst = job.dst.first;
+    uint32 y = job.y.start;
+    for (uint32 i = 0; i < job.y.dstSize; ++i, y += job.y.step) {
+        Tap taps[kScaleMaxTaps];
+        size_t count = 0;
+        uint32 position = y;
+        uint32 remaining = job.y.step;
+        while (remaining != 0 && count < kScaleMaxTaps) {
+            const uint32 toNext = kScaleOne - (position & 0xFFFF);
+            const uint32 covered = std::min(toNext, remaining);
+            const uint32 weight = std::min<uint32>(covered >> 8, 255);
+            taps[count++] = {cache.fetch(position), weight};
+            position += covered;
+            remaining -= covered;
+        }
+        walkAgain<uint32>(job.x.dstSize, AverageBody{dst, taps, count, job.y.normaliser});
+        dst += job.dst.step;
+    }
+}
+
+template <class Row>
+void walkRows(const ScaleJob &job, const Row &row, void *block) {
+    switch (job.y.method) {
+    case ScaleMethod::kNearest:
+        return walkDirect(job, row);
+    case ScaleMethod::kLinear:
+        return walkLinear(job, row, block);
+    case ScaleMethod::kBox:
+        return walkBox(job, row, block);
+    }
+}
+
+void scaleRect(const ScaleJob &job, void *block) {
+    switch (job.x.method) {
+    case ScaleMethod::kNearest:
+        return walkRows(job, RasterScaleRowNearest(job.x), block);
+    case ScaleMethod::kLinear:
+        return walkRows(job, RasterScaleRowLinear(job.x), block);
+    case ScaleMethod::kBox:
+        return job.x.step <= 257 * kScaleOne
+                   ? walkRows(job, RasterScaleRowBox<uint16>(job.x), block)
+                   : walkRows(job, RasterScaleRowBox<uint32>(job.x), block);
+    }
+}
+
+} // namespace
+} // namespace quillon::HWY_NAMESPACE
+HWY_AFTER_NAMESPACE();
+
+#if HWY_ONCE
+namespace quillon {
+
+HWY_EXPORT(scaleRect);
+
+void RasterScaleRect(const ScaleJob &job, void *cache) {
+    HWY_DYNAMIC_DISPATCH(scaleRect)(job, cache);
+}
+
+} // namespace quillon
+#endif

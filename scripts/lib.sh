@@ -1,0 +1,60 @@
+# What the scripts share; each one sources it first.  It goes to the root of the
+# repository.
+set -eu
+cd "$(dirname "${BASH_SOURCE[0]}")/.."
+
+# Debian packages, by what they are needed for.
+buildPackages=(cmake g++ ninja-build pkg-config libpng-dev libhwy-dev libgtest-dev)
+benchPackages=(libbenchmark-dev)
+formatPackages=(clang-format)
+clangPackages=(clang libclang-rt-dev)
+lintPackages=(clang clang-tidy)
+
+say() { printf '\n== %s\n' "$*"; }
+fail() {
+    printf '%s\n' "$*" >&2
+    exit 1
+}
+
+# Installs those of the given packages that are missing.
+need() {
+    if ! command -v dpkg-query >/dev/null; then
+        echo "This is no Debian; taking these for granted, under whatever name: $*"
+        return
+    fi
+    local missing=() package
+    for package; do
+        dpkg-query -W -f='${Status}' "$package" 2>/dev/null | grep -q '^install ok installed' ||
+            missing+=("$package")
+    done
+    [ ${#missing[@]} -gt 0 ] || return 0
+
+    local asRoot=()
+    if [ "$(id -u)" -ne 0 ]; then
+        command -v sudo >/dev/null ||
+            fail "Missing, and only root can install them: apt-get install ${missing[*]}"
+        asRoot=(sudo)
+    fi
+    say "Installing ${missing[*]}"
+    { "${asRoot[@]}" apt-get update -q &&
+        "${asRoot[@]}" env DEBIAN_FRONTEND=noninteractive \
+            apt-get install -y -q --no-install-recommends "${missing[@]}"; } ||
+        fail "Missing, and could not be installed: ${missing[*]}"
+}
+
+# Configures build/PRESET and builds it, or only the given targets.
+build() { # PRESET [TARGET...]
+    local preset=$1 target targets=()
+    shift
+    for target; do targets+=(--target "$target"); done
+    say "Configuring build/$preset"
+    cmake --preset "$preset" --log-level=WARNING
+    say "Building ${*:-everything} in build/$preset"
+    cmake --build --preset "$preset" "${targets[@]}"
+}
+
+# C and C++ files of this repository, below the given folders or everywhere.
+sources() { # [FOLDER...]
+    find "${@:-.}" -name build\* -prune -o -name .git -prune -o \
+        \( -name '*.h' -o -name '*.c' -o -name '*.cpp' \) -print | sort
+}

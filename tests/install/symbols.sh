@@ -1,0 +1,33 @@
+#!/bin/bash
+# The headers, the map and the libraries must agree on what is exported.
+# Usage: symbols.sh SOURCE_DIR LIBQUILLON LIBHEARTH
+set -euo pipefail
+export LC_ALL=C
+sourceDir=$1 libquillon=$2 libhearth=$3
+
+# Names of functions declared with an export mark: the last word ahead of the
+# parenthesis.
+declared() { # MARK HEADER...
+    local mark=$1
+    shift
+    grep -hv '^#' "$@" | tr '\n' ' ' | grep -oE "\b$mark\b[^;(]*\(" | sed -E 's/.*\b(\w+) *\($/\1/' |
+        sort
+}
+
+exported() { # LIBRARY
+    nm -D --defined-only "$1" | awk '$2 != "A" { sub(/@.*/, "", $3); print $3 }' | sort
+}
+
+failed=0
+compare() { # WHAT EXPECTED ACTUAL
+    [ -n "$2" ] || { echo "$1: nothing to compare with"; failed=1; }
+    diff <(echo "$2") <(echo "$3") || { echo "$1: lines with < are missing, with > too much"; failed=1; }
+}
+
+headers=$(declared QUILLON_API "$sourceDir"/include/*.h)
+map=$(grep -oE '^ +\w+;' "$sourceDir/lib/quillon.map" | tr -d ' ;' | sort)
+compare "quillon.map against the headers" "$headers" "$map"
+compare "libquillon against quillon.map" "$map" "$(exported "$libquillon")"
+compare "libhearth against hearth.h" "$(declared HEARTH_API "$sourceDir/hearth/hearth.h")" \
+    "$(exported "$libhearth")"
+exit $failed

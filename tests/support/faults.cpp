@@ -1,0 +1,171 @@
+#include "support/faults.h"
+
+#include "hearth.h"
+
+#include <cerrno>
+#include <cstdlib>
+#include <cstring>
+#include <dlfcn.h>
+
+#if defined(__SANITIZE_ADDRESS__) || defined(__SANITIZE_THREAD__)
+#define HAS_OWN_MALLOC 0
+#elif defined(__has_feature)
+#if __has_feature(address_sanitizer) || __has_feature(thread_sanitizer)
+#define HAS_OWN_MALLOC 0
+#endif
+#endif
+#ifndef HAS_OWN_MALLOC
+#define HAS_OWN_MALLOC 1
+#endif
+
+namespace quillon::test {
+namespace {
+
+bool armed = false;
+Requests counted = Requests::kAll;
+uint64_t requestsLeft = 0; // until the one that fails
+bool hasFailed = false;
+int64_t held = 0;
+FileFault fileFault = FileFault::kNone;
+int openCount = 0;
+
+bool requestFails(Requests kind) {
+    if (!armed || hasFailed || (counted == Requests::kHearth && kind != counted)) {
+        return false;
+    }
+    hasFailed = requestsLeft == 0;
+    --requestsLeft;
+    return hasFailed;
+}
+
+// The function that this program's own one hides.
+template <class Function>
+Function *hidden(Function * /*own*/, const char *name) {
+    return reinterpret_cast<Function *>(dlsym(RTLD_NEXT, name));
+}
+
+} // namespace
+
+MemoryFault::MemoryFault(uint64_t n, Requests which) {
+    counted = which;
+    requestsLeft = n;
+    hasFailed = false;
+    held = 0;
+    armed = true;
+}
+
+MemoryFault::~MemoryFault() {
+    armed = false;
+}
+
+bool MemoryFault::happened() const {
+    return hasFailed;
+}
+
+int64_t MemoryFault::blocksHeld() const {
+    return held;
+}
+
+void setFileFault(FileFault fault) {
+    fileFault = fault;
+}
+
+int filesOpen() {
+    return openCount;
+}
+
+} // namespace quillon::test
+
+using namespace quillon::test;
+
+// Under a sanitizer: null for what cannot be had, as everywhere else.
+extern "C" const char *__asan_default_options() {
+    return "allocator_may_return_null=1";
+}
+
+#if HAS_OWN_MALLOC
+extern "C" {
+
+void *__libc_malloc(size_t size);
+void *__libc_calloc(size_t count, size_t size);
+void *__libc_realloc(void *block, size_t size);
+void __libc_free(void *block);
+
+static void *noted(void *block) {
+    held += armed && block != nullptr ? 1 : 0;
+    return block;
+}
+
+void *malloc(size_t size) noexcept {
+    return requestFails(Requests::kAll) ? nullptr : noted(__libc_malloc(size));
+}
+
+void *calloc(size_t count, size_t size) noexcept {
+    return requestFails(Requests::kAll) ? nullptr : noted(__libc_calloc(count, size));
+}
+
+void *realloc(void *block, size_t size) noexcept {
+    if (requestFails(Requests::kAll)) {
+        return nullptr;
+    }
+    return block == nullptr ? noted(__libc_malloc(size)) : __libc_realloc(block, size);
+}
+
+void free(void *block) noexcept {
+    held -= armed && block != nullptr ? 1 : 0;
+    __libc_free(block);
+}
+
+} // extern "C"
+#endif
+
+void *UtilSafeMalloc0(size_t size) {
+    static auto *const next = hidden(UtilSafeMalloc0, "UtilSafeMalloc0");
+    void *const block = requestFails(Requests::kHearth) ? nullptr : next(size);
+    // Not all of a block that no page is behind yet.
+    return block == nullptr ? nullptr : std::memset(block, kStale, size < 1u << 24 ? size : 0);
+}
+
+void *UtilSafeCalloc0(size_t count, size_t size) {
+    static auto *const next = hidden(UtilSafeCalloc0, "UtilSafeCalloc0");
+    return requestFails(Requests::kHearth) ? nullptr : next(count, size);
+}
+
+bool DynBuf_Append(DynBuf *buffer, const void *source, size_t length) {
+    static auto *const next = hidden(DynBuf_Append, "DynBuf_Append");
+    return !requestFails(Requests::kHearth) && next(buffer, source, length);
+}
+
+int FileIO_Open(FileIODescriptor *file, const char *name, int access, int action) {
+    static auto *const next = hidden(FileIO_Open, "FileIO_Open");
+    const int status = next(file, name, access, action);
+    openCount += status == 0 ? 1 : 0;
+    return status;
+}
+
+int FileIO_Close(FileIODescriptor *file) {
+    static auto *const next = hidden(FileIO_Close, "FileIO_Close");
+    openCount -= file->fd >= 0 ? 1 : 0;
+    return next(file);
+}
+
+int64_t FileIO_GetSize(const FileIODescriptor *file) {
+    static auto *const next = hidden(FileIO_GetSize, "FileIO_GetSize");
+    return fileFault == FileFault::kSizeFails ? -1 : next(file);
+}
+
+int FileIO_Read(FileIODescriptor *file, void *buffer, size_t count, size_t *actual) {
+    static auto *const next = hidden(FileIO_Read, "FileIO_Read");
+    if (fileFault == FileFault::kReadFails) {
+        return EIO;
+    }
+    return next(file, buffer, count - (fileFault == FileFault::kReadShort ? 1 : 0), actual);
+}
+
+int FileIO_Write(FileIODescriptor *file, const void *source, size_t count, size_t *actual) {
+    static auto *const next = hidden(FileIO_Write, "FileIO_Write");
+    if (fileFault == FileFault::kWriteFails) {
+        return ENOSPC;
+    }
+    return next(file, source, count - (fileFault == FileFault::kWriteShort ? 1 : 0), actual);
+}

@@ -1,0 +1,70 @@
+// Faults of memory and of files, put in where a test wants them.
+//
+// A test program that links this has its own UtilSafeMalloc0, UtilSafeCalloc0,
+// DynBuf_Append and FileIO_*, which pass on to libhearth's, and its own malloc,
+// calloc, realloc and free; the latter not under a sanitizer, which brings its
+// own.  Blocks of UtilSafeMalloc0 come filled with kStale.
+#pragma once
+
+#include <gtest/gtest.h>
+
+#include <cstdint>
+
+namespace quillon::test {
+
+inline constexpr uint8_t kStale = 0xA5;
+
+enum class Requests {
+    kAll,   // those of the libraries beneath too
+    kHearth // UtilSafeMalloc0, UtilSafeCalloc0 and DynBuf_Append
+};
+
+// While one lives, the n-th request for memory, from 0, fails: that one alone.
+class MemoryFault {
+public:
+    explicit MemoryFault(uint64_t n, Requests counted = Requests::kAll);
+    ~MemoryFault();
+    MemoryFault(const MemoryFault &) = delete;
+    MemoryFault &operator=(const MemoryFault &) = delete;
+
+    bool happened() const;
+    // Blocks taken since construction and not given back.  0 under a sanitizer,
+    // which finds leaks itself.
+    int64_t blocksHeld() const;
+};
+
+// Calls run() once for each request for memory it makes, with that one failing,
+// and once more with none failing.  run() gives back what it got.  After each,
+// check(failed) looks at what run() has noted down.
+template <class Run, class Check>
+void forEachMemoryFault(const Run &run, const Check &check) {
+    bool failed = true;
+    for (uint64_t n = 0; failed && !testing::Test::HasFailure(); ++n) {
+        int64_t held = 0;
+        {
+            const MemoryFault fault(n);
+            run();
+            failed = fault.happened();
+            held = fault.blocksHeld();
+        }
+        EXPECT_EQ(held, 0) << "request " << n;
+        check(failed);
+    }
+}
+
+enum class FileFault {
+    kNone,
+    kSizeFails,
+    kReadFails,  // EIO
+    kReadShort,  // all but the last byte
+    kWriteFails, // ENOSPC
+    kWriteShort, // all but the last byte
+};
+
+// The fault of every file operation from now on.
+void setFileFault(FileFault fault);
+
+// Files opened and not closed.
+int filesOpen();
+
+} // namespace quillon::test
