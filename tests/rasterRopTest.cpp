@@ -293,10 +293,12 @@ TEST(RectROPcopy, withinOneSurface) {
         std::vector<uint8> surface(size_t{kHeight} * line);
         random.fill(surface.data(), surface.size());
         std::vector<uint8> expected = surface;
+        const auto at = [=](uint32 x, uint32 y) { return size_t{y} * line + size_t{x} * bytes; };
         for (uint32 row = 0; row < size.height; ++row) {
-            const uint8 *src = surface.data() + (srcY + row) * line + srcX * bytes;
-            const size_t dst = (dstY + row) * line + dstX * bytes;
-            std::transform(src, src + size.width * bytes, &surface[0] + dst, &expected[0] + dst,
+            const uint8 *src = surface.data() + at(srcX, srcY + row);
+            const size_t dst = at(dstX, dstY + row);
+            std::transform(src, src + at(size.width, 0), surface.data() + dst,
+                           expected.data() + dst,
                            [=](uint8 s, uint8 d) { return named(rop, s, d); });
         }
         Raster_RectROPcopy(surface.data(), static_cast<int32>(line), surface.data(),
@@ -448,7 +450,8 @@ TEST(RasterOperations, stepsOfWholePixels) {
 TEST(RectROPcopy, orderWithinPixels) {
     const std::array<uint8, 4> before = {0x11, 0x22, 0x33, 0x44};
     std::array<uint8, 4> memory = before;
-    Raster_RectROPcopy(&memory[1], 3, &memory[0], 3, 3, 0, 0, RASTER_ROP_COPY_INVERTED, 0, 0, 1, 1);
+    Raster_RectROPcopy(&memory[1], 3, memory.data(), 3, 3, 0, 0, RASTER_ROP_COPY_INVERTED, 0, 0, 1,
+                       1);
     EXPECT_EQ(memory, (std::array<uint8, 4>{0x11, 0xEE, 0x11, 0xEE}));
     std::array<uint8, 8> wide = {0, 0, 0, 0x11, 0x22, 0x33, 0x44};
     Raster_RectROPcopy(&wide[1], 8, &wide[3], 8, 3, 0, 0, RASTER_ROP_COPY_INVERTED, 1, 0, 1, 1);
