@@ -1,0 +1,150 @@
+// Mouse cursors, with masks and with alpha.
+#include "rooms.h"
+#include "sheet.h"
+
+#include <algorithm>
+#include <array>
+#include <cstdlib>
+#include <memory>
+#include <string_view>
+#include <vector>
+
+namespace gallery {
+
+namespace {
+
+// '#' is black, '.' white, 'x' inverts, and a space leaves the screen alone.
+constexpr std::string_view kArrow[] = {
+    "#           ", "##          ", "#.#         ", "#..#        ", "#...#       ", "#....#      ",
+    "#.....#     ", "#......#    ", "#.......#   ", "#........#  ", "#.....##### ", "#..#..#     ",
+    "#.# #..#    ", "##  #..#    ", "#    #..#   ", "     #..#   ", "      ##    "};
+constexpr std::string_view kBeam[] = {"xxxx xxxx", "    x    ", "    x    ", "    x    ",
+                                      "    x    ", "    x    ", "    x    ", "    x    ",
+                                      "    x    ", "    x    ", "    x    ", "    x    ",
+                                      "    x    ", "    x    ", "    x    ", "xxxx xxxx"};
+
+// A cursor together with the pixels its record points to.
+struct Cursor {
+    RasterCursor record = {};
+    std::vector<uint8> images;
+};
+
+// From its two planes of one bit a pixel, as a host would hand it over.
+template <size_t height>
+Cursor maskCursor(const std::string_view (&rows)[height], uint32 hotspot) {
+    const auto width = static_cast<uint32>(rows[0].size());
+    const uint32 planeSize = Raster_CalculateCursorSize(width, height, 1);
+    const size_t step = planeSize / height;
+    std::vector<uint8> andPlane(planeSize), xorPlane(planeSize);
+    for (size_t y = 0; y < height; ++y)
+        for (size_t x = 0; x < width; ++x) {
+            const char c = rows[y][x];
+            const auto bit = static_cast<uint8>(0x80 >> x % 8);
+            const size_t at = y * step + x / 8;
+            andPlane[at] |= c == ' ' || c == 'x' ? bit : uint8{0};
+            xorPlane[at] |= c == '.' || c == 'x' ? bit : uint8{0};
+        }
+
+    const uint32 imageSize = Raster_CalculateCursorSize(width, height, 32);
+    Cursor cursor;
+    cursor.images.resize(size_t{imageSize} * 2);
+    Raster_ExpandPlanarCursorData(width, height, 1, andPlane.data(), 1, xorPlane.data(), 32,
+                                  cursor.images.data(), imageSize * 2);
+    RasterCursor &record = cursor.record;
+    record.type = RASTER_CURSOR_ANDXOR;
+    record.hotspotX = record.hotspotY = hotspot;
+    record.width = width;
+    record.height = height;
+    record.andImage = cursor.images.data();
+    record.xorImage = record.andImage + imageSize;
+    return cursor;
+}
+
+// The picture must outlive the record.
+RasterCursor alphaCursor(const Picture &image) {
+    RasterCursor record = {};
+    record.type = RASTER_CURSOR_ALPHA;
+    record.hotspotX = image.info().width / 2;
+    record.hotspotY = image.info().height / 2;
+    record.width = image.info().width;
+    record.height = image.info().height;
+    record.alphaImage = image.data();
+    return record;
+}
+
+void draw(Picture &screen, const RasterCursor &cursor, int32 x, int32 y) {
+    const RasterCursorScreen size = {screen.info().width, screen.info().height};
+    RasterCursorBox box;
+    if (Raster_ComputeCursorBox(&size, &cursor, x, y, &box))
+        Raster_DrawCursor(screen.data(), screen.step(), nullptr, 0, &cursor, &box);
+}
+
+void drawScaled(Picture &screen, const RasterCursor &cursor, int32 x, int32 y, double scale) {
+    const std::unique_ptr<RasterCursor, void (*)(RasterCursor *)> large(
+        Raster_ScaleCursor(&cursor, scale, scale), [](RasterCursor *scaled) {
+            if (!scaled)
+                return;
+            if (scaled->type == RASTER_CURSOR_ALPHA) {
+                std::free(scaled->alphaImage);
+            } else {
+                std::free(scaled->andImage);
+                std::free(scaled->xorImage);
+            }
+            std::free(scaled);
+        });
+    if (!large)
+        fail("no memory");
+    draw(screen, *large, x, y);
+}
+
+} // namespace
+
+void showCursors(Page &page, const Material &material) {
+    page.room("Cursors", "Two masks, or one image with alpha, drawn where the pointer is.");
+    const Cursor arrow = maskCursor(kArrow, 0);
+    const Cursor beam = maskCursor(kBeam, 4);
+    const Picture marble = resized(material.sprite, 32, 32);
+    const RasterCursor ball = alphaCursor(marble);
+
+    const Picture screen = covering(material.photo, 86, 57);
+    std::array<Picture, 4> screens;
+    std::generate(screens.begin(), screens.end(), [&screen] { return copyOf(screen); });
+    for (const int32 x : {10, 36, 62})
+        draw(screens[0], arrow.record, x, 18);
+    for (const int32 x : {16, 42, 68})
+        draw(screens[1], beam.record, x, 24);
+    draw(screens[2], ball, 26, 30);
+    draw(screens[2], ball, 60, 30);
+    for (const int32 x : {0, 43, 85})
+        for (const int32 y : {0, 28, 56})
+            draw(screens[3], x == 43 && y == 28 ? arrow.record : ball, x, y);
+
+    Sheet sheet(2);
+    const char *labels[] = {"masks: black, white, clear", "masks: inverting", "alpha",
+                            "cut at the edges of the screen"};
+    for (size_t i = 0; i < screens.size(); ++i)
+        sheet.add(zoomed(screens[i], 4), labels[i]);
+    page.show(sheet.drawn(), "cursors",
+              "`Raster_ExpandPlanarCursorData` makes masks of planes of one bit a pixel, "
+              "`Raster_ComputeCursorBox` cuts a cursor to the screen, `Raster_DrawCursor` draws "
+              "it. Pixels are shown four times their size.");
+
+    Sheet scaled(1);
+    for (const bool alpha : {false, true}) {
+        Picture wide = covering(material.photo, 704, 170);
+        int32 x = 40;
+        for (const double scale : {0.5, 1.0, 2.0, 3.0, 4.5}) {
+            const int32 half = static_cast<int32>(16 * scale);
+            drawScaled(wide, alpha ? ball : arrow.record, x + (alpha ? half : 0), alpha ? 84 : 60,
+                       scale);
+            x += half * 2 + 50;
+        }
+        scaled.add(std::move(wide), alpha ? "alpha: 0.5, 1, 2, 3 and 4.5 times, filtered"
+                                          : "masks: 0.5, 1, 2, 3 and 4.5 times, nearest");
+    }
+    page.show(scaled.drawn(), "cursors-scaled",
+              "`Raster_ScaleCursor`: a mask knows no half tones and shows its pixels, an image "
+              "with alpha stays smooth.");
+}
+
+} // namespace gallery

@@ -1,0 +1,146 @@
+// Fills, copies and raster operations.
+#include "rooms.h"
+#include "sheet.h"
+
+#include <array>
+#include <vector>
+
+namespace gallery {
+
+namespace {
+
+constexpr std::array<uint32, 8> kRings = {0xFF1B4965, 0xFF2F6690, 0xFF5FA8D3, 0xFFBEE9E8,
+                                          0xFFFFF3B0, 0xFFF6BD60, 0xFFE8590C, 0xFF9E2A2B};
+
+// Squares within squares, filled in pixels of the given layout; depth 8 stands
+// for indices into kRings.
+Picture filledRings(int32 depth) {
+    constexpr int32 kSize = 160, kRing = 10;
+    const bool indices = depth == 8;
+    const int32 bytes = (depth + 7) / 8, step = kSize * bytes;
+    std::vector<uint8> surface(size_t{kSize} * static_cast<size_t>(step));
+    for (uint32 ring = 0; ring < kRings.size(); ++ring) {
+        const uint32 colour = kRings[ring];
+        const uint32 pixel =
+            indices ? ring : Raster_ConvertOnePixel(colour, 32, depth, false, nullptr);
+        const uint32 inset = ring * kRing;
+        Raster_RectFill(surface.data(), step, bytes, pixel, inset, inset, kSize - 2 * inset,
+                        kSize - 2 * inset);
+    }
+    Picture shown = blank(kSize, kSize, 0);
+    Raster_ConvertPixelsTo32(shown.data(), shown.step(), surface.data(), step, depth, indices,
+                             kRings.data(), 0, 0, 0, 0, kSize, kSize);
+    return shown;
+}
+
+struct Operation {
+    const char *name, *formula;
+};
+constexpr std::array<Operation, 16> kOperations = {{{"CLEAR", "0"},
+                                                    {"AND", "S & D"},
+                                                    {"AND_REVERSE", "S & ~D"},
+                                                    {"COPY", "S"},
+                                                    {"AND_INVERTED", "~S & D"},
+                                                    {"NOOP", "D"},
+                                                    {"XOR", "S ^ D"},
+                                                    {"OR", "S | D"},
+                                                    {"NOR", "~(S | D)"},
+                                                    {"EQUIV", "~(S ^ D)"},
+                                                    {"INVERT", "~D"},
+                                                    {"OR_REVERSE", "S | ~D"},
+                                                    {"COPY_INVERTED", "~S"},
+                                                    {"OR_INVERTED", "~S | D"},
+                                                    {"NAND", "~(S & D)"},
+                                                    {"SET", "1"}}};
+
+std::string labelOf(uint32 rop) {
+    return std::to_string(rop) + " " + kOperations[rop].name + "\n   " + kOperations[rop].formula;
+}
+
+constexpr int32 kTileWidth = 168, kTileHeight = 112;
+
+Picture againstConstant(const Picture &photo, uint32 rop) {
+    Picture picture = covering(photo, kTileWidth, kTileHeight);
+    Raster_RectROPfill(picture.data(), picture.step(), 4, kOrange, rop, 28, 20, kTileWidth - 56,
+                       kTileHeight - 40);
+    return picture;
+}
+
+// A disc on a surface of one byte a pixel, row by row.
+std::vector<uint8> disc(int32 centreX) {
+    constexpr int32 kRadius = 40, kCentreY = kTileHeight / 2;
+    std::vector<uint8> surface(size_t{kTileWidth} * kTileHeight);
+    for (int32 y = -kRadius; y <= kRadius; ++y) {
+        int32 half = 0;
+        while ((half + 1) * (half + 1) + y * y <= kRadius * kRadius)
+            ++half;
+        Raster_RectFill(surface.data(), kTileWidth, 1, 0xFF, centreX - half, kCentreY + y,
+                        2 * half + 1, 1);
+    }
+    return surface;
+}
+
+Picture betweenDiscs(uint32 rop) {
+    const std::vector<uint8> source = disc(62);
+    std::vector<uint8> surface = disc(106);
+    Raster_RectROPcopy(surface.data(), kTileWidth, source.data(), kTileWidth, 1, 0, 0, rop, 0, 0,
+                       kTileWidth, kTileHeight);
+    std::vector<uint32> palette(256);
+    palette[0x00] = kPale;
+    palette[0xFF] = kBlue;
+    Picture shown = blank(kTileWidth, kTileHeight, 0);
+    Raster_ConvertIndexTo32(shown.data(), shown.step(), surface.data(), kTileWidth, palette.data(),
+                            0, 0, 0, 0, kTileWidth, kTileHeight);
+    return shown;
+}
+
+} // namespace
+
+void showFills(Page &page, const Material &material) {
+    page.room("Fills and copies", "Rectangles of one value, and rectangles moved.");
+
+    Sheet fills(4);
+    for (const int32 depth : {8, 16, 24, 32}) {
+        const int32 bytes = depth / 8;
+        fills.add(filledRings(depth),
+                  std::to_string(bytes) + (bytes == 1 ? " byte a pixel" : " bytes a pixel"));
+    }
+    page.show(fills.drawn(), "fill",
+              "`Raster_RectFill`: eight squares, each filled over the last, in pixels of each "
+              "size. They look the same, but for the shades that 16 bits cannot tell apart.");
+
+    constexpr int32 kWidth = 344, kHeight = 228;
+    const Rect from = area(150, 66, 150, 110), to = area(90, 30, 150, 110);
+    Picture before = covering(material.photo, kWidth, kHeight);
+    Picture after = copyOf(before);
+    outline(before, from, kOrange, 2);
+    Raster_RectCopy(after.data(), after.step(), after.data(), after.step(), 4, from.left, from.top,
+                    to.left, to.top, 150, 110);
+    outline(after, to, kOrange, 2);
+    Sheet copies(2);
+    copies.add(std::move(before), "what is copied");
+    copies.add(std::move(after), "where it went");
+    page.show(copies.drawn(), "copy",
+              "`Raster_RectCopy` within one surface. The two places overlap, and the copy is whole "
+              "all the same: nothing of it repeats.");
+}
+
+void showRasterOperations(Page &page, const Material &material) {
+    page.room("Raster operations",
+              "The sixteen ways to combine a source S with what the destination D holds, bit by "
+              "bit. The number of each is its truth table.");
+    Sheet constants(4);
+    Sheet discs(4);
+    for (uint32 rop = 0; rop < kOperations.size(); ++rop) {
+        constants.add(againstConstant(material.photo, rop), labelOf(rop));
+        discs.add(betweenDiscs(rop), labelOf(rop));
+    }
+    page.show(discs.drawn(), "rop-surfaces",
+              "`Raster_RectROPcopy` between two surfaces of one byte a pixel: S is the left disc, "
+              "D the right one. Dark is 1, so each tile is the diagram of its formula.");
+    page.show(constants.drawn(), "rop-constant",
+              "`Raster_RectROPfill`: S is an orange, D the picture; the middle of each tile is "
+              "combined, the rim left as it was.");
+}
+
+} // namespace gallery

@@ -1,0 +1,101 @@
+// Rectangle lists: a region grows and shrinks.
+#include "rooms.h"
+#include "sheet.h"
+
+namespace gallery {
+
+namespace {
+
+constexpr int32 kWidth = 168, kHeight = 128;
+
+// The entries of a list, and the rectangle that was last added or cut.
+Picture drawn(const RasterRectList &list, const Rect &last, uint32 colour) {
+    Picture picture = blank(kWidth, kHeight, kPale);
+    for (const RasterRectListEntry &entry : list.entries) {
+        if (entry.width < 1)
+            break;
+        const Rect part = area(entry.x, entry.y, entry.width, entry.height);
+        fill(picture, part, 0xFF9CC5DC);
+        outline(picture, part, kBlue);
+    }
+    outline(picture, last, colour, 2);
+    return picture;
+}
+
+std::string countOf(const RasterRectList &list) {
+    int count = 0;
+    for (const RasterRectListEntry &entry : list.entries)
+        count += entry.width > 0;
+    return std::to_string(count) + (count == 1 ? " entry, " : " entries, ");
+}
+
+// One region, and a tile for each of its steps.
+class Story {
+public:
+    explicit Story(Sheet &sheetToFill) : sheet(sheetToFill) {}
+    void add(int32 x, int32 y, int32 width, int32 height) {
+        const uint32 pixels = Raster_AddRect(&list, x, y, width, height);
+        tell("added: ", pixels, area(x, y, width, height), kOrange);
+    }
+    void cut(int32 x, int32 y, int32 width, int32 height) {
+        const uint32 pixels = Raster_SubRect(&list, x, y, width, height);
+        tell("cut: ", pixels, area(x, y, width, height), kInk);
+    }
+    // Squares without a tile of their own.
+    void scatter(int32 count) {
+        Raster_ClearRectList(&list);
+        for (int32 i = 0; i < count; ++i)
+            Raster_AddRect(&list, 8 + i % 5 * 32, 8 + i / 5 * 32 + i % 2 * 6, 20, 20);
+    }
+
+private:
+    void tell(const char *what, uint32 pixels, const Rect &last, uint32 colour) {
+        sheet.add(drawn(list, last, colour),
+                  what + countOf(list) + "\n" + std::to_string(pixels) + " pixels");
+    }
+
+    Sheet &sheet;
+    RasterRectList list = {};
+};
+
+} // namespace
+
+void showRegions(Page &page) {
+    page.room("Regions", "A list of at most 15 rectangles stands for a set of pixels.");
+    Sheet sheet(4);
+    Story story(sheet);
+    story.add(16, 16, 80, 56);
+    story.add(64, 44, 88, 64);
+    story.add(96, 16, 40, 28);
+    story.cut(36, 34, 80, 44);
+    story.cut(0, 92, 168, 8);
+    story.add(36, 34, 80, 44);
+    story.scatter(14);
+    story.add(136, 72, 20, 20);
+    story.add(8, 104, 20, 20);
+    page.show(sheet.drawn(), "regions",
+              "`Raster_AddRect` and `Raster_SubRect`. Each entry is outlined in blue, the "
+              "rectangle just added in orange, the one just cut in black. Entries never overlap, "
+              "and those that could be one are one. The last step would take a sixteenth entry, so "
+              "the region becomes the box around it.");
+
+    // Which part of a source is seen in a clip, and where that goes in a target.
+    const Rect source = area(20, 20, 96, 72), clip = area(72, 48, 80, 64);
+    const Rect target = area(24, 12, 120, 104);
+    Rect seen, goes;
+    Rect_IntersectPair(&seen, &source, &clip, &goes, &target);
+    Picture left = blank(kWidth, kHeight, kPale), right = blank(kWidth, kHeight, kPale);
+    fill(left, seen, 0xFF9CC5DC);
+    outline(left, source, kBlue);
+    outline(left, clip, kOrange, 2);
+    fill(right, goes, 0xFF9CC5DC);
+    outline(right, target, kBlue);
+    Sheet mapping(2);
+    mapping.add(std::move(left), "source, cut by a clip");
+    mapping.add(std::move(right), "the same part of target");
+    page.show(mapping.drawn(), "rectangles",
+              "`Rect_IntersectPair`: as much of the source (blue) as the clip (orange) leaves, and "
+              "where it lies in the target.");
+}
+
+} // namespace gallery

@@ -1,0 +1,33 @@
+// Pictures side by side, with a label under each.
+#ifndef GALLERY_SHEET_H
+#define GALLERY_SHEET_H
+
+#include "picture.h"
+
+#include <string>
+#include <vector>
+
+namespace gallery {
+
+class Sheet {
+public:
+    explicit Sheet(size_t columns) : columnCount(columns) {}
+    // A label may have several lines.
+    void add(Picture picture, const std::string &label);
+    Picture drawn() const;
+
+private:
+    struct Tile {
+        Picture picture;
+        std::vector<std::string> label;
+
+        int32 width() const;
+        int32 height() const;
+    };
+    size_t columnCount;
+    std::vector<Tile> tiles;
+};
+
+} // namespace gallery
+
+#endif // GALLERY_SHEET_H
