@@ -111,13 +111,16 @@ void showCursors(Page &page, const Material &material) {
     std::generate(screens.begin(), screens.end(), [&screen] { return copyOf(screen); });
     for (const int32 x : {10, 36, 62})
         draw(screens[0], arrow.record, x, 18);
-    for (const int32 x : {16, 42, 68})
+    fill(screens[1], area(13, 14, 30, 30), kInk);
+    fill(screens[1], area(43, 14, 30, 30), kWhite);
+    for (const int32 x : {5, 24, 43, 62, 81})
         draw(screens[1], beam.record, x, 24);
     draw(screens[2], ball, 26, 30);
     draw(screens[2], ball, 60, 30);
     for (const int32 x : {0, 43, 85})
         for (const int32 y : {0, 28, 56})
-            draw(screens[3], x == 43 && y == 28 ? arrow.record : ball, x, y);
+            if (x != 43 || y != 28)
+                draw(screens[3], ball, x, y);
 
     Sheet sheet(2);
     const char *labels[] = {"masks: black, white, clear", "masks: inverting", "alpha",

@@ -107,7 +107,7 @@ void showFills(Page &page, const Material &material) {
     }
     page.show(fills.drawn(), "fill",
               "`Raster_RectFill`: eight squares, each filled over the last, in pixels of each "
-              "size. They look the same, but for the shades that 16 bits cannot tell apart.");
+              "size. They look the same, but for shades that 16 bits cannot hold.");
 
     constexpr int32 kWidth = 344, kHeight = 228;
     const Rect from = area(150, 66, 150, 110), to = area(90, 30, 150, 110);

@@ -160,10 +160,11 @@ void showFiles(Page &page, const Material &material) {
     page.link(filtered, "enlarged-filtered.png");
 
     ContactSheet sheet;
-    for (const Picture &picture : thumbnails)
-        sheet.add(picture);
-    sheet.newRow();
+    sheet.add(thumbnails[0]);
     sheet.add(crop);
+    sheet.newRow();
+    for (size_t i = 1; i < thumbnails.size(); ++i)
+        sheet.add(thumbnails[i]);
     sheet.newRow();
     sheet.add(nearest);
     sheet.add(filtered);

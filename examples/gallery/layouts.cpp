@@ -86,6 +86,8 @@ Picture chart(const Picture &photo) {
 }
 
 std::string hexOf(uint32 value, int32 bytes) {
+    // The top byte of 32 bits goes along to 24, where it is not stored.
+    value &= 0xFFFFFFFF >> (32 - bytes * 8);
     std::array<char, 16> text{};
     std::snprintf(text.data(), text.size(), "0x%0*X", bytes * 2, value);
     return text.data();
@@ -98,6 +100,7 @@ void showLayouts(Page &page, const Material &material) {
                                "has been through each.");
     const Picture original = chart(material.photo);
     Sheet sheet(4);
+    sheet.add(copyOf(original), "the picture itself");
     for (const Layout &layout : kLayouts) {
         const uint32 orange = Raster_ConvertOnePixel(kOrange, 32, layout.depth, false, nullptr);
         sheet.add(throughLayout(original, layout), "depth " + std::to_string(layout.depth) + "\n" +

@@ -16,7 +16,7 @@ constexpr const char *kHead = R"(<!DOCTYPE html>
 * { box-sizing: border-box }
 body { margin: 0; background: #f3f5f7; color: var(--ink);
        font: 16px/1.55 system-ui, -apple-system, "Segoe UI", sans-serif }
-main { max-width: 60rem; margin: 0 auto; padding: 2.5rem 1.25rem 4rem }
+main { max-width: 52rem; margin: 0 auto; padding: 2.5rem 1.25rem 4rem }
 h1 { margin: 0; font-size: 2rem; line-height: 1.2 }
 h2 { margin: 3.5rem 0 .25rem; font-size: 1.4rem; scroll-margin-top: 1rem }
 p { margin: .25rem 0 1rem; max-width: 46rem }
@@ -74,7 +74,7 @@ void Page::show(const Picture &picture, const std::string &name, const std::stri
     // read; then it can be scrolled.
     const std::string size = " width=\"" + std::to_string(picture.width()) + "\" height=\"" +
                              std::to_string(picture.height()) + "\" style=\"min-width: min(" +
-                             std::to_string(picture.width()) + "px, 32rem)\"";
+                             std::to_string(picture.width()) + "px, 40rem)\"";
     body += "<figure><a href=\"" + fileName + "\"><img src=\"" + fileName + "\" alt=\"" + name +
             "\"" + size + "></a>\n<figcaption>" + markup(caption) + "</figcaption></figure>\n";
 }

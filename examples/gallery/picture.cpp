@@ -75,7 +75,7 @@ Picture read(const std::string &fileName) {
         fail(fileName + " cannot be read as a PNG (grey ones are not supported)");
     constexpr uint32 kLargest = 32767;
     if (info.width > kLargest || info.height > kLargest)
-        fail(fileName + " is too large: sides of 32767 pixels are what scaling takes");
+        fail(fileName + " is too large: no side may have more than 32767 pixels");
     if (info.bpp == 32)
         return file;
 
@@ -194,7 +194,9 @@ Picture covering(const Picture &source, int32 width, int32 height) {
     const int64_t high = int64_t{source.width()} * height / width;
     const Rect part = subject(source, static_cast<int32>(std::clamp<int64_t>(wide, 1, 32767)),
                               static_cast<int32>(std::clamp<int64_t>(high, 1, 32767)));
-    return resized(partOf(source, part), width, height);
+    // A reduction leaves the last column of its source out, and so darkens the last
+    // one of its result: one more is made, and cut off.
+    return partOf(resized(partOf(source, part), width + 1, height), area(0, 0, width, height));
 }
 
 } // namespace gallery

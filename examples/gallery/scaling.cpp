@@ -39,7 +39,7 @@ Picture spokes(int32 size) {
 // and enlarged again so that its pixels can be seen.
 void addReductions(Sheet &sheet, const Picture &source, int32 width, int32 height) {
     constexpr int32 kZoom = 4;
-    sheet.add(resized(source, width, height), "for comparison");
+    sheet.add(covering(source, width, height), "for comparison");
     for (const Filter filter : {kNearest, kFiltered})
         sheet.add(zoomed(scaled(source, width / kZoom, height / kZoom, filter), kZoom),
                   std::to_string(source.width()) + " to " + std::to_string(width / kZoom) +
@@ -83,7 +83,9 @@ void showScaling(Page &page, const Material &material) {
     addReductions(down, covering(material.photo, 896, 608), 224, 152);
     page.show(down.drawn(), "scale-down",
               "Reduced, and shown with each pixel as a square. Nearest samples invent patterns "
-              "where the spokes are finer than the pixels; averages turn them grey.");
+              "where the spokes are finer than the pixels; averages turn them grey. The column at "
+              "the right edge "
+              "is darker, as a reduction leaves the last one of the source out of its averages.");
 }
 
 } // namespace gallery

@@ -48,7 +48,7 @@ void showText(Page &page, const Material &material) {
                           stencil(picture, x + 1, y + 1, " Sphinx of quartz ", kInk);
                           stencil(picture, x, y, " Sphinx of quartz ", kWhite);
                       }),
-             "as a stencil, twice: a shadow, then the letters");
+             "a stencil, over its own shadow");
     page.show(ways.drawn(), "text-ways",
               "`Raster_BitsToPixels` writes ink and paper; `Raster_BitsToPixelsStencil` writes the "
               "ink alone, and the picture stays between the letters.");
