@@ -28,7 +28,7 @@ template <size_t kWords>
 HWY_ALIGN constexpr uint32_t kPackWords[kWords] = {0,  1,  2,  4,  5, 6, 8,  9,
                                                    10, 12, 13, 14, 3, 7, 11, 15};
 template <>
-HWY_ALIGN constexpr uint32_t kPackWords<8>[8] = {0, 1, 2, 4, 5, 6, 3, 7};
+HWY_ALIGN inline constexpr uint32_t kPackWords<8>[8] = {0, 1, 2, 4, 5, 6, 3, 7};
 
 // Exactly three bytes a pixel are read: half a vector, and a quarter.
 template <class D>
