@@ -15,9 +15,8 @@ foreach(library IN ITEMS hearth quillon)
     install(EXPORT ${library}Targets NAMESPACE ${library}:: DESTINATION ${packageDir})
 endforeach()
 
-install(FILES include/quillonTypes.h include/raster.h include/rasterCursor.h include/rect.h
-    include/imageUtil.h hearth/hearth.h
-    DESTINATION ${CMAKE_INSTALL_INCLUDEDIR}/quillon-1)
+install(DIRECTORY include/ DESTINATION ${CMAKE_INSTALL_INCLUDEDIR}/quillon-1)
+install(FILES hearth/hearth.h DESTINATION ${CMAKE_INSTALL_INCLUDEDIR}/quillon-1)
 
 write_basic_package_version_file(${PROJECT_BINARY_DIR}/quillonConfigVersion.cmake
     COMPATIBILITY SameMajorVersion)

@@ -28,8 +28,8 @@ Picture filledRings(int32 depth) {
                         kSize - 2 * inset);
     }
     Picture shown = blank(kSize, kSize, 0);
-    Raster_ConvertPixelsTo32(shown.data(), shown.step(), surface.data(), step, depth, indices,
-                             kRings.data(), 0, 0, 0, 0, kSize, kSize);
+    Raster_ConvertPixelsTo32(shown.data(), shown.info().bytesPerLine, surface.data(), natural(step),
+                             depth, indices, kRings.data(), 0, 0, 0, 0, kSize, kSize);
     return shown;
 }
 
@@ -74,8 +74,8 @@ std::vector<uint8> disc(int32 centreX) {
         int32 half = 0;
         while ((half + 1) * (half + 1) + y * y <= kRadius * kRadius)
             ++half;
-        Raster_RectFill(surface.data(), kTileWidth, 1, 0xFF, centreX - half, kCentreY + y,
-                        2 * half + 1, 1);
+        Raster_RectFill(surface.data(), kTileWidth, 1, 0xFF, natural(centreX - half),
+                        natural(kCentreY + y), natural(2 * half + 1), 1);
     }
     return surface;
 }
@@ -89,8 +89,8 @@ Picture betweenDiscs(uint32 rop) {
     palette[0x00] = kPale;
     palette[0xFF] = kBlue;
     Picture shown = blank(kTileWidth, kTileHeight, 0);
-    Raster_ConvertIndexTo32(shown.data(), shown.step(), surface.data(), kTileWidth, palette.data(),
-                            0, 0, 0, 0, kTileWidth, kTileHeight);
+    Raster_ConvertIndexTo32(shown.data(), shown.info().bytesPerLine, surface.data(), kTileWidth,
+                            palette.data(), 0, 0, 0, 0, kTileWidth, kTileHeight);
     return shown;
 }
 
@@ -114,8 +114,8 @@ void showFills(Page &page, const Material &material) {
     Picture before = covering(material.photo, kWidth, kHeight);
     Picture after = copyOf(before);
     outline(before, from, kOrange, 2);
-    Raster_RectCopy(after.data(), after.step(), after.data(), after.step(), 4, from.left, from.top,
-                    to.left, to.top, 150, 110);
+    Raster_RectCopy(after.data(), after.step(), after.data(), after.step(), 4, natural(from.left),
+                    natural(from.top), natural(to.left), natural(to.top), 150, 110);
     outline(after, to, kOrange, 2);
     Sheet copies(2);
     copies.add(std::move(before), "what is copied");

@@ -18,8 +18,8 @@ Picture withoutAlpha(const Picture &picture) {
     info.data = static_cast<uint8 *>(std::malloc(size_t{info.bytesPerLine} * info.height));
     if (!info.data)
         fail("no memory");
-    Raster_ConvertPixelsFrom32(info.data, info.bytesPerLine, 24, picture.data(), picture.step(), 0,
-                               0, 0, 0, info.width, info.height);
+    Raster_ConvertPixelsFrom32(info.data, info.bytesPerLine, 24, picture.data(),
+                               picture.info().bytesPerLine, 0, 0, 0, 0, info.width, info.height);
     return Picture(info);
 }
 
@@ -60,8 +60,9 @@ void addCombined(Sheet &sheet, const Picture &photo, int32 gap, const std::strin
         return;
     }
     Picture shown = blank(result.width(), result.height(), 0);
-    Raster_ConvertPixelsTo32(shown.data(), shown.step(), result.data(), result.step(), 24, false,
-                             nullptr, 0, 0, 0, 0, combined.width, combined.height);
+    Raster_ConvertPixelsTo32(shown.data(), shown.info().bytesPerLine, result.data(),
+                             combined.bytesPerLine, 24, false, nullptr, 0, 0, 0, 0, combined.width,
+                             combined.height);
     sheet.add(std::move(shown), label + ": " + bits);
 }
 
@@ -75,9 +76,11 @@ Picture cutAndScaled(const Picture &photo, const Rect &part, int32 width, int32 
 
 // Scaled to a longest side.
 Picture thumbnail(const Picture &photo, int32 side) {
-    const int64_t longest = std::max(photo.width(), photo.height());
-    return resized(photo, std::max(1, static_cast<int32>(photo.width() * side / longest)),
-                   std::max(1, static_cast<int32>(photo.height() * side / longest)));
+    const int32 longest = std::max(photo.width(), photo.height());
+    const auto scaled = [side, longest](int32 extent) {
+        return std::max(1, extent * side / longest);
+    };
+    return resized(photo, scaled(photo.width()), scaled(photo.height()));
 }
 
 // Rows of pictures on one sheet, with gaps between them.

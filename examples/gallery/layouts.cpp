@@ -56,16 +56,16 @@ Picture throughLayout(const Picture &picture, const Layout &layout) {
     const uint32 width = picture.info().width, height = picture.info().height;
     const uint32 step = width * static_cast<uint32>(layout.bytes);
     std::vector<uint8> surface(size_t{step} * height);
-    Raster_ConvertPixelsFrom32(surface.data(), step, layout.depth, picture.data(), picture.step(),
-                               0, 0, 0, 0, width, height);
+    Raster_ConvertPixelsFrom32(surface.data(), step, layout.depth, picture.data(),
+                               picture.info().bytesPerLine, 0, 0, 0, 0, width, height);
 
     const bool indices = layout.bytes == 1;
     std::vector<uint32> palette;
     if (indices)
         palette = paletteOf(layout.depth);
     Picture back = blank(picture.width(), picture.height(), 0);
-    Raster_ConvertPixelsTo32(back.data(), back.step(), surface.data(), step, layout.depth, indices,
-                             palette.data(), 0, 0, 0, 0, width, height);
+    Raster_ConvertPixelsTo32(back.data(), back.info().bytesPerLine, surface.data(), step,
+                             layout.depth, indices, palette.data(), 0, 0, 0, 0, width, height);
     return back;
 }
 

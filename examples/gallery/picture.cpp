@@ -93,8 +93,8 @@ Picture read(const std::string &fileName) {
 
 void fill(Picture &ground, const Rect &part, uint32 colour) {
     checkInside(ground, part.left, part.top, widthOf(part), heightOf(part));
-    Raster_RectFill(ground.data(), ground.step(), 4, colour, part.left, part.top, widthOf(part),
-                    heightOf(part));
+    Raster_RectFill(ground.data(), ground.step(), 4, colour, natural(part.left), natural(part.top),
+                    natural(widthOf(part)), natural(heightOf(part)));
 }
 
 void outline(Picture &ground, const Rect &part, uint32 colour, int32 thickness) {
@@ -106,14 +106,14 @@ void outline(Picture &ground, const Rect &part, uint32 colour, int32 thickness) 
 
 void paste(Picture &ground, const Picture &top, int32 x, int32 y) {
     checkInside(ground, x, y, top.width(), top.height());
-    Raster_RectCopy(ground.data(), ground.step(), top.data(), top.step(), 4, 0, 0, x, y,
-                    top.width(), top.height());
+    Raster_RectCopy(ground.data(), ground.step(), top.data(), top.step(), 4, 0, 0, natural(x),
+                    natural(y), top.info().width, top.info().height);
 }
 
 void blend(Picture &ground, const Picture &top, int32 x, int32 y) {
     checkInside(ground, x, y, top.width(), top.height());
-    Raster_AlphaBlendOver(ground.data(), x, y, ground.step(), top.data(), 0, 0, top.step(),
-                          top.width(), top.height());
+    Raster_AlphaBlendOver(ground.data(), natural(x), natural(y), ground.step(), top.data(), 0, 0,
+                          top.step(), top.info().width, top.info().height);
 }
 
 Picture premultiplied(const Picture &picture) {
@@ -154,8 +154,9 @@ Picture copyOf(const Picture &source) {
 Picture partOf(const Picture &source, const Rect &part) {
     checkInside(source, part.left, part.top, widthOf(part), heightOf(part));
     Picture result = blank(widthOf(part), heightOf(part), 0);
-    Raster_RectCopy(result.data(), result.step(), source.data(), source.step(), 4, part.left,
-                    part.top, 0, 0, widthOf(part), heightOf(part));
+    Raster_RectCopy(result.data(), result.step(), source.data(), source.step(), 4,
+                    natural(part.left), natural(part.top), 0, 0, result.info().width,
+                    result.info().height);
     return result;
 }
 

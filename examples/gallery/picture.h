@@ -46,6 +46,12 @@ private:
     ImageInfo image = {};
 };
 
+// Positions and sizes are signed here, so that one can calculate with them; most
+// of the library takes them unsigned.
+constexpr uint32 natural(int32 value) {
+    return static_cast<uint32>(value);
+}
+
 // The rectangle of a corner and a size.
 Rect area(int32 x, int32 y, int32 width, int32 height);
 

@@ -12,9 +12,11 @@ enum Filter : uint32 { kNearest = 0, kFiltered = 1 };
 
 Picture scaled(const Picture &source, int32 width, int32 height, Filter filter) {
     Picture result = blank(width, height, 0);
-    if (!Raster_Scale(result.data(), result.step(), result.info().width, result.info().height, 0, 0,
-                      width, height, source.data(), source.step(), source.info().width,
-                      source.info().height, static_cast<double>(width) / source.width(),
+    const Rect all = result.bounds();
+    if (!Raster_Scale(result.data(), result.step(), result.info().width, result.info().height,
+                      all.left, all.top, all.right, all.bottom, source.data(), source.step(),
+                      source.info().width, source.info().height,
+                      static_cast<double>(width) / source.width(),
                       static_cast<double>(height) / source.height(), filter))
         fail("a picture cannot be scaled");
     return result;
@@ -28,15 +30,14 @@ Picture spokes(int32 size) {
     for (int32 y = 0; y < size; ++y)
         for (int32 x = 0; x < size; ++x) {
             const double dx = x - middle, dy = y - middle;
-            const double radius = std::hypot(dx, dy);
-            if (radius < middle && std::sin(std::atan2(dy, dx) * 36) > 0)
+            if (std::hypot(dx, dy) < middle && std::sin(std::atan2(dy, dx) * 36) > 0)
                 fill(picture, area(x, y, 1, 1), kInk);
         }
     return picture;
 }
 
-// A large picture as it was, then reduced to a quarter of what is shown of it
-// and enlarged again so that its pixels can be seen.
+// A large picture as it was, then reduced to a quarter of the given size and
+// enlarged again so that its pixels can be seen.
 void addReductions(Sheet &sheet, const Picture &source, int32 width, int32 height) {
     constexpr int32 kZoom = 4;
     sheet.add(covering(source, width, height), "for comparison");
@@ -84,8 +85,8 @@ void showScaling(Page &page, const Material &material) {
     page.show(down.drawn(), "scale-down",
               "Reduced, and shown with each pixel as a square. Nearest samples invent patterns "
               "where the spokes are finer than the pixels; averages turn them grey. The column at "
-              "the right edge "
-              "is darker, as a reduction leaves the last one of the source out of its averages.");
+              "the right edge is darker, as a reduction leaves the last one of the source out of "
+              "its averages.");
 }
 
 } // namespace gallery

@@ -82,8 +82,8 @@ Picture converted(const Frame &frame, uint32 format, int32 depth) {
         std::memcpy(&pixels[i], &pixel, 2);
     }
     Picture picture = blank(kWidth, kHeight, 0);
-    Raster_ConvertPixelsTo32(picture.data(), picture.step(), pixels.data(), kWidth * bytes, depth,
-                             false, nullptr, 0, 0, 0, 0, kWidth, kHeight);
+    Raster_ConvertPixelsTo32(picture.data(), picture.info().bytesPerLine, pixels.data(),
+                             kWidth * bytes, depth, false, nullptr, 0, 0, 0, 0, kWidth, kHeight);
     return picture;
 }
 
@@ -164,7 +164,8 @@ void showColorKey(Page &page, const Material &material) {
     Picture result = copyOf(background);
     Raster_ApplyColorKey(background.data(), result.data(), film.data(), background.data(),
                          background.step(), result.step(), film.step(), background.step(),
-                         kKey & 0xFFFFFF, screen.left, screen.top, film.width(), film.height(), 32);
+                         kKey & 0xFFFFFF, natural(screen.left), natural(screen.top),
+                         film.info().width, film.info().height, 32);
     Sheet sheet(2);
     sheet.add(copyOf(background), "the desktop, with the key in magenta");
     sheet.add(std::move(result), "with the film in its place");
