@@ -143,7 +143,7 @@ void showImages(Page &page, const Material &material) {
 }
 
 void showFiles(Page &page, const Material &material) {
-    page.room("Files", "Your picture as plain files: thumbnails, a crop, a part enlarged, and a "
+    page.room("Files", "The picture as plain files: thumbnails, a crop, a part enlarged, and a "
                        "sheet of them, from `ImageUtil_WriteImage`.");
     const Picture &photo = material.photo;
     std::vector<Picture> thumbnails;

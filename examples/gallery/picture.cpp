@@ -44,10 +44,6 @@ std::vector<uint8> bitmapOf(std::string_view text) {
     return bits;
 }
 
-uint8 *pixelAt(const Picture &ground, int32 x, int32 y) {
-    return ground.data() + ptrdiff_t{y} * ground.step() + ptrdiff_t{x} * 4;
-}
-
 } // namespace
 
 Picture blank(int32 width, int32 height, uint32 colour) {
@@ -134,14 +130,14 @@ int32 textWidth(std::string_view text) {
 void write(Picture &ground, int32 x, int32 y, std::string_view text, uint32 ink, uint32 paper) {
     checkInside(ground, x, y, textWidth(text), kGlyphHeight);
     const auto step = static_cast<int32>(text.size());
-    Raster_BitsToPixels(bitmapOf(text).data(), step, pixelAt(ground, x, y), ground.step(), 4,
+    Raster_BitsToPixels(bitmapOf(text).data(), step, ground.at(x, y), ground.step(), 4,
                         textWidth(text), kGlyphHeight, ink, paper);
 }
 
 void stencil(Picture &ground, int32 x, int32 y, std::string_view text, uint32 ink) {
     checkInside(ground, x, y, textWidth(text), kGlyphHeight);
     const auto step = static_cast<int32>(text.size());
-    Raster_BitsToPixelsStencil(bitmapOf(text).data(), step, pixelAt(ground, x, y), ground.step(), 4,
+    Raster_BitsToPixelsStencil(bitmapOf(text).data(), step, ground.at(x, y), ground.step(), 4,
                                textWidth(text), kGlyphHeight, ink);
 }
 

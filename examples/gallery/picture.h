@@ -40,6 +40,9 @@ public:
     // What the raster functions call a surface.
     uint8 *data() const { return image.data; }
     int32 step() const { return static_cast<int32>(image.bytesPerLine); }
+    uint8 *at(int32 x, int32 y) const {
+        return image.data + ptrdiff_t{y} * step() + ptrdiff_t{x} * 4;
+    }
     Rect bounds() const { return {0, 0, width(), height()}; }
 
 private:

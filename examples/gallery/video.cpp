@@ -22,7 +22,7 @@ Yuv yuvOf(const Picture &picture, int32 x, int32 y, int32 columns, int32 rows) {
     int32 red = 0, green = 0, blue = 0;
     for (int32 row = y; row < y + rows; ++row)
         for (int32 column = x; column < x + columns; ++column) {
-            const uint8 *pixel = picture.data() + row * picture.step() + column * 4;
+            const uint8 *pixel = picture.at(column, row);
             blue += pixel[0];
             green += pixel[1];
             red += pixel[2];
