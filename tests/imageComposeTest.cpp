@@ -145,7 +145,8 @@ TEST(Combine, AtTheLimits) {
     };
     ImageInfo result;
     std::memset(&result, 0x5A, sizeof result);
-    EXPECT_FALSE(combine(2, {{{kMin, 0}, {kMax - 10, 0}}}, result)); // rows of 2^33 - 4 bytes
+    EXPECT_FALSE(combine(2, {{{kMin, 0}, {kMax - 10, 0}}}, result));    // rows of 2^33 - 4 bytes
+    EXPECT_FALSE(combine(2, {{{0, 0}, {0x40000001 - 10, 0}}}, result)); // and of 2^32 + 4
     EXPECT_EQ(result.width, 0x5A5A5A5Au);
     EXPECT_TRUE(combine(0, {}, result));
     const ImageInfo zero = {};
