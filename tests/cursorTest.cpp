@@ -79,7 +79,7 @@ TEST(CursorPlanes, areExpandedOrCopied) {
         ASSERT_EQ(bytesOf(dst), expected);
 
         const bool areBits[] = {random.oneIn(2), random.oneIn(2)};
-        for (const size_t i : {0, 1}) {
+        for (const size_t i : {0u, 1u}) {
             uint8 *const part = expected.data() + i * size;
             if (areBits[i] && depth != 1)
                 modelExpansion(width, height, depth, bits.data(), part);
@@ -392,9 +392,9 @@ TEST(CursorScaling, withoutASizeThereIsNoCursor) {
     const struct {
         uint32 size;
         double scale;
-    } cases[] = {{8, 0},     {8, -1},    {8, kInfinity}, {8, DBL_MAX},  {8, std::nan("")},
-                 {8, 1e10},  {8, 1e-10}, {8, DBL_MIN},   {8, 65536},    {8, 2e9},
-                 {8, -1e-9},  {kNoSize, 1},   {kNoSize, .5}, {0x20000000, 1}};
+    } cases[] = {{8, 0},     {8, -1},      {8, kInfinity}, {8, DBL_MAX},   {8, std::nan("")},
+                 {8, 1e10},  {8, 1e-10},   {8, DBL_MIN},   {8, 65536},     {8, 2e9},
+                 {8, -1e-9}, {kNoSize, 1}, {kNoSize, .5},  {0x20000000, 1}};
     Random random(1);
     for (const uint32 type : {0u, 1u})
         for (const auto &c : cases)

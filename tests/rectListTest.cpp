@@ -140,10 +140,13 @@ RasterRectList randomList(Random &random) {
 
 // Moves an edge of an entry by a cell: the list is almost in normal form.
 void disturb(Random &random, RasterRectList &list) {
-    Entry &entry = list.entries[random.below(16)], moved = entry;
+    const size_t count = used(list).size();
+    if (count == 0)
+        return;
+    Entry &entry = list.entries[random.below(uint32(count))], moved = entry;
     moved.*random.oneOf({&Entry::x, &Entry::y, &Entry::width, &Entry::height}) +=
         random.oneOf({-1, 1});
-    if (entry.width > 0 && moved.width > 0 && std::min({moved.x, moved.y, moved.height}) >= 0 &&
+    if (moved.width > 0 && std::min({moved.x, moved.y, moved.height}) >= 0 &&
         std::max(moved.x + moved.width, moved.y + moved.height) <= kCells)
         entry = moved;
 }
