@@ -23,8 +23,7 @@ HWY_ALIGN constexpr uint8_t kPackBytes[16] = {0,  1,  2,  4,  5,    6,    8,    
                                               10, 12, 13, 14, 0x80, 0x80, 0x80, 0x80};
 // Across groups of 16 bytes: three words a group to four, and back.  The words
 // behind the packed ones are not used, but have to be words of the vector.
-HWY_ALIGN constexpr uint32_t kSpreadWords[16] = {0, 1, 2, 2, 3, 4,  5,  5,
-                                                 6, 7, 8, 8, 9, 10, 11, 11};
+HWY_ALIGN constexpr uint32_t kSpreadWords[16] = {0, 1, 2, 2, 3, 4, 5, 5, 6, 7, 8, 8, 9, 10, 11, 11};
 template <size_t kWords>
 HWY_ALIGN constexpr uint32_t kPackWords[kWords] = {0,  1,  2,  4,  5, 6, 8,  9,
                                                    10, 12, 13, 14, 3, 7, 11, 15};

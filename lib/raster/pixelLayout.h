@@ -55,13 +55,6 @@ constexpr uint32 toSmall(uint32 pixel, ChannelEnds ends, int32 depth) {
 
 // Narrowing drops the low bits of a channel; widening repeats its top bits in
 // the new low ones, so that zero stays zero and the largest value the largest.
-constexpr uint32 widen15To16(uint32 p) {
-    return (p & 0x001F) | ((p & 0x7FE0) << 1) | ((p & 0x0200) >> 4);
-}
-constexpr uint32 narrow16To15(uint32 p) {
-    return (p & 0x001F) | ((p >> 1) & 0x7FE0);
-}
-
 constexpr uint32 widen15To24(uint32 p) {
     const uint32 top = ((p & 0x7C00) << 9) | ((p & 0x03E0) << 6) | ((p & 0x001F) << 3);
     return top | ((top >> 5) & 0x070707);

@@ -36,59 +36,23 @@ bool isDirectDepth(int32 depth) {
 
 // ---- One pixel ----------------------------------------------------------
 
-uint32 convertFrom15(uint32 pixel, int32 dstDepth) {
+// From a word of the 32-bit layout.  Narrowing what has been widened gives back
+// every bit, so that this serves the narrower sources too.
+uint32 fromWord(uint32 word, int32 dstDepth, int line = __builtin_LINE()) {
     switch (dstDepth) {
     case 3:
     case 6:
     case 8:
-        return toSmall(pixel, kEnds15, dstDepth);
+        return toSmall(word, kEnds32, dstDepth);
     case 15:
-        return pixel;
+        return narrow24To15(word);
     case 16:
-        return widen15To16(pixel);
+        return narrow24To16(word);
     case 24:
     case 32:
-        return widen15To24(pixel);
+        return word;
     default:
-        reject(kBadOneDstDepth, dstDepth);
-        return 0;
-    }
-}
-
-uint32 convertFrom16(uint32 pixel, int32 dstDepth) {
-    switch (dstDepth) {
-    case 3:
-    case 6:
-    case 8:
-        return toSmall(pixel, kEnds16, dstDepth);
-    case 15:
-        return narrow16To15(pixel);
-    case 16:
-        return pixel;
-    case 24:
-    case 32:
-        return widen16To24(pixel);
-    default:
-        reject(kBadOneDstDepth, dstDepth);
-        return 0;
-    }
-}
-
-uint32 convertFromWord(uint32 pixel, int32 dstDepth) {
-    switch (dstDepth) {
-    case 3:
-    case 6:
-    case 8:
-        return toSmall(pixel, kEnds32, dstDepth);
-    case 15:
-        return narrow24To15(pixel);
-    case 16:
-        return narrow24To16(pixel);
-    case 24:
-    case 32:
-        return pixel;
-    default:
-        reject(kBadOneDstDepth, dstDepth);
+        reject(kBadOneDstDepth, dstDepth, line);
         return 0;
     }
 }
@@ -170,16 +134,17 @@ uint32 Raster_ConvertOnePixel(uint32 pixel, int32 srcDepth, int32 dstDepth, bool
             reject(kBadPseudoDepth, srcDepth);
             return 0;
         }
-        return convertFromWord(palette[pixel], dstDepth);
+        pixel = palette[pixel];
+        srcDepth = 32;
     }
     switch (srcDepth) {
     case 15:
-        return convertFrom15(pixel, dstDepth);
+        return dstDepth == 15 ? pixel : fromWord(widen15To24(pixel), dstDepth);
     case 16:
-        return convertFrom16(pixel, dstDepth);
+        return dstDepth == 16 ? pixel : fromWord(widen16To24(pixel), dstDepth);
     case 24:
     case 32:
-        return convertFromWord(pixel, dstDepth);
+        return fromWord(pixel, dstDepth);
     default:
         reject(kBadOneSrcDepth, srcDepth);
         return 0;

@@ -133,33 +133,22 @@ struct ToSmall {
     }
 };
 
-struct To15 {
+template <int kRedShift, uint32_t kRed, int kGreenShift, uint32_t kGreen>
+struct To16Bits {
     static constexpr size_t kBytes = 2;
     static constexpr bool kHasAlpha = false;
 
     template <class D>
     HWY_INLINE static void store(D d, hn::Vec<D> v, uint8_t *dst) {
         store16(d,
-                hn::Or(masked(d, hn::ShiftRight<9>(v), 0x7C00),
-                       hn::Or(masked(d, hn::ShiftRight<6>(v), 0x03E0),
+                hn::Or(masked(d, hn::ShiftRight<kRedShift>(v), kRed),
+                       hn::Or(masked(d, hn::ShiftRight<kGreenShift>(v), kGreen),
                               masked(d, hn::ShiftRight<3>(v), 0x001F))),
                 dst);
     }
 };
-
-struct To16 {
-    static constexpr size_t kBytes = 2;
-    static constexpr bool kHasAlpha = false;
-
-    template <class D>
-    HWY_INLINE static void store(D d, hn::Vec<D> v, uint8_t *dst) {
-        store16(d,
-                hn::Or(masked(d, hn::ShiftRight<8>(v), 0xF800),
-                       hn::Or(masked(d, hn::ShiftRight<5>(v), 0x07E0),
-                              masked(d, hn::ShiftRight<3>(v), 0x001F))),
-                dst);
-    }
-};
+using To15 = To16Bits<9, 0x7C00, 6, 0x03E0>;
+using To16 = To16Bits<8, 0xF800, 5, 0x07E0>;
 
 struct To24 {
     static constexpr size_t kBytes = 3;

@@ -132,37 +132,22 @@ void ropRows(DstRows dst, SrcRows src, Size bytes, int32 bytesPerPixel, bool bac
     }
 }
 
+template <uint32_t... kRops>
+void ropRowsOf(uint32_t rop, DstRows dst, SrcRows src, Size bytes, int32 bytesPerPixel,
+               bool backwards) {
+    (void)((rop == kRops && (ropRows<kRops>(dst, src, bytes, bytesPerPixel, backwards), true)) ||
+           ...);
+}
+
 void RopCopy(DstRows dst, SrcRows src, Size bytes, int32 bytesPerPixel, uint32 rop,
              RowDirection direction) {
     const bool backwards = direction == RowDirection::RightToLeft;
     if (!backwards)
         bytes = joinedRows(bytes, bytes.width, dst.step, bytes.width, src.step);
-    switch (rop) {
-    case RASTER_ROP_AND:
-        return ropRows<RASTER_ROP_AND>(dst, src, bytes, bytesPerPixel, backwards);
-    case RASTER_ROP_AND_REVERSE:
-        return ropRows<RASTER_ROP_AND_REVERSE>(dst, src, bytes, bytesPerPixel, backwards);
-    case RASTER_ROP_AND_INVERTED:
-        return ropRows<RASTER_ROP_AND_INVERTED>(dst, src, bytes, bytesPerPixel, backwards);
-    case RASTER_ROP_XOR:
-        return ropRows<RASTER_ROP_XOR>(dst, src, bytes, bytesPerPixel, backwards);
-    case RASTER_ROP_OR:
-        return ropRows<RASTER_ROP_OR>(dst, src, bytes, bytesPerPixel, backwards);
-    case RASTER_ROP_NOR:
-        return ropRows<RASTER_ROP_NOR>(dst, src, bytes, bytesPerPixel, backwards);
-    case RASTER_ROP_EQUIV:
-        return ropRows<RASTER_ROP_EQUIV>(dst, src, bytes, bytesPerPixel, backwards);
-    case RASTER_ROP_OR_REVERSE:
-        return ropRows<RASTER_ROP_OR_REVERSE>(dst, src, bytes, bytesPerPixel, backwards);
-    case RASTER_ROP_COPY_INVERTED:
-        return ropRows<RASTER_ROP_COPY_INVERTED>(dst, src, bytes, bytesPerPixel, backwards);
-    case RASTER_ROP_OR_INVERTED:
-        return ropRows<RASTER_ROP_OR_INVERTED>(dst, src, bytes, bytesPerPixel, backwards);
-    case RASTER_ROP_NAND:
-        return ropRows<RASTER_ROP_NAND>(dst, src, bytes, bytesPerPixel, backwards);
-    default:
-        return;
-    }
+    ropRowsOf<RASTER_ROP_AND, RASTER_ROP_AND_REVERSE, RASTER_ROP_AND_INVERTED, RASTER_ROP_XOR,
+              RASTER_ROP_OR, RASTER_ROP_NOR, RASTER_ROP_EQUIV, RASTER_ROP_OR_REVERSE,
+              RASTER_ROP_COPY_INVERTED, RASTER_ROP_OR_INVERTED, RASTER_ROP_NAND>(
+        rop, dst, src, bytes, bytesPerPixel, backwards);
 }
 
 } // namespace

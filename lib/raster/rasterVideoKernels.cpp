@@ -316,6 +316,7 @@ void convertGroups(const Run &run) {
         walkAgain<uint32_t>(run.groups, ConvertGroups<kUyvy, kLayout>{run.dst, run.src});
 }
 
+// NOLINTNEXTLINE(readability-non-const-parameter): dst is written through run
 void ConvertPacked(uint8 *dst, int32 bppdepth, const uint8 *src, VideoGroupOrder order,
                    size_t groups) {
     const Run run = {dst, src, order, groups};
