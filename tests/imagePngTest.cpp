@@ -34,8 +34,8 @@ ImageInfo recordOf(uint8 byte) {
 constexpr uint8 kUntouched = 0x5A;
 
 bool isRecordOf(const ImageInfo &image, uint8 byte) {
-    const ImageInfo expected = recordOf(byte);
-    return std::memcmp(&image, &expected, sizeof image) == 0;
+    const Bytes expected(sizeof image, byte);
+    return std::memcmp(&image, expected.data(), sizeof image) == 0;
 }
 
 // Where the compressed pixels begin.
