@@ -22,32 +22,22 @@ namespace {
 
 constexpr size_t kHuge = static_cast<size_t>(-1);
 
-TEST(HearthMessages, PanicTellsAndAborts) {
+TEST(Hearth, Messages) {
     EXPECT_EXIT(Panic("VERIFY %s:%d\n", "a/unit", 12), testing::KilledBySignal(SIGABRT),
                 "^VERIFY a/unit:12\n");
-}
-
-TEST(HearthMessages, OthersTellAndReturn) {
     testing::internal::CaptureStderr();
     Warning("one %d\n", 1);
     Log("two %s\n", "2");
     EXPECT_EQ(testing::internal::GetCapturedStderr(), "one 1\ntwo 2\n");
 }
 
-TEST(HearthMemory, NullForNothingAndForTooMuch) {
+TEST(Hearth, Memory) {
     EXPECT_EQ(UtilSafeMalloc0(0), nullptr);
     EXPECT_EQ(UtilSafeCalloc0(0, 8), nullptr);
     EXPECT_EQ(UtilSafeCalloc0(8, 0), nullptr);
     EXPECT_EQ(UtilSafeMalloc0(kHuge), nullptr);
     EXPECT_EQ(UtilSafeCalloc0(kHuge / 2, 4), nullptr); // 4 fewer than nothing, wrapped
 
-    auto *const zeros = static_cast<char *>(UtilSafeCalloc0(3, 5));
-    ASSERT_NE(zeros, nullptr);
-    EXPECT_EQ(std::string(zeros, 15), std::string(15, '\0'));
-    std::free(zeros);
-}
-
-TEST(HearthDynBuf, GrowsByAppending) {
     DynBuf buffer;
     std::memset(&buffer, 0x5A, sizeof buffer);
     DynBuf_Init(&buffer);
@@ -59,76 +49,66 @@ TEST(HearthDynBuf, GrowsByAppending) {
         ASSERT_EQ(std::string(buffer.data, buffer.size), expected);
         ASSERT_LE(buffer.size, buffer.allocated);
     }
-    EXPECT_TRUE(DynBuf_Append(&buffer, nullptr, 0));
-
     const DynBuf before = buffer;
     EXPECT_FALSE(DynBuf_Append(&buffer, "x", kHuge));     // the size would wrap
     EXPECT_FALSE(DynBuf_Append(&buffer, "x", kHuge / 2)); // no such block
     EXPECT_EQ(std::memcmp(&buffer, &before, sizeof buffer), 0);
-
     DynBuf_Destroy(&buffer);
     EXPECT_EQ(buffer.data, nullptr);
-    EXPECT_EQ(buffer.size, 0u);
     DynBuf_Destroy(&buffer);
 }
 
-class HearthFile : public testing::Test {
-protected:
-    HearthFile() { FileIO_Invalidate(&file_); }
+struct HearthFile : testing::Test {
+    HearthFile() { FileIO_Invalidate(&file); }
     ~HearthFile() override {
-        FileIO_Close(&file_);
-        std::remove(path_.c_str());
+        FileIO_Close(&file);
+        std::remove(path.c_str());
     }
+    int open(int access, int action) { return FileIO_Open(&file, path.c_str(), access, action); }
 
-    int open(int access, int action) { return FileIO_Open(&file_, path_.c_str(), access, action); }
-    std::string content() {
-        std::string text(100, '\0');
-        size_t actual = 0;
-        EXPECT_EQ(open(FILEIO_ACCESS_READ, FILEIO_OPEN), 0);
-        EXPECT_EQ(FileIO_Read(&file_, text.data(), text.size(), &actual), 0);
-        EXPECT_EQ(FileIO_GetSize(&file_), static_cast<int64_t>(actual));
-        EXPECT_EQ(FileIO_Close(&file_), 0);
-        return text.substr(0, actual);
-    }
-    void write(int access, int action, const std::string &text) {
-        size_t actual = 0;
-        ASSERT_EQ(open(access, action), 0);
-        EXPECT_EQ(FileIO_Write(&file_, text.data(), text.size(), &actual), 0);
-        EXPECT_EQ(actual, text.size());
-        EXPECT_EQ(FileIO_Close(&file_), 0);
-    }
-
-    const std::string path_ = testing::TempDir() + "hearthTest" + std::to_string(getpid());
-    FileIODescriptor file_;
+    const std::string path = testing::TempDir() + "hearthTest" + std::to_string(getpid());
+    FileIODescriptor file;
 };
 
 TEST_F(HearthFile, OpensAndCreates) {
+    const struct {
+        int access, action;
+        std::string text, content;
+    } steps[] = {
+        {FILEIO_ACCESS_WRITE, FILEIO_OPEN_CREATE, "a long text", "a long text"},
+        {FILEIO_ACCESS_WRITE, FILEIO_OPEN, "A", "A long text"},
+        {FILEIO_ACCESS_READ | FILEIO_ACCESS_WRITE, FILEIO_OPEN_CREATE, "short", "short"},
+    };
     EXPECT_EQ(open(FILEIO_ACCESS_WRITE, FILEIO_OPEN), ENOENT);
-    write(FILEIO_ACCESS_WRITE, FILEIO_OPEN_CREATE, "a long text");
-    EXPECT_EQ(content(), "a long text");
-    write(FILEIO_ACCESS_WRITE, FILEIO_OPEN, "A");
-    EXPECT_EQ(content(), "A long text");
-    write(FILEIO_ACCESS_READ | FILEIO_ACCESS_WRITE, FILEIO_OPEN_CREATE, "short");
-    EXPECT_EQ(content(), "short");
+    for (const auto &step : steps) {
+        size_t actual = 0;
+        ASSERT_EQ(open(step.access, step.action), 0);
+        EXPECT_EQ(FileIO_Write(&file, step.text.data(), step.text.size(), &actual), 0);
+        EXPECT_EQ(actual, step.text.size());
+        EXPECT_EQ(FileIO_Close(&file), 0);
+        std::string content(100, '\0');
+        ASSERT_EQ(open(FILEIO_ACCESS_READ, FILEIO_OPEN), 0);
+        EXPECT_EQ(FileIO_Read(&file, content.data(), content.size(), &actual), 0);
+        EXPECT_EQ(FileIO_GetSize(&file), static_cast<int64_t>(actual));
+        EXPECT_EQ(FileIO_Close(&file), 0);
+        EXPECT_EQ(content.substr(0, actual), step.content);
+    }
 }
 
 TEST_F(HearthFile, SaysWhatIsWrong) {
     EXPECT_EQ(open(0, FILEIO_OPEN), EINVAL);
-    EXPECT_EQ(open(4, FILEIO_OPEN), EINVAL);
     EXPECT_EQ(open(FILEIO_ACCESS_READ, 1), EINVAL);
-    EXPECT_EQ(FileIO_Open(&file_, "/", FILEIO_ACCESS_WRITE, FILEIO_OPEN), EISDIR);
-    EXPECT_EQ(file_.fd, -1);
+    EXPECT_EQ(FileIO_Open(&file, "/", FILEIO_ACCESS_WRITE, FILEIO_OPEN), EISDIR);
+    EXPECT_EQ(file.fd, -1);
 
     char byte = 0;
     size_t actual = 7;
-    EXPECT_EQ(FileIO_GetSize(&file_), -1);
-    EXPECT_EQ(FileIO_Read(&file_, &byte, 1, &actual), EBADF);
+    EXPECT_EQ(FileIO_GetSize(&file), -1);
+    EXPECT_EQ(FileIO_Read(&file, &byte, 1, &actual), EBADF);
     EXPECT_EQ(actual, 0u);
-    EXPECT_EQ(FileIO_Write(&file_, &byte, 1, nullptr), EBADF);
-    EXPECT_EQ(FileIO_Close(&file_), 0);
-
-    EXPECT_EQ(FileIO_Open(&file_, "/dev/full", FILEIO_ACCESS_WRITE, FILEIO_OPEN), 0);
-    EXPECT_EQ(FileIO_Write(&file_, &byte, 1, &actual), ENOSPC);
+    EXPECT_EQ(FileIO_Close(&file), 0);
+    EXPECT_EQ(FileIO_Open(&file, "/dev/full", FILEIO_ACCESS_WRITE, FILEIO_OPEN), 0);
+    EXPECT_EQ(FileIO_Write(&file, &byte, 1, nullptr), ENOSPC);
 
     EXPECT_STREQ(FileIO_ErrorEnglish(0), "Success");
     EXPECT_STREQ(FileIO_ErrorEnglish(ENOENT), "No such file or directory");
@@ -140,32 +120,28 @@ TEST_F(HearthFile, GoesOnOverShortAndInterruptedTransfers) {
     struct sigaction action = {};
     action.sa_handler = [](int) {}; // not restarting what it interrupts
     sigaction(SIGALRM, &action, nullptr);
-    const itimerval often = {{0, 1000}, {0, 1000}};
-    const itimerval never = {};
+    const itimerval often = {{0, 1000}, {0, 1000}}, never = {};
 
     const std::string sent(300000, 'p'); // more than a pipe holds
     std::string received(sent.size() + 1, '\0');
-    size_t written = 0;
-    size_t actual = 0;
-    ASSERT_EQ(mkfifo(path_.c_str(), 0600), 0);
+    size_t written = 0, actual = 0;
+    ASSERT_EQ(mkfifo(path.c_str(), 0600), 0);
     std::thread reader([&] {
         usleep(20000);
         FileIODescriptor pipe;
-        FileIO_Invalidate(&pipe);
-        EXPECT_EQ(FileIO_Open(&pipe, path_.c_str(), FILEIO_ACCESS_READ, FILEIO_OPEN), 0);
+        EXPECT_EQ(FileIO_Open(&pipe, path.c_str(), FILEIO_ACCESS_READ, FILEIO_OPEN), 0);
         usleep(20000); // while the other side waits for room
         EXPECT_EQ(FileIO_Read(&pipe, received.data(), received.size(), &actual), 0);
         EXPECT_EQ(FileIO_Close(&pipe), 0);
     });
     setitimer(ITIMER_REAL, &often, nullptr);
     EXPECT_EQ(open(FILEIO_ACCESS_WRITE, FILEIO_OPEN), 0);
-    EXPECT_EQ(FileIO_Write(&file_, sent.data(), sent.size(), &written), 0);
+    EXPECT_EQ(FileIO_Write(&file, sent.data(), sent.size(), &written), 0);
     usleep(20000); // while the other side waits for more
-    EXPECT_EQ(FileIO_Close(&file_), 0);
+    EXPECT_EQ(FileIO_Close(&file), 0);
     reader.join();
     setitimer(ITIMER_REAL, &never, nullptr);
     EXPECT_EQ(written, sent.size());
-    EXPECT_EQ(actual, sent.size());
     EXPECT_EQ(received.substr(0, actual), sent);
 }
 

@@ -21,21 +21,15 @@
 namespace quillon::test {
 namespace {
 
-bool armed = false;
-Requests counted = Requests::kAll;
-uint64_t requestsLeft = 0; // until the one that fails
-bool hasFailed = false;
-int64_t held = 0;
-FileFault fileFault = FileFault::kNone;
-int openCount = 0;
+MemoryFault *current = nullptr;
 
 bool requestFails(Requests kind) {
-    if (!armed || hasFailed || (counted == Requests::kHearth && kind != counted)) {
+    MemoryFault *const fault = current;
+    if (fault == nullptr || fault->happened || (kind == Requests::kAll && kind != fault->counted)) {
         return false;
     }
-    hasFailed = requestsLeft == 0;
-    --requestsLeft;
-    return hasFailed;
+    fault->happened = fault->requestsLeft-- == 0;
+    return fault->happened;
 }
 
 // The function that this program's own one hides.
@@ -46,32 +40,12 @@ Function *hidden(Function * /*own*/, const char *name) {
 
 } // namespace
 
-MemoryFault::MemoryFault(uint64_t n, Requests which) {
-    counted = which;
-    requestsLeft = n;
-    hasFailed = false;
-    held = 0;
-    armed = true;
+MemoryFault::MemoryFault(uint64_t n, Requests kind) : counted(kind), requestsLeft(n) {
+    current = this;
 }
 
 MemoryFault::~MemoryFault() {
-    armed = false;
-}
-
-bool MemoryFault::happened() const {
-    return hasFailed;
-}
-
-int64_t MemoryFault::blocksHeld() const {
-    return held;
-}
-
-void setFileFault(FileFault fault) {
-    fileFault = fault;
-}
-
-int filesOpen() {
-    return openCount;
+    current = nullptr;
 }
 
 } // namespace quillon::test
@@ -91,8 +65,10 @@ void *__libc_calloc(size_t count, size_t size);
 void *__libc_realloc(void *block, size_t size);
 void __libc_free(void *block);
 
-static void *noted(void *block) {
-    held += armed && block != nullptr ? 1 : 0;
+static void *noted(void *block, int64_t count = 1) {
+    if (current != nullptr && block != nullptr) {
+        current->blocksHeld += count;
+    }
     return block;
 }
 
@@ -112,8 +88,7 @@ void *realloc(void *block, size_t size) noexcept {
 }
 
 void free(void *block) noexcept {
-    held -= armed && block != nullptr ? 1 : 0;
-    __libc_free(block);
+    __libc_free(noted(block, -1));
 }
 
 } // extern "C"
@@ -139,13 +114,13 @@ bool DynBuf_Append(DynBuf *buffer, const void *source, size_t length) {
 int FileIO_Open(FileIODescriptor *file, const char *name, int access, int action) {
     static auto *const next = hidden(FileIO_Open, "FileIO_Open");
     const int status = next(file, name, access, action);
-    openCount += status == 0 ? 1 : 0;
+    filesOpen += status == 0 ? 1 : 0;
     return status;
 }
 
 int FileIO_Close(FileIODescriptor *file) {
     static auto *const next = hidden(FileIO_Close, "FileIO_Close");
-    openCount -= file->fd >= 0 ? 1 : 0;
+    filesOpen -= file->fd >= 0 ? 1 : 0;
     return next(file);
 }
 

@@ -20,17 +20,18 @@ enum class Requests {
 };
 
 // While one lives, the n-th request for memory, from 0, fails: that one alone.
-class MemoryFault {
-public:
-    explicit MemoryFault(uint64_t n, Requests counted = Requests::kAll);
+struct MemoryFault {
+    explicit MemoryFault(uint64_t n, Requests kind = Requests::kAll);
     ~MemoryFault();
     MemoryFault(const MemoryFault &) = delete;
     MemoryFault &operator=(const MemoryFault &) = delete;
 
-    bool happened() const;
+    const Requests counted;
+    uint64_t requestsLeft; // until the one that fails
+    bool happened = false;
     // Blocks taken since construction and not given back.  0 under a sanitizer,
     // which finds leaks itself.
-    int64_t blocksHeld() const;
+    int64_t blocksHeld = 0;
 };
 
 // Calls run() once for each request for memory it makes, with that one failing,
@@ -44,8 +45,8 @@ void forEachMemoryFault(const Run &run, const Check &check) {
         {
             const MemoryFault fault(n);
             run();
-            failed = fault.happened();
-            held = fault.blocksHeld();
+            failed = fault.happened;
+            held = fault.blocksHeld;
         }
         EXPECT_EQ(held, 0) << "request " << n;
         check(failed);
@@ -61,10 +62,7 @@ enum class FileFault {
     kWriteShort, // all but the last byte
 };
 
-// The fault of every file operation from now on.
-void setFileFault(FileFault fault);
-
-// Files opened and not closed.
-int filesOpen();
+inline FileFault fileFault = FileFault::kNone; // of every file operation
+inline int filesOpen = 0;                      // opened and not closed
 
 } // namespace quillon::test

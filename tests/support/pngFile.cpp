@@ -29,19 +29,6 @@ void takeBytes(png_structp png, png_bytep bytes, size_t length) {
     input.left -= length;
 }
 
-uint32 channelsOf(int colorType) {
-    switch (colorType) {
-    case PNG_COLOR_TYPE_GRAY_ALPHA:
-        return 2;
-    case PNG_COLOR_TYPE_RGB:
-        return 3;
-    case PNG_COLOR_TYPE_RGB_ALPHA:
-        return 4;
-    default:
-        return 1;
-    }
-}
-
 void setChunks(png_structp png, png_infop info, const PngPicture &picture) {
     png_set_IHDR(png, info, picture.width, picture.height, picture.bitDepth, picture.colorType,
                  picture.interlaced ? PNG_INTERLACE_ADAM7 : PNG_INTERLACE_NONE,
@@ -74,7 +61,11 @@ std::vector<uint8> rowBytes(const PngPicture &picture, uint32 y) {
 } // namespace
 
 uint32 PngPicture::channels() const {
-    return channelsOf(colorType);
+    if (colorType == PNG_COLOR_TYPE_PALETTE) {
+        return 1;
+    }
+    return ((colorType & PNG_COLOR_MASK_COLOR) != 0 ? 3 : 1) +
+           ((colorType & PNG_COLOR_MASK_ALPHA) != 0 ? 1 : 0);
 }
 
 PngPicture randomPicture(Random &random, uint32 width, uint32 height, int colorType, int bitDepth,
@@ -104,29 +95,19 @@ std::vector<uint8> encodePng(const PngPicture &picture) {
     png_infop info = png_create_info_struct(png);
     png_set_write_fn(png, &file, appendBytes, nullptr);
     setChunks(png, info, picture);
-    png_write_info(png, info);
-    png_set_packing(png);
-    const int passes = png_set_interlace_handling(png);
-    for (int pass = 0; pass < passes; ++pass) {
+    if (picture.samples.empty()) {
+        png_write_info(png, info);
+        constexpr png_byte kZlibHeader[2] = {0x78, 0x9C};
+        png_write_chunk(png, reinterpret_cast<png_const_bytep>("IDAT"), kZlibHeader, 2);
+    } else {
+        std::vector<std::vector<uint8>> rows;
+        std::vector<png_bytep> pointers;
         for (uint32 y = 0; y < picture.height; ++y) {
-            png_write_row(png, rowBytes(picture, y).data());
+            pointers.push_back(rows.emplace_back(rowBytes(picture, y)).data());
         }
+        png_set_rows(png, info, pointers.data());
+        png_write_png(png, info, PNG_TRANSFORM_PACKING, nullptr);
     }
-    png_write_end(png, nullptr);
-    png_destroy_write_struct(&png, &info);
-    return file;
-}
-
-std::vector<uint8> encodePngHeader(uint32 width, uint32 height, int colorType) {
-    std::vector<uint8> file;
-    png_structp png = png_create_write_struct(PNG_LIBPNG_VER_STRING, nullptr, nullptr, nullptr);
-    png_infop info = png_create_info_struct(png);
-    png_set_write_fn(png, &file, appendBytes, nullptr);
-    png_set_IHDR(png, info, width, height, 8, colorType, PNG_INTERLACE_NONE,
-                 PNG_COMPRESSION_TYPE_DEFAULT, PNG_FILTER_TYPE_DEFAULT);
-    png_write_info(png, info);
-    constexpr png_byte kZlibHeader[2] = {0x78, 0x9C};
-    png_write_chunk(png, reinterpret_cast<png_const_bytep>("IDAT"), kZlibHeader, 2);
     png_destroy_write_struct(&png, &info);
     return file;
 }

@@ -12,8 +12,7 @@ namespace quillon::test {
 
 // A PNG as it is stored: no transformation has touched the samples.
 struct PngPicture {
-    uint32 width = 0;
-    uint32 height = 0;
+    uint32 width = 0, height = 0;
     int colorType = PNG_COLOR_TYPE_RGB;
     int bitDepth = 8;
     bool interlaced = false;
@@ -28,12 +27,10 @@ struct PngPicture {
 };
 
 PngPicture randomPicture(Random &random, uint32 width, uint32 height, int colorType, int bitDepth,
-                         bool interlaced);
+                         bool interlaced = false);
 
+// Without samples, a file that ends in the first bytes of its pixels.
 std::vector<uint8> encodePng(const PngPicture &picture);
-
-// A file that ends in the first bytes of its pixels.
-std::vector<uint8> encodePngHeader(uint32 width, uint32 height, int colorType);
 
 // A file that is no valid PNG ends the test program, with libpng's message.
 PngPicture decodePng(const void *data, size_t size);
