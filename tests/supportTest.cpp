@@ -6,7 +6,7 @@
 #include "support/fence.h"
 #include "support/messages.h"
 #include "support/random.h"
-#include "support/targets.h"
+#include "support/surfaces.h"
 
 #include <set>
 
@@ -36,14 +36,14 @@ TEST(FenceDeathTest, bites) {
     EXPECT_DEATH(look(pages.end()), "");
     EXPECT_DEATH(look(pages.data() - 1), "");
 
-    const FencedRows rows(3);
-    for (size_t row = 0; row < 3; ++row) {
-        const ptrdiff_t offset = static_cast<ptrdiff_t>(row) * FencedRows::step();
-        touch(rows.flushBefore() + offset);
-        touch(rows.flushBehind(7) + offset + 6);
-        EXPECT_DEATH(look(rows.flushBefore() + offset - 1), "");
-        EXPECT_DEATH(look(rows.flushBehind(7) + offset + 7), "");
+    const TwinMemory twin(pageSize(), 2, 2 * pageSize());
+    for (uint8_t *run : {twin.run(0), twin.run(1)}) {
+        EXPECT_DEATH(look(run - 1), "");
+        EXPECT_DEATH(touch(run + twin.runBytes()), "");
     }
+    EXPECT_TRUE(twin.agree());
+    touch(twin.run(1) + 7);
+    EXPECT_FALSE(twin.agree());
 }
 
 TEST(Fence, canaries) {
