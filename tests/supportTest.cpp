@@ -1,10 +1,7 @@
-// The support itself: a fence that does not bite, or a panic that goes
-// unnoticed, would let every other test pass.
+// The support itself: a fence that does not bite, or cases that
+// cannot be had again, would let every other test pass.
 
-#include "hearth.h"
-#include "raster.h"
 #include "support/fence.h"
-#include "support/messages.h"
 #include "support/random.h"
 #include "support/surfaces.h"
 
@@ -54,21 +51,6 @@ TEST(Fence, canaries) {
     touch(before.end());
     EXPECT_FALSE(behind.canariesIntact());
     EXPECT_FALSE(before.canariesIntact());
-}
-
-TEST(Messages, takeTheLibrarysPlace) {
-    Warning("from %s\n", "here");
-    Log("%d\n", 7);
-    EXPECT_EQ(warnings(), std::vector<std::string>{"from here\n"});
-    EXPECT_EQ(logs(), std::vector<std::string>{"7\n"});
-
-    // The library's own calls must land here too, past libhearth's functions.
-    uint8_t pixel = 0;
-    const std::string message =
-        expectPanic([&] { Raster_RectFill(&pixel, 1, 5, 0xFF, 0, 0, 1, 1); });
-    EXPECT_GT(panicLine(message, "NOT_IMPLEMENTED lib/raster/rasterops"), 0);
-    EXPECT_EQ(warnings().size(), 1u);
-    EXPECT_EQ(pixel, 0);
 }
 
 TEST(Random, isReproducible) {

@@ -35,26 +35,147 @@ uint32 randomWidth(Random &random) {
     return random.oneIn(4) ? width & ~7u : width; // bitmap rows of whole bytes
 }
 
-// Fitting the row, padded, shorter than the row, next to none; or the negative
-// of these.
-int64_t randomLine(Random &random, size_t rowBytes, bool isSigned) {
+// Fitting the row, padded, shorter than the row, next to none.
+int64_t randomLine(Random &random, size_t rowBytes) {
     const auto row = static_cast<uint32>(rowBytes);
-    const int64_t line =
-        random.oneOf({row, row, row + random.below(10), row + random.below(10),
-                      row + random.below(300), random.below(row + 1), random.below(5)});
-    return isSigned && random.oneIn(4) ? -line : line;
+    return random.oneOf({row, row, row + random.below(10), row + random.below(10),
+                         row + random.below(300), random.below(row + 1), random.below(5)});
 }
 
 // The bytes from a rectangle's first pixel down to its lowest, and up to behind
 // its highest.
 struct Extent {
     int64_t below, above;
-
-    Extent(uint32 height, size_t rowBytes, int64_t step)
-        : below(std::max<int64_t>(0, -step * (int64_t{height} - 1))),
-          above(std::max<int64_t>(0, step * (int64_t{height} - 1)) +
-                static_cast<int64_t>(rowBytes)) {}
 };
+
+// One call.
+struct Case {
+    const Operation &operation;
+    bool isInRows, isNear;
+    Size size;
+    std::array<TwinMemory, 4> &home; // for each surface
+    Surfaces at{operation.parts.size()};
+    std::vector<TwinMemory *> memories{operation.parts.size()};
+    bool isUpwards = false;
+
+    size_t rowBytes(size_t i) const { return operation.parts[i].rowBytes(size.width); }
+
+    // From each row to the next one that is walked.
+    int64_t step(size_t i) const {
+        return rowStep(isUpwards ? -at[i].line : at[i].line, operation.parts[i]);
+    }
+
+    Extent extent(size_t i) const {
+        const int64_t toLast = step(i) * (int64_t{size.height} - 1);
+        return {std::max<int64_t>(0, -toLast),
+                std::max<int64_t>(0, toLast) + static_cast<int64_t>(rowBytes(i))};
+    }
+};
+
+void drawCoordinates(Random &random, Case &c) {
+    const bool isOneCorner = c.operation.isOneCorner;
+    const bool isOneColumn = isOneCorner || random.oneIn(4);
+    const bool isOneRow = isOneCorner || random.oneIn(2);
+    for (Surface &surface : c.at) {
+        surface.x = isOneColumn ? c.at[0].x : randomCoordinate(random);
+        surface.y = isOneRow ? c.at[0].y : randomCoordinate(random);
+    }
+    // Rounded steps are taken from the first row that is walked.
+    c.isUpwards = c.at.size() == 2 && c.operation.parts[1].rule == RowRule::kRoundedSteps &&
+                  c.at[1].y < c.at[0].y;
+}
+
+void drawLine(Random &random, Case &c, size_t i) {
+    int64_t &line = c.at[i].line;
+    if (c.isInRows) {
+        const int64_t spacing = c.home[i].spacing();
+        const bool isDownwards = spacing > INT32_MAX || random.oneIn(2);
+        line = c.operation.isSigned && isDownwards ? -spacing : spacing;
+        return;
+    }
+    line = randomLine(random, c.rowBytes(i));
+    if (random.oneIn(4))
+        line = -line;
+    if (i > 0 && random.oneIn(2)) // as on surfaces of one size, or nearly
+        line = c.at[0].line + (c.isNear && random.oneIn(2) ? random.between(-20, 20) : 0);
+    if (!c.operation.isSigned)
+        line = std::abs(line);
+    for (; c.size.height > 1; --c.size.height) {
+        const Extent extent = c.extent(i);
+        if (extent.below + extent.above <= static_cast<int64_t>(c.home[i].runBytes()))
+            break;
+    }
+}
+
+// Where the first row that is walked begins.
+uint8 *drawFirst(Random &random, Case &c, size_t i, bool isFlushBehind, bool isNear) {
+    TwinMemory &memory = *c.memories[i];
+    if (c.isInRows)
+        return memory.run(c.step(i) < 0 ? kFencedRows - 1 : 0) +
+               (isFlushBehind ? memory.runBytes() - c.rowBytes(i) : 0);
+    if (isNear)
+        return memory.run(0) + memory.runBytes() / 2 + (i == 0 ? 0 : random.between(-128, 128));
+    const Extent extent = c.extent(i);
+    const int64_t room = static_cast<int64_t>(memory.runBytes()) - extent.below - extent.above;
+    const int64_t anywhere = random.below(static_cast<uint32>(room) + 1);
+    return memory.run(0) + extent.below + random.oneOf({int64_t{0}, room, room, anywhere});
+}
+
+void drawPlaces(Random &random, Case &c) {
+    const bool isFlushBehind = random.oneIn(2);
+    const uint32 nearest = c.at.size() < 3 ? 1 : 1 + random.below(3);
+    for (size_t i = 0; i < c.at.size(); ++i) {
+        const Part &part = c.operation.parts[i];
+        const bool isNear = c.isNear && (i == 0 || i == nearest || random.oneIn(2));
+        const bool isShared = isNear || (!c.isInRows && c.operation.mayOverlap && random.oneIn(3));
+        c.memories[i] = &c.home[isShared ? 0 : i];
+        Surface &surface = c.at[i];
+        surface.first = drawFirst(random, c, i, isFlushBehind, isNear);
+        const uint64_t row = uint64_t{surface.y} + (c.isUpwards ? c.size.height - 1 : 0);
+        const int64_t line =
+            part.rule == RowRule::kRounded ? rowStep(surface.line, part) : surface.line;
+        surface.buffer = reinterpret_cast<uint8 *>(reinterpret_cast<uintptr_t>(surface.first) -
+                                                   row * static_cast<uint64_t>(line) -
+                                                   uint64_t{surface.x} * part.bytes);
+    }
+}
+
+Surface moved(const Surface &surface, uint8 *first) {
+    const uintptr_t distance =
+        reinterpret_cast<uintptr_t>(first) - reinterpret_cast<uintptr_t>(surface.first);
+    auto *buffer =
+        reinterpret_cast<uint8 *>(reinterpret_cast<uintptr_t>(surface.buffer) + distance);
+    return {buffer, first, surface.line, surface.x, surface.y};
+}
+
+void compare(Random &random, const Case &c) {
+    Surfaces inModel = c.at, called = c.at;
+    for (size_t i = 0; i < c.at.size(); ++i) {
+        const Part &part = c.operation.parts[i];
+        c.memories[i]->refill(random, part.low, part.count);
+        inModel[i] = moved(c.at[i], c.memories[i]->inModel(c.at[i].first));
+        if (!part.isTouched)
+            called[i] = moved(c.at[i], c.memories[i]->nowhere());
+    }
+    c.operation.library(called, c.size);
+    c.operation.reference(inModel, c.size);
+    for (const TwinMemory *memory : c.memories)
+        EXPECT_TRUE(memory->agree());
+    if (testing::Test::HasFailure())
+        for (const Surface &surface : c.at)
+            ADD_FAILURE() << c.operation.name << ", " << c.size.width << " x " << c.size.height
+                          << " at " << surface.x << ", " << surface.y << ", line " << surface.line;
+}
+
+// Nothing is looked at when there is nothing to do, however large the rest.
+void callForNothing(Random &random, const Operation &operation, uint8 *nowhere) {
+    Surfaces at(operation.parts.size());
+    for (Surface &surface : at)
+        surface = {nowhere, nowhere, 64, random.below(9), random.below(9)};
+    const uint32 any = random.oneOf({0u, 1u, kMost});
+    const uint32 none = operation.parts[0].isTouched ? 0 : random.oneOf({0u, 1u, 999u, kMost});
+    operation.library(at, random.oneIn(2) ? Size{any, none} : Size{none, any});
+}
 
 } // namespace
 
@@ -95,6 +216,9 @@ Arena::Arena()
       farRows_(four(1, kFencedRows, kFar)) {}
 
 void Arena::check(Random &random, const Operation &operation) {
+    if (!operation.parts[0].isTouched || random.oneIn(32))
+        return callForNothing(random, operation, random.oneIn(4) ? nullptr : blocks_[0].nowhere());
+
     const bool isFar = random.oneIn(16), isInRows = isFar || random.oneIn(3);
     const bool isNear = !isInRows && operation.mayOverlap && random.oneIn(2);
     Size size = {randomWidth(random), random.below(random.oneIn(16) ? 40 : 6)};
@@ -102,113 +226,13 @@ void Arena::check(Random &random, const Operation &operation) {
         size = {random.below(141), kFencedRows};
     else if (isNear)
         size = {random.below(100), 1 + random.below(4)};
-    const bool isTouched = std::any_of(operation.parts.begin(), operation.parts.end(),
-                                       [](const Part &part) { return part.isTouched; });
-    if (!isTouched || random.oneIn(32))
-        return checkNothing(random, operation);
 
-    const size_t count = operation.parts.size();
-    Surfaces at(count);
-    std::vector<TwinMemory *> memories(count);
-    const bool isOneRow = random.oneIn(2), isOneColumn = random.oneIn(4);
-    for (size_t i = 0; i < count; ++i) {
-        const bool isSame = i > 0 && operation.isOneCorner;
-        at[i].x = isSame || (i > 0 && isOneColumn) ? at[0].x : randomCoordinate(random);
-        at[i].y = isSame || (i > 0 && isOneRow) ? at[0].y : randomCoordinate(random);
-    }
-    // Rounded steps are taken from the first row that is walked.
-    const bool isUpwards =
-        count == 2 && operation.parts[1].rule == RowRule::kRoundedSteps && at[1].y < at[0].y;
-    const auto stepOf = [&](size_t i) {
-        return rowStep(isUpwards ? -at[i].line : at[i].line, operation.parts[i]);
-    };
-
-    for (size_t i = 0; i < count; ++i) {
-        const size_t rowBytes = operation.parts[i].rowBytes(size.width);
-        memories[i] = &(isFar ? farRows_ : isInRows ? rows_ : blocks_)[i];
-        at[i].line = randomLine(random, rowBytes, operation.isSigned);
-        if (isInRows)
-            at[i].line = operation.isSigned && (isFar || random.oneIn(2)) ? -memories[i]->spacing()
-                                                                          : memories[i]->spacing();
-        else if (i > 0 && random.oneIn(2)) // as on surfaces of one size, or nearly
-            at[i].line = at[0].line + (isNear && random.oneIn(2) ? random.between(-20, 20) : 0);
-        if (!operation.isSigned)
-            at[i].line = std::abs(at[i].line);
-        while (!isInRows && size.height > 1) {
-            const Extent extent(size.height, rowBytes, stepOf(i));
-            if (extent.below + extent.above <= static_cast<int64_t>(memories[i]->runBytes()))
-                break;
-            --size.height;
-        }
-    }
-
-    const auto nearest = 1 + random.below(static_cast<uint32>(std::max<size_t>(count, 2)) - 1);
-    const bool isFlushBehind = random.oneIn(2);
-    for (size_t i = 0; i < count; ++i) {
-        const Part &part = operation.parts[i];
-        const size_t rowBytes = part.rowBytes(size.width);
-        const Extent extent(size.height, rowBytes, stepOf(i));
-        if (isInRows) {
-            at[i].first = memories[i]->run(stepOf(i) < 0 ? kFencedRows - 1 : 0) +
-                          (isFlushBehind ? memories[i]->runBytes() - rowBytes : 0);
-        } else if (isNear && (i == 0 || i == nearest || random.oneIn(2))) {
-            memories[i] = memories[0];
-            at[i].first = memories[i]->run(0) + memories[i]->runBytes() / 2 +
-                          (i == 0 ? 0 : random.between(-128, 128));
-        } else {
-            if (operation.mayOverlap && random.oneIn(3))
-                memories[i] = memories[0];
-            const int64_t room =
-                static_cast<int64_t>(memories[i]->runBytes()) - extent.below - extent.above;
-            at[i].first = memories[i]->run(0) + extent.below +
-                          random.oneOf<int64_t>({0, room, room, random.below(uint32(room) + 1)});
-        }
-        const uint64_t row = uint64_t{at[i].y} + (isUpwards ? size.height - 1 : 0);
-        const int64_t line =
-            part.rule == RowRule::kRounded ? rowStep(at[i].line, part) : at[i].line;
-        at[i].buffer = reinterpret_cast<uint8 *>(reinterpret_cast<uintptr_t>(at[i].first) -
-                                                 row * static_cast<uint64_t>(line) -
-                                                 uint64_t{at[i].x} * part.bytes);
-    }
-    compare(random, operation, size, at, memories);
-}
-
-// Nothing is looked at when there is nothing to do, however large the rest.
-void Arena::checkNothing(Random &random, const Operation &operation) const {
-    const bool isTouched = operation.parts[0].isTouched;
-    uint8 *nowhere = random.oneIn(4) ? nullptr : blocks_[0].nowhere();
-    Surfaces at(operation.parts.size());
-    for (Surface &surface : at)
-        surface = {nowhere, nowhere, 64, random.below(9), random.below(9)};
-    const uint32 any = random.oneOf({0u, 1u, kMost});
-    const uint32 none = isTouched ? 0 : random.oneOf({0u, 1u, 999u, kMost});
-    operation.library(at, random.oneIn(2) ? Size{any, none} : Size{none, any});
-}
-
-void Arena::compare(Random &random, const Operation &operation, Size size, const Surfaces &at,
-                    const std::vector<TwinMemory *> &memories) {
-    Surfaces inModel = at, called = at;
-    for (size_t i = 0; i < at.size(); ++i) {
-        const Part &part = operation.parts[i];
-        memories[i]->refill(random, part.low, part.count);
-        const auto shift = [](Surface &surface, uint8 *first) {
-            surface.buffer = reinterpret_cast<uint8 *>(
-                reinterpret_cast<uintptr_t>(surface.buffer) +
-                (reinterpret_cast<uintptr_t>(first) - reinterpret_cast<uintptr_t>(surface.first)));
-            surface.first = first;
-        };
-        shift(inModel[i], memories[i]->inModel(at[i].first));
-        if (!part.isTouched)
-            shift(called[i], memories[i]->nowhere());
-    }
-    operation.library(called, size);
-    operation.reference(inModel, size);
-    for (const TwinMemory *memory : memories)
-        EXPECT_TRUE(memory->agree());
-    if (testing::Test::HasFailure())
-        for (const Surface &surface : at)
-            ADD_FAILURE() << operation.name << ", " << size.width << " x " << size.height << " at "
-                          << surface.x << ", " << surface.y << ", line " << surface.line;
+    Case c = {operation, isInRows, isNear, size, isFar ? farRows_ : isInRows ? rows_ : blocks_};
+    drawCoordinates(random, c);
+    for (size_t i = 0; i < c.at.size(); ++i)
+        drawLine(random, c, i);
+    drawPlaces(random, c);
+    compare(random, c);
 }
 
 } // namespace quillon::test

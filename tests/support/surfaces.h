@@ -96,10 +96,6 @@ public:
     void check(Random &random, const Operation &operation);
 
 private:
-    void checkNothing(Random &random, const Operation &operation) const;
-    void compare(Random &random, const Operation &operation, Size size, const Surfaces &at,
-                 const std::vector<TwinMemory *> &memories);
-
     std::array<TwinMemory, 4> blocks_, rows_, farRows_; // for each surface
 };
 
