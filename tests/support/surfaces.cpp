@@ -76,9 +76,10 @@ void drawCoordinates(Random &random, Case &c) {
     const bool isOneCorner = c.operation.isOneCorner;
     const bool isOneColumn = isOneCorner || random.oneIn(4);
     const bool isOneRow = isOneCorner || random.oneIn(2);
+    const uint32 x = randomCoordinate(random), y = randomCoordinate(random);
     for (Surface &surface : c.at) {
-        surface.x = isOneColumn ? c.at[0].x : randomCoordinate(random);
-        surface.y = isOneRow ? c.at[0].y : randomCoordinate(random);
+        surface.x = isOneColumn ? x : randomCoordinate(random);
+        surface.y = isOneRow ? y : randomCoordinate(random);
     }
     // Rounded steps are taken from the first row that is walked.
     c.isUpwards = c.at.size() == 2 && c.operation.parts[1].rule == RowRule::kRoundedSteps &&
