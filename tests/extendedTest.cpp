@@ -16,22 +16,12 @@ namespace {
 // of two, and any bits at all; mostly of similar size, so that sums interact.
 double hardDouble(Random &random) {
     uint64_t mantissa = random.bits() >> 11;
-    switch (random.below(5)) {
-    case 0:
+    if (random.oneIn(3))
         mantissa &= random.bits() & random.bits() & random.bits();
-        break;
-    case 1:
+    else if (random.oneIn(3))
         mantissa |= random.bits() | random.bits() | random.bits();
-        break;
-    case 2:
-        mantissa = (uint64_t{1} << 52) + static_cast<uint64_t>(random.between(-3, 3));
-        break;
-    case 3:
-        mantissa = (uint64_t{1} << random.below(53)) - random.below(2);
-        break;
-    default:
-        break;
-    }
+    else if (random.oneIn(2))
+        mantissa = (uint64_t{1} << random.below(53)) + static_cast<uint64_t>(random.between(-3, 3));
     const int range = random.oneIn(4) ? 300 : 16;
     const double value =
         std::ldexp(static_cast<double>(mantissa), random.between(-range, range) - 52);
@@ -53,31 +43,19 @@ void expectSame(Extended actual, long double expected) {
 TEST(Extended, equalsTheHardware) {
     forEachCase(200000, [](Random &random) {
         const double a = hardDouble(random), b = hardDouble(random), c = hardDouble(random);
-        SCOPED_TRACE(testing::Message() << std::hexfloat << a << " " << b << " " << c);
-        const long double wideA = a, wideB = b, wideC = c;
+        const uint32 m = random.word() >> random.below(32), n = 1 + (m >> random.below(32));
+        const auto i = static_cast<int32>(random.word()) >> random.below(32);
+        const long double wideA = a, wideB = b;
         expectSame(Extended(a), wideA);
         expectSame(Extended(a) + Extended(b), wideA + wideB);
-        expectSame(Extended(a) * Extended(b), wideA * wideB);
-        if (b != 0)
-            expectSame(Extended(a) / Extended(b), wideA / wideB);
+        expectSame(Extended(m) * Extended(b), m * wideB);
+        expectSame(Extended(i) * Extended(b), i * wideB);
         // With all 64 bits in use on one side: ties and long cancellations.
-        expectSame(Extended(a) * Extended(b) + Extended(c), wideA * wideB + wideC);
+        expectSame(Extended(a) * Extended(b) + Extended(c), wideA * wideB + c);
         expectSame(Extended(a) * Extended(b) - Extended(a * b), wideA * wideB - a * b);
         if (b != 0 && c != 0)
-            expectSame(Extended(a) / Extended(b) / Extended(c), wideA / wideB / wideC);
-    });
-}
-
-TEST(Extended, equalsTheHardwareOnIntegers) {
-    forEachCase(200000, [](Random &random) {
-        const uint32 a = random.word() >> random.below(32), b = random.word() >> random.below(32);
-        const auto c = static_cast<int32>(random.word()) >> random.below(32);
-        const double scale = hardDouble(random);
-        expectSame(Extended(a) * Extended(scale), static_cast<long double>(a) * scale);
-        expectSame(Extended(c) * Extended(scale), static_cast<long double>(c) * scale);
-        if (b != 0) {
-            EXPECT_EQ(extendedQuotient(a, b), static_cast<double>(static_cast<long double>(a) / b));
-        }
+            expectSame(Extended(a) / Extended(b) / Extended(c), wideA / wideB / c);
+        EXPECT_EQ(extendedQuotient(m, n), static_cast<double>(static_cast<long double>(m) / n));
     });
 }
 
@@ -88,17 +66,9 @@ TEST(Extended, knownValues) {
         return (Extended(65536.0) / Extended(scale)).truncated();
     };
     EXPECT_EQ(step(0.1), 655359u);
-    EXPECT_EQ(step(0.2), 327679u);
-    EXPECT_EQ(step(3.0), 21845u);
-    EXPECT_EQ(step(65536.0), 1u);
     EXPECT_EQ(step(std::nextafter(65536.0, 1e9)), 0u);
-
     // A whole number only after rounding: the exact quotient lies just below.
     EXPECT_EQ(step(0x1.e51d6e711b4cbp+3), 4323u);
-
-    EXPECT_EQ((Extended(int32{-7}) * Extended(0.5)).truncated(), static_cast<uint32>(-3));
-    EXPECT_EQ(Extended(-0x1.8p40).truncated(), 0u);
-    EXPECT_EQ(Extended(INT32_MIN).toDouble(), -0x1p31);
     EXPECT_EQ((Extended(1e308) * Extended(1e308)).toDouble(), HUGE_VAL);
 
     // Ties at the 64th bit, to the even neighbour on either side.

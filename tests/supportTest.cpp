@@ -1,12 +1,9 @@
-// The support itself: a fence that does not bite, or a panic that goes
-// unnoticed, would let every other test pass.
+// The support itself: a fence that does not bite, or cases that
+// cannot be had again, would let every other test pass.
 
-#include "hearth.h"
-#include "raster.h"
 #include "support/fence.h"
-#include "support/messages.h"
 #include "support/random.h"
-#include "support/targets.h"
+#include "support/surfaces.h"
 
 #include <set>
 
@@ -36,14 +33,14 @@ TEST(FenceDeathTest, bites) {
     EXPECT_DEATH(look(pages.end()), "");
     EXPECT_DEATH(look(pages.data() - 1), "");
 
-    const FencedRows rows(3);
-    for (size_t row = 0; row < 3; ++row) {
-        const ptrdiff_t offset = static_cast<ptrdiff_t>(row) * FencedRows::step();
-        touch(rows.flushBefore() + offset);
-        touch(rows.flushBehind(7) + offset + 6);
-        EXPECT_DEATH(look(rows.flushBefore() + offset - 1), "");
-        EXPECT_DEATH(look(rows.flushBehind(7) + offset + 7), "");
+    const TwinMemory twin(pageSize(), 2, 2 * pageSize());
+    for (uint8_t *run : {twin.run(0), twin.run(1)}) {
+        EXPECT_DEATH(look(run - 1), "");
+        EXPECT_DEATH(touch(run + twin.runBytes()), "");
     }
+    EXPECT_TRUE(twin.agree());
+    touch(twin.run(1) + 7);
+    EXPECT_FALSE(twin.agree());
 }
 
 TEST(Fence, canaries) {
@@ -54,21 +51,6 @@ TEST(Fence, canaries) {
     touch(before.end());
     EXPECT_FALSE(behind.canariesIntact());
     EXPECT_FALSE(before.canariesIntact());
-}
-
-TEST(Messages, takeTheLibrarysPlace) {
-    Warning("from %s\n", "here");
-    Log("%d\n", 7);
-    EXPECT_EQ(warnings(), std::vector<std::string>{"from here\n"});
-    EXPECT_EQ(logs(), std::vector<std::string>{"7\n"});
-
-    // The library's own calls must land here too, past libhearth's functions.
-    uint8_t pixel = 0;
-    const std::string message =
-        expectPanic([&] { Raster_RectFill(&pixel, 1, 5, 0xFF, 0, 0, 1, 1); });
-    EXPECT_GT(panicLine(message, "NOT_IMPLEMENTED lib/raster/rasterops"), 0);
-    EXPECT_EQ(warnings().size(), 1u);
-    EXPECT_EQ(pixel, 0);
 }
 
 TEST(Random, isReproducible) {

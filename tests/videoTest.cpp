@@ -1,15 +1,10 @@
-// YUV frames against their reference.
+// YUV frames and the colour key against their reference.
 
 #include "reference/video.h"
 #include "raster.h"
-#include "support/fence.h"
+#include "raster/videoAttributes.h"
 #include "support/messages.h"
-#include "support/random.h"
-#include "support/targets.h"
-
-#include <algorithm>
-#include <array>
-#include <vector>
+#include "support/surfaces.h"
 
 namespace quillon::test {
 namespace {
@@ -17,29 +12,20 @@ namespace {
 constexpr uint32 kFormats[] = {RASTER_VIDEO_YUY2, RASTER_VIDEO_UYVY, RASTER_VIDEO_YV12};
 constexpr int32 kDepths[] = {15, 16, 24, 32};
 
-size_t bytesAt(int32 bppdepth) {
-    return bppdepth == 15 ? 2 : static_cast<size_t>(bppdepth) / 8;
-}
-
-// The bytes that a conversion may read.
-size_t bytesOfFrame(uint32 width, uint32 height, uint32 format) {
-    if (format != RASTER_VIDEO_YV12)
-        return size_t{width} * height / 2 * 4;
-    return size_t{(width + 1) / 2} * ((height + 1) / 2) * 6;
-}
-
-// Converts a frame of random samples between fences that the frame and the
-// output each touch with a random end.
+// A frame of random samples between fences that the frame and the output each
+// touch with a random end.
 void expectConverted(Random &random, uint32 width, uint32 height, uint32 format, int32 bppdepth) {
-    const auto flush = [&] {
-        return random.oneIn(2) ? FencedBuffer::Flush::kBefore : FencedBuffer::Flush::kBehind;
+    const auto fenced = [&](size_t size) {
+        return FencedBuffer(size, random.oneIn(2) ? FencedBuffer::Flush::kBefore
+                                                  : FencedBuffer::Flush::kBehind);
     };
-    const FencedBuffer src(bytesOfFrame(width, height, format), flush());
-    const FencedBuffer dst(size_t{width} * height * bytesAt(bppdepth), flush());
+    const FencedBuffer src =
+        fenced(format != RASTER_VIDEO_YV12 ? size_t{width} * height / 2 * 4
+                                           : size_t{(width + 1) / 2} * ((height + 1) / 2) * 6);
+    const FencedBuffer dst = fenced(size_t{width} * height * static_cast<size_t>(bppdepth + 1) / 8);
     random.fill(src.data(), src.size());
     random.fill(dst.data(), dst.size());
     std::vector<uint8> expected(dst.data(), dst.end());
-
     Raster_YUVtoRGB(src.data(), dst.data(), width, height, format, bppdepth);
     reference::yuvToRgb(src.data(), expected.data(), width, height, format, bppdepth);
     EXPECT_TRUE(dst.canariesIntact());
@@ -47,31 +33,12 @@ void expectConverted(Random &random, uint32 width, uint32 height, uint32 format,
         << std::hex << format << std::dec << " to " << bppdepth << ", " << width << " x " << height;
 }
 
-// Every luma with every pair of chroma, as runs of one chromaLow.
-TEST(YuvToRgb, everyTriple) {
-    constexpr uint32 kWidth = 256, kHeight = 256; // luma, chromaHigh
-    std::vector<uint8> src(size_t{2} * kWidth * kHeight), dst(size_t{4} * kWidth * kHeight);
-    std::vector<uint8> expected(dst.size());
-    for (uint32 chromaLow = 0; chromaLow < 256; ++chromaLow) {
-        for (size_t i = 0; i < src.size(); i += 2) {
-            src[i] = static_cast<uint8>(i / 2 % kWidth);
-            src[i + 1] = static_cast<uint8>(i % 4 == 0 ? chromaLow : i / 2 / kWidth);
-        }
-        reference::yuvToRgb(src.data(), expected.data(), kWidth, kHeight, RASTER_VIDEO_YUY2, 32);
-        forEachTarget([&] {
-            Raster_YUVtoRGB(src.data(), dst.data(), kWidth, kHeight, RASTER_VIDEO_YUY2, 32);
-            ASSERT_TRUE(dst == expected) << "chromaLow " << chromaLow;
-        });
-    }
-}
-
-// Every width up to several vectors: the widths of a planar row, and with a
-// height of 1 the lengths of a packed run.
-TEST(YuvToRgb, everyWidth) {
+// The widths of a planar row, and with a height of 1 the lengths of a packed run.
+TEST(YuvToRgb, matchesReference) {
     forEachTarget([&] {
-        forEachCase(80, [&](Random &random) {
-            const auto width = static_cast<uint32>(random.between(0, 70));
-            for (uint32 height = 0; height < 5; ++height)
+        forEachCase(100, [&](Random &random) {
+            const uint32 width = random.below(random.oneIn(8) ? 400 : 71);
+            for (const uint32 height : {0u, 1u, 2u, 3u, 4u, random.below(40)})
                 for (const uint32 format : kFormats)
                     for (const int32 depth : kDepths)
                         expectConverted(random, width, height, format, depth);
@@ -79,85 +46,157 @@ TEST(YuvToRgb, everyWidth) {
     });
 }
 
-TEST(YuvToRgb, largerFrames) {
-    forEachTarget([&] {
-        forEachCase(100, [&](Random &random) {
-            expectConverted(random, 1 + random.below(400), 1 + random.below(40),
-                            kFormats[random.below(3)], kDepths[random.below(4)]);
-        });
-    });
+// Every luma with every pair of chroma, as runs of one chromaLow.
+TEST(YuvToRgb, everyTriple) {
+    constexpr uint32 kSide = 256; // luma, chromaHigh
+    std::vector<uint8> src(2 * kSide * kSide);
+    for (uint32 chromaLow = 0; chromaLow < 256; ++chromaLow) {
+        for (size_t i = 0; i < src.size(); i += 2) {
+            src[i] = static_cast<uint8>(i / 2 % kSide);
+            src[i + 1] = static_cast<uint8>(i % 4 == 0 ? chromaLow : i / 2 / kSide);
+        }
+        const auto converted = [&](auto function) {
+            std::vector<uint8> dst(4 * kSide * kSide);
+            function(src.data(), dst.data(), kSide, kSide, RASTER_VIDEO_YUY2, 32);
+            return dst;
+        };
+        const std::vector<uint8> expected = converted(reference::yuvToRgb);
+        forEachTarget([&] { ASSERT_TRUE(converted(Raster_YUVtoRGB) == expected) << chromaLow; });
+    }
 }
 
-// The pixels of a packed frame follow each other across its rows, whose padding
-// has no part in that.
-TEST(YuvToRgb, packedFramesAreOneRun) {
-    const std::array<uint8, 12> src = {16, 128, 235, 128, 235, 128, 16, 128, 99, 99, 99, 99};
-    std::array<uint8, 20> dst = {};
-    dst[16] = 7;
-    Raster_YUVtoRGB(src.data(), dst.data(), 1, 5, RASTER_VIDEO_YUY2, 32);
-    EXPECT_EQ(dst, (std::array<uint8, 20>{0, 0, 0, 0, 255, 255, 255, 0, 255, 255, 255, 0, 0, 0, 0,
-                                          0, 7}));
-}
-
+// luma 100, U 90, V 200: 298 * 84 = 25032, U - 128 = -38, V - 128 = 72.
+// low  (25032 - 15542 + 128) >> 8 = 37
+// mid  (25032 + 7904 - 7200 + 128) >> 8 = 101
+// high (25032 + 37152 + 128) >> 8 = 243
 TEST(YuvToRgb, knownValues) {
-    // luma 100, U 90, V 200: 298 * 84 = 25032, U - 128 = -38, V - 128 = 72.
-    // low  (25032 - 15542 + 128) >> 8 = 37
-    // mid  (25032 + 7904 - 7200 + 128) >> 8 = 101
-    // high (25032 + 37152 + 128) >> 8 = 243
-    const std::array<uint8, 4> yuy2 = {100, 90, 100, 200}, uyvy = {90, 100, 200, 100};
-    const std::array<uint8, 6> yv12 = {100, 100, 100, 100, 200, 90};
-    const auto pixelOf = [](const uint8 *src, uint32 height, uint32 format, int32 depth) {
-        std::array<uint8, 16> dst = {};
-        Raster_YUVtoRGB(src, dst.data(), 2, height, format, depth);
-        uint32 pixel = 0;
-        for (size_t i = bytesAt(depth); i-- > 0;)
-            pixel = pixel << 8 | dst[i];
-        return pixel;
-    };
+    const uint8 frames[][6] = {
+        {100, 90, 100, 200}, {90, 100, 200, 100}, {100, 100, 100, 100, 200, 90}};
     const std::pair<int32, uint32> pixels[] = {{15, 30 << 11 | 12 << 6 | 4 << 1},
                                                {16, 30 << 11 | 25 << 5 | 4},
                                                {24, 0xF36525},
                                                {32, 0xF36525}};
-    for (const auto &[depth, pixel] : pixels) {
-        EXPECT_EQ(pixelOf(yuy2.data(), 1, RASTER_VIDEO_YUY2, depth), pixel) << depth;
-        EXPECT_EQ(pixelOf(uyvy.data(), 1, RASTER_VIDEO_UYVY, depth), pixel) << depth;
-        EXPECT_EQ(pixelOf(yv12.data(), 2, RASTER_VIDEO_YV12, depth), pixel) << depth;
-    }
-    const std::array<uint8, 4> white = {235, 128, 235, 128};
-    EXPECT_EQ(pixelOf(white.data(), 1, RASTER_VIDEO_YUY2, 15), 0xFFFEu);
-    EXPECT_EQ(pixelOf(white.data(), 1, RASTER_VIDEO_YUY2, 16), 0xFFFFu);
+    for (size_t i = 0; i < 3; ++i)
+        for (const auto &[depth, pixel] : pixels) {
+            uint32 dst[4] = {};
+            Raster_YUVtoRGB(frames[i], reinterpret_cast<uint8 *>(dst), 2, i == 2 ? 2 : 1,
+                            kFormats[i], depth);
+            EXPECT_EQ(dst[0] & (depth < 24 ? 0xFFFF : 0xFFFFFF), pixel) << depth;
+        }
 }
 
-// Nothing is touched where there is nothing to convert, or nothing known.
-TEST(YuvToRgb, touchesNothing) {
+TEST(YuvToRgb, touchesNothingWhereThereIsNothingToDo) {
     const FencedBuffer fence(1);
-    for (const int32 depth : kDepths) {
-        for (const uint32 format : kFormats)
-            for (const uint32 large : {1u, UINT32_MAX}) {
+    for (const int32 depth : kDepths)
+        for (const uint32 large : {1u, UINT32_MAX}) {
+            for (const uint32 format : kFormats) {
                 Raster_YUVtoRGB(fence.end(), fence.end(), 0, large, format, depth);
                 Raster_YUVtoRGB(fence.end(), fence.end(), large, 0, format, depth);
             }
-        Raster_YUVtoRGB(fence.end(), fence.end(), UINT32_MAX, 1, RASTER_VIDEO_YV12, depth);
-        Raster_YUVtoRGB(fence.end(), fence.end(), 1, UINT32_MAX, RASTER_VIDEO_YV12, depth);
-        Raster_YUVtoRGB(fence.end(), fence.end(), 8, 8, 0, depth);
-    }
-    for (const int32 depth : {0, 8, 14, 17, -32, INT32_MIN})
-        Raster_YUVtoRGB(fence.end(), fence.end(), 8, 8, RASTER_VIDEO_YUY2, depth);
+            Raster_YUVtoRGB(fence.end(), fence.end(), large, 1, RASTER_VIDEO_YV12, depth);
+            Raster_YUVtoRGB(fence.end(), fence.end(), 1, large, RASTER_VIDEO_YV12, depth);
+        }
 }
 
 TEST(YuvToBgrx, matchesReference) {
     EXPECT_EQ(RasterRGB_YUVtoBGRX(235, 128, 128), 0x00FEFEFEu);
-    EXPECT_EQ(RasterRGB_YUVtoBGRX(16, 128, 128), 0u);
-    EXPECT_EQ(RasterRGB_YUVtoBGRX(100, 90, 200), 0x00D4'3615u);
-    forEachCase(1000000, [](Random &random) {
+    EXPECT_EQ(RasterRGB_YUVtoBGRX(100, 90, 200), 0x00D43615u);
+    forEachCase(300000, [](Random &random) {
         // Samples, samples out of range, and any int32 at all.
-        const int32 low = random.oneOf({0, -300, INT32_MIN});
-        const int32 high = low == 0 ? 255 : low == -300 ? 600 : INT32_MAX;
-        const auto sample = [&] { return random.between(low, high); };
-        const int32 y = sample(), u = sample(), v = sample();
+        const auto [low, high] =
+            random.oneOf<std::pair<int32, int32>>({{0, 255}, {-300, 600}, {INT32_MIN, INT32_MAX}});
+        const int32 y = random.between(low, high), u = random.between(low, high),
+                    v = random.between(low, high);
         EXPECT_EQ(RasterRGB_YUVtoBGRX(y, u, v), reference::yuvToBgrx(y, u, v))
             << y << ", " << u << ", " << v;
     });
+}
+
+// --- Geometry, and what is logged once in the life of a process
+
+TEST(VideoAttributes, geometry) {
+    size_t size = 1, pitches[] = {2, 3, 4}, offsets[] = {5, 6, 7};
+    const auto geometry = [&](uint32 format, uint32 width, uint32 height) {
+        EXPECT_TRUE(RasterComputeVideoAttributes(format, width, height, &size, pitches, offsets));
+        return std::vector<size_t>{size,       pitches[0], pitches[1], pitches[2],
+                                   offsets[0], offsets[1], offsets[2]};
+    };
+    using Numbers = std::vector<size_t>;
+    // Only the width is rounded up, and only the first offset set.
+    EXPECT_EQ(geometry(RASTER_VIDEO_YUY2, 5, 3), (Numbers{36, 2, 3, 4, 0, 6, 7}));
+    EXPECT_EQ(geometry(RASTER_VIDEO_UYVY, 5, 3), (Numbers{36, 2, 3, 4, 0, 6, 7}));
+    EXPECT_EQ(geometry(RASTER_VIDEO_YV12, 5, 3), (Numbers{36, 6, 3, 3, 0, 24, 30}));
+    constexpr size_t kRow = size_t{1} << 32;
+    EXPECT_EQ(geometry(RASTER_VIDEO_YV12, UINT32_MAX, 3),
+              (Numbers{6 * kRow, kRow, kRow / 2, kRow / 2, 0, 4 * kRow, 5 * kRow}));
+    EXPECT_TRUE(RasterComputeVideoAttributes(RASTER_VIDEO_YV12, 2, 2, &size, nullptr, nullptr));
+    EXPECT_EQ(size, 6u);
+}
+
+// Each message has a latch of its own; the depth is looked at first.
+TEST(VideoMessages, comeOnce) {
+    clearMessages();
+    const FencedBuffer fence(1);
+    size_t size = 1;
+    for (const uint32 format : {0xFFFFFFFEu, 0u}) {
+        EXPECT_FALSE(RasterComputeVideoAttributes(format, 5, 3, &size, nullptr, nullptr));
+        EXPECT_EQ(size, 0u);
+    }
+    for (const auto &[format, depth] : std::initializer_list<std::pair<uint32, int32>>{
+             {UINT32_MAX, -8}, {RASTER_VIDEO_YUY2, 8}, {UINT32_MAX, 32}, {0, 16}, {0, 0}})
+        Raster_YUVtoRGB(fence.end(), fence.end(), 8, 8, format, depth);
+    EXPECT_EQ(logs(), (std::vector<std::string>{
+                          "RasterComputeVideoAttributes: format :4294967294 not supported.\n",
+                          "Raster_YUVtoRGB: bppdepth:-8 not supported.\n",
+                          "Raster_YUVtoRGB: format:4294967295 not supported.\n"}));
+    EXPECT_TRUE(warnings().empty());
+}
+
+// --- Colour key
+
+TEST(ApplyColorKey, matchesReference) {
+    holdToReference(16000, [](Random &random) {
+        // The fewer values there are, the more pixels match.  Now and then the
+        // key has more bits than a pixel.
+        const uint32 limit = random.oneOf({1u, 2u, 2u, 3u, 256u});
+        const uint32 depth = random.oneOf({32u, 16u, 8u, 24u, 15u, 0u, UINT32_MAX});
+        const uint32 bytes = depth == 32 ? 4 : depth == 16 ? 2 : 1;
+        uint32 key = 0;
+        for (uint32 i = 0; i < std::min(bytes, 3u); ++i)
+            key |= random.below(limit) << (8 * i);
+        if (bytes == 4 || random.oneIn(8))
+            key |= random.word() << (8 * std::min(bytes, 3u));
+        Operation operation(
+            "key of depth " + std::to_string(depth),
+            {{4}, {4}, {4}, {.bytes = bytes, .low = 0, .count = limit}}, Raster_ApplyColorKey,
+            reference::applyColorKey, [=](auto function, const Surfaces &at, Size size) {
+                function(at[1].buffer, at[0].buffer, at[2].first, at[3].buffer, at[1].signedLine(),
+                         at[0].signedLine(), at[2].signedLine(), at[3].signedLine(), key, at[0].x,
+                         at[0].y, size.width, size.height, depth);
+            });
+        operation.isOneCorner = true;
+        return operation;
+    });
+}
+
+TEST(ApplyColorKey, bitsThatCount) {
+    const auto matches = [&](uint32 pixel, uint32 key, uint32 keyDepth) {
+        const uint32 background = 0xB0000001, overlay = 0xA0000002;
+        uint32 dst = 0;
+        const auto bytes = [](const uint32 &word) {
+            return reinterpret_cast<const uint8 *>(&word);
+        };
+        Raster_ApplyColorKey(bytes(background), reinterpret_cast<uint8 *>(&dst), bytes(overlay),
+                             bytes(pixel), 4, 4, 4, 4, key, 0, 0, 1, 1, keyDepth);
+        EXPECT_TRUE(dst == background || dst == overlay) << dst;
+        return dst == overlay;
+    };
+    EXPECT_TRUE(matches(0x00123456, 0xFF123456, 32)); // the top byte does not
+    EXPECT_FALSE(matches(0x00123457, 0x00123456, 32));
+    EXPECT_TRUE(matches(0xFFFF2345, 0x00002345, 16));
+    EXPECT_FALSE(matches(0xFFFF2345, 0x00012345, 16)); // all of the key does
+    EXPECT_TRUE(matches(0xFFFFFF45, 0x45, 33));
+    EXPECT_FALSE(matches(0xFFFFFF45, 0x145, 8));
 }
 
 } // namespace

@@ -133,12 +133,7 @@ void alphaBlendOver(uint8 *dstBuffer, uint32 dstX, uint32 dstY, int32 dstLineInc
 
 // --- Conversion
 
-uint32 convertOnePixel(uint32 pixel, int32 srcDepth, int32 dstDepth, bool pseudoColor,
-                       const uint32 *palette) {
-    if (pseudoColor) {
-        pixel = palette[pixel];
-        srcDepth = 32;
-    }
+uint32 convertOnePixel(uint32 pixel, int32 srcDepth, int32 dstDepth) {
     // A 24-bit pixel in a word is taken for a 32-bit one: its top byte goes along.
     const bool isWord = srcDepth == 24 || srcDepth == 32;
     const bool toWord = dstDepth == 24 || dstDepth == 32;
@@ -151,17 +146,16 @@ void convertPixels(uint8 *dstBuffer, uint32 dstLineIncrement, int32 dstDepth,
                    const uint8 *srcBuffer, uint32 srcLineIncrement, int32 srcDepth,
                    bool pseudoColor, const uint32 *palette, uint32 srcX, uint32 srcY, uint32 dstX,
                    uint32 dstY, uint32 width, uint32 height) {
-    if (pseudoColor && dstDepth == 32)
-        return convertIndexTo32(dstBuffer, dstLineIncrement, srcBuffer, srcLineIncrement, palette,
-                                srcX, srcY, dstX, dstY, width, height);
-    if (!pseudoColor && srcDepth == dstDepth)
-        return copyPixels(dstBuffer, dstLineIncrement, srcBuffer, srcLineIncrement, srcDepth, srcX,
-                          srcY, dstX, dstY, width, height);
-
     const Layout &dstLayout = layoutOf(dstDepth);
     const Layout &srcLayout = layoutOf(pseudoColor ? 32 : srcDepth); // of a palette's entries
     const int32 srcBytes = pseudoColor ? 1 : srcLayout.bytes;
-    const int64_t dstLine = wholePixelLine(dstLineIncrement, dstLayout.bytes);
+    if (!pseudoColor && srcDepth == dstDepth)
+        return rectCopy(dstBuffer, dstLineIncrement, srcBuffer, srcLineIncrement, srcBytes, srcX,
+                        srcY, dstX, dstY, width, height);
+
+    const bool isExact = pseudoColor && dstDepth == 32;
+    const int64_t dstLine =
+        isExact ? dstLineIncrement : wholePixelLine(dstLineIncrement, dstLayout.bytes);
     const int64_t srcLine = wholePixelLine(srcLineIncrement, srcBytes);
     for (uint64_t row = 0; row < height; ++row)
         for (uint64_t column = 0; column < width; ++column) {
@@ -170,29 +164,6 @@ void convertPixels(uint8 *dstBuffer, uint32 dstLineIncrement, int32 dstDepth,
             const uint32 pixel = pseudoColor ? palette[*src] : load(src, srcBytes);
             store(dst, dstLayout.bytes, pixelOf(colorOf(pixel, srcLayout, 255), dstLayout));
         }
-}
-
-void convertIndexTo32(uint8 *dstBuffer, uint32 dstLineIncrement, const uint8 *srcBuffer,
-                      uint32 srcLineIncrement, const uint32 *palette, uint32 srcX, uint32 srcY,
-                      uint32 dstX, uint32 dstY, uint32 width, uint32 height) {
-    for (uint64_t row = 0; row < height; ++row)
-        for (uint64_t column = 0; column < width; ++column) {
-            const uint8 *src = pixelAt(srcBuffer, srcLineIncrement, 1, srcX + column, srcY + row);
-            uint8 *dst = pixelAt(dstBuffer, dstLineIncrement, 4, dstX + column, dstY + row);
-            store(dst, 4, palette[*src]);
-        }
-}
-
-void copyPixels(uint8 *dstBuffer, uint32 dstLineIncrement, const uint8 *srcBuffer,
-                uint32 srcLineIncrement, int32 depth, uint32 srcX, uint32 srcY, uint32 dstX,
-                uint32 dstY, uint32 width, uint32 height) {
-    int32 bytesPerPixel = depth / 8;
-    if (depth == 3 || depth == 6)
-        bytesPerPixel = 1;
-    if (depth == 15)
-        bytesPerPixel = 2;
-    rectCopy(dstBuffer, dstLineIncrement, srcBuffer, srcLineIncrement, bytesPerPixel, srcX, srcY,
-             dstX, dstY, width, height);
 }
 
 } // namespace quillon::reference

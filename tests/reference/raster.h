@@ -24,22 +24,12 @@ void alphaBlendOver(uint8 *dstBuffer, uint32 dstX, uint32 dstY, int32 dstLineInc
                     const uint8 *srcBuffer, uint32 srcX, uint32 srcY, int32 srcLineIncrement,
                     uint32 width, uint32 height);
 
-uint32 convertOnePixel(uint32 pixel, int32 srcDepth, int32 dstDepth, bool pseudoColor,
-                       const uint32 *palette);
+uint32 convertOnePixel(uint32 pixel, int32 srcDepth, int32 dstDepth);
 
-// Also states Raster_ConvertPixelsTo32 and Raster_ConvertPixelsFrom32, which
-// are this with one depth fixed.
+// Also states the functions that are this with a depth, or both, fixed.
 void convertPixels(uint8 *dstBuffer, uint32 dstLineIncrement, int32 dstDepth,
                    const uint8 *srcBuffer, uint32 srcLineIncrement, int32 srcDepth,
                    bool pseudoColor, const uint32 *palette, uint32 srcX, uint32 srcY, uint32 dstX,
                    uint32 dstY, uint32 width, uint32 height);
-
-void convertIndexTo32(uint8 *dstBuffer, uint32 dstLineIncrement, const uint8 *srcBuffer,
-                      uint32 srcLineIncrement, const uint32 *palette, uint32 srcX, uint32 srcY,
-                      uint32 dstX, uint32 dstY, uint32 width, uint32 height);
-
-void copyPixels(uint8 *dstBuffer, uint32 dstLineIncrement, const uint8 *srcBuffer,
-                uint32 srcLineIncrement, int32 depth, uint32 srcX, uint32 srcY, uint32 dstX,
-                uint32 dstY, uint32 width, uint32 height);
 
 } // namespace quillon::reference

@@ -1,7 +1,8 @@
 // The scaler stated as plainly as it can be: one channel of one pixel at a
 // time, nothing kept from one row to the next but whole scaled rows.
 //
-// Both functions take the arguments of the exported function of their name.
+// Both functions take the arguments of the exported function of their name,
+// which have to be ones that the function accepts.
 #pragma once
 
 #include "raster.h"

@@ -57,9 +57,4 @@ testing::AssertionResult FencedBuffer::canariesIntact() const {
     return testing::AssertionSuccess();
 }
 
-FencedRows::FencedRows(size_t height) : mapping_((2 * height + 1) * pageSize()) {
-    for (size_t row = 0; row < height; ++row)
-        mapping_.open((2 * row + 1) * pageSize(), pageSize());
-}
-
 } // namespace quillon::test

@@ -21,6 +21,7 @@ public:
     Mapping &operator=(const Mapping &) = delete;
 
     uint8_t *data() const { return data_; }
+    size_t size() const { return size_; }
     void open(size_t offset, size_t size); // in whole pages
 
 private:
@@ -50,23 +51,6 @@ private:
     size_t openSize_;
     uint8_t *data_;
     size_t size_;
-};
-
-// Rows of one page, each alone between inaccessible pages, so that a rectangle
-// can have a fence at an edge of every one of its rows.
-class FencedRows {
-public:
-    explicit FencedRows(size_t height);
-
-    // The first row of a rectangle whose rows begin, or end, at a fence.
-    uint8_t *flushBefore() const { return mapping_.data() + pageSize(); }
-    uint8_t *flushBehind(size_t rowBytes) const { return flushBefore() + pageSize() - rowBytes; }
-
-    static ptrdiff_t step() { return static_cast<ptrdiff_t>(2 * pageSize()); }
-    uint8_t *page(size_t row) const { return flushBefore() + 2 * row * pageSize(); }
-
-private:
-    Mapping mapping_;
 };
 
 } // namespace quillon::test

@@ -15,25 +15,29 @@ std::vector<std::string> keptWarnings;
 std::vector<std::string> keptLogs;
 
 std::string formatted(const char *format, va_list arguments) {
-    va_list again;
-    va_copy(again, arguments);
-    const int length = vsnprintf(nullptr, 0, format, arguments);
-    std::string text(static_cast<size_t>(length), '\0');
-    vsnprintf(text.data(), text.size() + 1, format, again);
-    va_end(again);
+    char text[1024];
+    vsnprintf(text, sizeof(text), format, arguments);
     return text;
+}
+
+void keep(std::vector<std::string> &messages, const char *format, va_list arguments) {
+    const std::lock_guard lock(mutex);
+    messages.push_back(formatted(format, arguments));
+}
+
+std::vector<std::string> copyOf(const std::vector<std::string> &messages) {
+    const std::lock_guard lock(mutex);
+    return messages;
 }
 
 } // namespace
 
 std::vector<std::string> warnings() {
-    const std::lock_guard lock(mutex);
-    return keptWarnings;
+    return copyOf(keptWarnings);
 }
 
 std::vector<std::string> logs() {
-    const std::lock_guard lock(mutex);
-    return keptLogs;
+    return copyOf(keptLogs);
 }
 
 void clearMessages() {
@@ -44,11 +48,8 @@ void clearMessages() {
 
 int panicLine(const std::string &message, const std::string &start) {
     std::smatch match;
-    if (message.compare(0, start.size(), start) == 0) {
-        const std::string rest = message.substr(start.size());
-        if (std::regex_match(rest, match, std::regex(":([1-9][0-9]{0,5})\n")))
-            return std::stoi(match[1]);
-    }
+    if (std::regex_match(message, match, std::regex(start + ":([1-9][0-9]{0,5})\n")))
+        return std::stoi(match[1]);
     ADD_FAILURE() << "not \"" << start << ":<line>\\n\": " << message;
     return 0;
 }
@@ -68,17 +69,13 @@ void Panic(const char *format, ...) {
 void Warning(const char *format, ...) {
     va_list arguments;
     va_start(arguments, format);
-    const std::string text = formatted(format, arguments);
+    keep(keptWarnings, format, arguments);
     va_end(arguments);
-    const std::lock_guard lock(mutex);
-    keptWarnings.push_back(text);
 }
 
 void Log(const char *format, ...) {
     va_list arguments;
     va_start(arguments, format);
-    const std::string text = formatted(format, arguments);
+    keep(keptLogs, format, arguments);
     va_end(arguments);
-    const std::lock_guard lock(mutex);
-    keptLogs.push_back(text);
 }

@@ -8,6 +8,7 @@
 
 #include <gtest/gtest.h>
 
+#include <algorithm>
 #include <cstddef>
 #include <cstdint>
 #include <cstring>
@@ -50,13 +51,10 @@ public:
 
     void fill(void *memory, size_t size) {
         auto *bytes = static_cast<uint8_t *>(memory);
-        for (; size >= sizeof(uint64_t); size -= sizeof(uint64_t), bytes += sizeof(uint64_t)) {
+        for (size_t i = 0; i < size; i += sizeof(uint64_t)) {
             const uint64_t word = bits();
-            std::memcpy(bytes, &word, sizeof(word));
+            std::memcpy(bytes + i, &word, std::min(size - i, sizeof(word)));
         }
-        const uint64_t rest = bits();
-        if (size != 0)
-            std::memcpy(bytes, &rest, size);
     }
 
 private:
@@ -66,17 +64,21 @@ private:
 uint64_t baseSeed();                // QUILLON_TEST_SEED, or a fixed one
 std::optional<uint64_t> onlyCase(); // QUILLON_TEST_CASE
 
-// Notes what is running, for the report of a crash (a fence that bit): a number
-// that is called what, and the instruction set.  Null where there is none.
-void noteStep(const char *what, uint64_t number);
-void noteTarget(const char *name);
+// What is running, for the report of a crash (a fence that bit).
+struct Running {
+    const char *target = "any";
+    uint64_t number = 0; // of the case
+};
+extern volatile Running running;
+void reportCrashes();
 
 // Runs run(random) for the cases 0 to count - 1, until one fails.
 template <class Run>
 void forEachCase(uint64_t count, const Run &run) {
+    reportCrashes();
     const std::optional<uint64_t> only = onlyCase();
     for (uint64_t number = only.value_or(0); number < (only ? *only + 1 : count); ++number) {
-        noteStep("QUILLON_TEST_CASE", number);
+        running.number = number;
         // Mixed once more, lest neighbouring cases share their numbers.
         Random random(Random(baseSeed() + number).bits());
         run(random);
@@ -85,7 +87,6 @@ void forEachCase(uint64_t count, const Run &run) {
             break;
         }
     }
-    noteStep(nullptr, 0);
 }
 
 } // namespace quillon::test

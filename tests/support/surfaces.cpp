@@ -6,154 +6,234 @@
 namespace quillon::test {
 namespace {
 
-constexpr size_t kTwinSize = 24576;
+constexpr uint32 kFencedRows = 3;
+constexpr uint32 kMost = UINT32_MAX;
+
+// The largest step there is downwards, and a step that only unsigned line
+// increments can have upwards.
+constexpr size_t kFar = size_t{1} << 31;
+
+std::array<TwinMemory, 4> four(size_t pages, size_t runs, size_t spacing) {
+    const auto one = [&] { return TwinMemory(pages * pageSize(), runs, spacing); };
+    return {one(), one(), one(), one()};
+}
+
+int64_t rowStep(int64_t line, const Part &part) {
+    const bool isUnit = part.bytes == 2 || part.bytes == 4;
+    return part.rule != RowRule::kExact && isUnit ? line & -int64_t{part.bytes} : line;
+}
+
+// Small, or up to the largest.
+uint32 randomCoordinate(Random &random) {
+    const uint32 small = random.below(100);
+    return random.oneOf({0u, small, small, random.word(), kMost - small});
+}
+
+uint32 randomWidth(Random &random) {
+    const uint32 width =
+        random.oneIn(16) ? 200 + random.below(600) : random.below(random.oneIn(4) ? 20 : 141);
+    return random.oneIn(4) ? width & ~7u : width; // bitmap rows of whole bytes
+}
+
+// Fitting the row, padded, shorter than the row, next to none.
+int64_t randomLine(Random &random, size_t rowBytes) {
+    const auto row = static_cast<uint32>(rowBytes);
+    return random.oneOf({row, row, row + random.below(10), row + random.below(10),
+                         row + random.below(300), random.below(row + 1), random.below(5)});
+}
 
 // The bytes from a rectangle's first pixel down to its lowest, and up to behind
 // its highest.
 struct Extent {
     int64_t below, above;
+};
 
-    Extent(Size size, size_t rowBytes, int64_t step) {
-        const int64_t last = (int64_t{size.height} - 1) * step;
-        below = std::max<int64_t>(0, -last);
-        above = std::max<int64_t>(0, last) + static_cast<int64_t>(rowBytes);
+// One call.
+struct Case {
+    const Operation &operation;
+    bool isInRows, isNear;
+    Size size;
+    std::array<TwinMemory, 4> &home; // for each surface
+    Surfaces at{operation.parts.size()};
+    std::vector<TwinMemory *> memories{operation.parts.size()};
+    bool isUpwards = false;
+
+    size_t rowBytes(size_t i) const { return operation.parts[i].rowBytes(size.width); }
+
+    // From each row to the next one that is walked.
+    int64_t step(size_t i) const {
+        return rowStep(isUpwards ? -at[i].line : at[i].line, operation.parts[i]);
+    }
+
+    Extent extent(size_t i) const {
+        const int64_t toLast = step(i) * (int64_t{size.height} - 1);
+        return {std::max<int64_t>(0, -toLast),
+                std::max<int64_t>(0, toLast) + static_cast<int64_t>(rowBytes(i))};
     }
 };
 
-testing::AssertionResult same(const uint8 *block, const uint8 *model, size_t size) {
-    if (std::memcmp(block, model, size) == 0)
-        return testing::AssertionSuccess();
-    const auto at = std::mismatch(block, block + size, model);
-    return testing::AssertionFailure() << "byte " << at.first - block << " of " << size << " is "
-                                       << int{*at.first} << ", should be " << int{*at.second};
+void drawCoordinates(Random &random, Case &c) {
+    const bool isOneCorner = c.operation.isOneCorner;
+    const bool isOneColumn = isOneCorner || random.oneIn(4);
+    const bool isOneRow = isOneCorner || random.oneIn(2);
+    const uint32 x = randomCoordinate(random), y = randomCoordinate(random);
+    for (Surface &surface : c.at) {
+        surface.x = isOneColumn ? x : randomCoordinate(random);
+        surface.y = isOneRow ? y : randomCoordinate(random);
+    }
+    // Rounded steps are taken from the first row that is walked.
+    c.isUpwards = c.at.size() == 2 && c.operation.parts[1].rule == RowRule::kRoundedSteps &&
+                  c.at[1].y < c.at[0].y;
 }
 
-size_t wholePages(size_t size) {
-    return (size + pageSize() - 1) / pageSize() * pageSize();
+void drawLine(Random &random, Case &c, size_t i) {
+    int64_t &line = c.at[i].line;
+    if (c.isInRows) {
+        const int64_t spacing = c.home[i].spacing();
+        const bool isDownwards = spacing > INT32_MAX || random.oneIn(2);
+        line = c.operation.isSigned && isDownwards ? -spacing : spacing;
+        return;
+    }
+    line = randomLine(random, c.rowBytes(i));
+    if (random.oneIn(4))
+        line = -line;
+    if (i > 0 && random.oneIn(2)) // as on surfaces of one size, or nearly
+        line = c.at[0].line + (c.isNear && random.oneIn(2) ? random.between(-20, 20) : 0);
+    if (!c.operation.isSigned)
+        line = std::abs(line);
+    for (; c.size.height > 1; --c.size.height) {
+        const Extent extent = c.extent(i);
+        if (extent.below + extent.above <= static_cast<int64_t>(c.home[i].runBytes()))
+            break;
+    }
+}
+
+// Where the first row that is walked begins.
+uint8 *drawFirst(Random &random, Case &c, size_t i, bool isFlushBehind, bool isNear) {
+    TwinMemory &memory = *c.memories[i];
+    if (c.isInRows)
+        return memory.run(c.step(i) < 0 ? kFencedRows - 1 : 0) +
+               (isFlushBehind ? memory.runBytes() - c.rowBytes(i) : 0);
+    if (isNear)
+        return memory.run(0) + memory.runBytes() / 2 + (i == 0 ? 0 : random.between(-128, 128));
+    const Extent extent = c.extent(i);
+    const int64_t room = static_cast<int64_t>(memory.runBytes()) - extent.below - extent.above;
+    const int64_t anywhere = random.below(static_cast<uint32>(room) + 1);
+    return memory.run(0) + extent.below + random.oneOf({int64_t{0}, room, room, anywhere});
+}
+
+void drawPlaces(Random &random, Case &c) {
+    const bool isFlushBehind = random.oneIn(2);
+    const uint32 nearest = c.at.size() < 3 ? 1 : 1 + random.below(3);
+    for (size_t i = 0; i < c.at.size(); ++i) {
+        const Part &part = c.operation.parts[i];
+        const bool isNear = c.isNear && (i == 0 || i == nearest || random.oneIn(2));
+        const bool isShared = isNear || (!c.isInRows && c.operation.mayOverlap && random.oneIn(3));
+        c.memories[i] = &c.home[isShared ? 0 : i];
+        Surface &surface = c.at[i];
+        surface.first = drawFirst(random, c, i, isFlushBehind, isNear);
+        const uint64_t row = uint64_t{surface.y} + (c.isUpwards ? c.size.height - 1 : 0);
+        const int64_t line =
+            part.rule == RowRule::kRounded ? rowStep(surface.line, part) : surface.line;
+        surface.buffer = reinterpret_cast<uint8 *>(reinterpret_cast<uintptr_t>(surface.first) -
+                                                   row * static_cast<uint64_t>(line) -
+                                                   uint64_t{surface.x} * part.bytes);
+    }
+}
+
+Surface moved(const Surface &surface, uint8 *first) {
+    const uintptr_t distance =
+        reinterpret_cast<uintptr_t>(first) - reinterpret_cast<uintptr_t>(surface.first);
+    auto *buffer =
+        reinterpret_cast<uint8 *>(reinterpret_cast<uintptr_t>(surface.buffer) + distance);
+    return {buffer, first, surface.line, surface.x, surface.y};
+}
+
+void compare(Random &random, const Case &c) {
+    Surfaces inModel = c.at, called = c.at;
+    for (size_t i = 0; i < c.at.size(); ++i) {
+        const Part &part = c.operation.parts[i];
+        c.memories[i]->refill(random, part.low, part.count);
+        inModel[i] = moved(c.at[i], c.memories[i]->inModel(c.at[i].first));
+        if (!part.isTouched)
+            called[i] = moved(c.at[i], c.memories[i]->nowhere());
+    }
+    c.operation.library(called, c.size);
+    c.operation.reference(inModel, c.size);
+    for (const TwinMemory *memory : c.memories)
+        EXPECT_TRUE(memory->agree());
+    if (testing::Test::HasFailure())
+        for (const Surface &surface : c.at)
+            ADD_FAILURE() << c.operation.name << ", " << c.size.width << " x " << c.size.height
+                          << " at " << surface.x << ", " << surface.y << ", line " << surface.line;
+}
+
+// Nothing is looked at when there is nothing to do, however large the rest.
+void callForNothing(Random &random, const Operation &operation, uint8 *nowhere) {
+    Surfaces at(operation.parts.size());
+    for (Surface &surface : at)
+        surface = {nowhere, nowhere, 64, random.below(9), random.below(9)};
+    const uint32 any = random.oneOf({0u, 1u, kMost});
+    const uint32 none = operation.parts[0].isTouched ? 0 : random.oneOf({0u, 1u, 999u, kMost});
+    operation.library(at, random.oneIn(2) ? Size{any, none} : Size{none, any});
 }
 
 } // namespace
 
-TwinMemory::TwinMemory() : block_(wholePages(kTwinSize)), model_(block_.size()) {}
-
-void TwinMemory::refill(Random &random, uint32 limit) {
-    random.fill(data(), size());
-    if (limit < 256)
-        std::transform(data(), data() + size(), data(),
-                       [=](uint8 byte) { return static_cast<uint8>(byte * limit >> 8); });
-    std::copy(data(), data() + size(), model_.begin());
+TwinMemory::TwinMemory(size_t runBytes, size_t runs, size_t spacing)
+    : runBytes_(runBytes), runs_(runs), spacing_(spacing),
+      pages_((runs - 1) * spacing + runBytes + 2 * pageSize()), model_(pages_.size()) {
+    for (size_t i = 0; i < runs; ++i)
+        for (Mapping *mapping : {&pages_, &model_})
+            mapping->open(pageSize() + i * spacing, runBytes);
 }
 
-Surface TwinMemory::inModel(const Surface &surface) const {
-    Surface model = surface;
-    model.buffer = reinterpret_cast<uint8 *>(reinterpret_cast<uintptr_t>(surface.buffer) -
-                                             reinterpret_cast<uintptr_t>(data()) +
-                                             reinterpret_cast<uintptr_t>(model_.data()));
-    return model;
+void TwinMemory::refill(Random &random, uint32 low, uint32 count) {
+    for (size_t i = 0; i < runs_; ++i) {
+        uint8 *bytes = run(i);
+        random.fill(bytes, runBytes_);
+        if (count < 256)
+            std::transform(bytes, bytes + runBytes_, bytes, [=](uint8 byte) {
+                return static_cast<uint8>(low + (byte * count >> 8));
+            });
+        std::copy_n(bytes, runBytes_, inModel(bytes));
+    }
 }
 
 testing::AssertionResult TwinMemory::agree() const {
-    return same(data(), model_.data(), size());
-}
-
-int64_t rowStep(int64_t line, int32 bytesPerPixel, RowRule rule) {
-    const bool isUnit = bytesPerPixel == 2 || bytesPerPixel == 4;
-    return rule != RowRule::kExact && isUnit ? line & ~int64_t{bytesPerPixel - 1} : line;
-}
-
-uint32 randomWidth(Random &random) {
-    switch (random.below(8)) {
-    case 0:
-        return 600 + random.below(700);
-    case 1:
-    case 2:
-        return random.below(20);
-    default:
-        return random.below(141);
-    }
-}
-
-int64_t randomLine(Random &random, size_t rowBytes, bool isSigned) {
-    const auto row = static_cast<uint32>(rowBytes);
-    int64_t line = row;
-    switch (random.below(8)) {
-    case 0:
-    case 1:
-        break; // rows end to end
-    case 2:
-        line = random.below(row + 1);
-        break;
-    case 3:
-        line = random.oneOf({0, 0, 1, 2, 3, 4});
-        break;
-    case 4:
-        line = row + random.below(300);
-        break;
-    default:
-        line = row + random.below(10);
-    }
-    return isSigned && random.oneIn(4) ? -line : line;
-}
-
-Size fitted(Size size, const TwinMemory &memory, size_t rowBytes, int64_t step) {
-    for (; size.height > 1; --size.height) {
-        const Extent extent(size, rowBytes, step);
-        if (extent.below + extent.above <= static_cast<int64_t>(memory.size()))
-            break;
-    }
-    return size;
-}
-
-uint8 *randomPlace(Random &random, const TwinMemory &memory, Size size, size_t rowBytes,
-                   int64_t step) {
-    const Extent extent(size, rowBytes, step);
-    const int64_t room = static_cast<int64_t>(memory.size()) - extent.below - extent.above;
-    int64_t ahead = room; // flush behind
-    if (random.oneIn(2))
-        ahead = random.oneIn(2) ? 0 : random.below(static_cast<uint32>(room) + 1);
-    return memory.data() + ahead + extent.below;
-}
-
-Surface surfaceAt(Random &random, uint8 *first, int64_t line, int32 bytesPerPixel, RowRule rule) {
-    const auto coordinate = [&] {
-        const uint32 small = random.below(100);
-        return random.oneOf({0u, small, small, random.word(), UINT32_MAX - small});
-    };
-    Surface surface = {nullptr, line, coordinate(), coordinate()};
-    const int64_t lineToFirst =
-        rule == RowRule::kRounded ? rowStep(line, bytesPerPixel, rule) : line;
-    const uint64_t offset = surface.y * static_cast<uint64_t>(lineToFirst) +
-                            surface.x * static_cast<uint64_t>(bytesPerPixel);
-    surface.buffer = reinterpret_cast<uint8 *>(reinterpret_cast<uintptr_t>(first) - offset);
-    return surface;
-}
-
-TwinRows::TwinRows() : rows_(kHeight), model_(kHeight * pageSize()) {}
-
-void TwinRows::refill(Random &random) {
-    random.fill(model_.data(), model_.size());
-    for (size_t row = 0; row < kHeight; ++row)
-        std::copy_n(model_.data() + row * pageSize(), pageSize(), rows_.page(row));
-}
-
-Surface TwinRows::fenced(FencedBuffer::Flush flush, size_t rowBytes) const {
-    uint8 *first =
-        flush == FencedBuffer::Flush::kBefore ? rows_.flushBefore() : rows_.flushBehind(rowBytes);
-    return {first, FencedRows::step(), 0, 0};
-}
-
-Surface TwinRows::inModel(FencedBuffer::Flush flush, size_t rowBytes) {
-    const size_t ahead = flush == FencedBuffer::Flush::kBefore ? 0 : pageSize() - rowBytes;
-    return {model_.data() + ahead, static_cast<int64_t>(pageSize()), 0, 0};
-}
-
-testing::AssertionResult TwinRows::agree() const {
-    for (size_t row = 0; row < kHeight; ++row) {
-        auto result = same(rows_.page(row), model_.data() + row * pageSize(), pageSize());
-        if (!result)
-            return result << " (row " << row << ")";
+    for (size_t i = 0; i < runs_; ++i) {
+        const uint8 *bytes = run(i), *model = inModel(run(i));
+        if (std::memcmp(bytes, model, runBytes_) == 0)
+            continue;
+        const auto at = std::mismatch(bytes, bytes + runBytes_, model).first - bytes;
+        return testing::AssertionFailure() << "byte " << at << " of run " << i << " is "
+                                           << int{bytes[at]} << ", should be " << int{model[at]};
     }
     return testing::AssertionSuccess();
+}
+
+Arena::Arena()
+    : blocks_(four(6, 1, 0)), rows_(four(1, kFencedRows, 2 * pageSize())),
+      farRows_(four(1, kFencedRows, kFar)) {}
+
+void Arena::check(Random &random, const Operation &operation) {
+    if (!operation.parts[0].isTouched || random.oneIn(32))
+        return callForNothing(random, operation, random.oneIn(4) ? nullptr : blocks_[0].nowhere());
+
+    const bool isFar = random.oneIn(16), isInRows = isFar || random.oneIn(3);
+    const bool isNear = !isInRows && operation.mayOverlap && random.oneIn(2);
+    Size size = {randomWidth(random), random.below(random.oneIn(16) ? 40 : 6)};
+    if (isInRows)
+        size = {random.below(141), kFencedRows};
+    else if (isNear)
+        size = {random.below(100), 1 + random.below(4)};
+
+    Case c = {operation, isInRows, isNear, size, isFar ? farRows_ : isInRows ? rows_ : blocks_};
+    drawCoordinates(random, c);
+    for (size_t i = 0; i < c.at.size(); ++i)
+        drawLine(random, c, i);
+    drawPlaces(random, c);
+    compare(random, c);
 }
 
 } // namespace quillon::test

@@ -1,94 +1,110 @@
-// Random rectangles on random surfaces, in fenced memory that has a model.
+// Operations on rectangles, held to their reference: on random surfaces, in
+// fenced memory that has a model.
 #pragma once
 
 #include "quillonTypes.h"
 #include "support/fence.h"
-#include "support/random.h"
+#include "support/targets.h"
 
-#include <gtest/gtest.h>
-
+#include <array>
+#include <functional>
+#include <string>
 #include <vector>
 
 namespace quillon::test {
 
+// Runs of pages between inaccessible ones, and their model.  The call under
+// test works on the pages, the reference on the model, and then they have to
+// agree.
+class TwinMemory {
+public:
+    TwinMemory(size_t runBytes, size_t runs, size_t spacing); // in whole pages
+
+    uint8 *run(size_t index) const { return pages_.data() + pageSize() + index * spacing_; }
+    uint8 *nowhere() const { return pages_.data(); }
+    size_t runBytes() const { return runBytes_; }
+    int64_t spacing() const { return static_cast<int64_t>(spacing_); }
+
+    // New bytes, from low to low + count - 1 each.
+    void refill(Random &random, uint32 low = 0, uint32 count = 256);
+
+    uint8 *inModel(uint8 *address) const { return model_.data() + (address - pages_.data()); }
+
+    testing::AssertionResult agree() const;
+
+private:
+    size_t runBytes_, runs_, spacing_;
+    Mapping pages_, model_;
+};
+
 // How the rows of a surface follow each other, see raster.h.
 enum class RowRule { kExact, kRoundedSteps, kRounded };
 
-// A surface, and where on it a rectangle begins.
+// A surface, and a rectangle on it: its corner, and the address of its first pixel.
 struct Surface {
     uint8 *buffer; // of pixel (0, 0), which may lie outside of memory
+    uint8 *first;
     int64_t line;
     uint32 x, y;
 
     int32 signedLine() const { return static_cast<int32>(line); }
     uint32 unsignedLine() const { return static_cast<uint32>(line); }
 };
+using Surfaces = std::vector<Surface>;
 
 struct Size {
     uint32 width, height;
 };
 
-// A fenced block and its model, alike to begin with.  The call under test works
-// on the block, the reference on the model, and then they have to agree.
-class TwinMemory {
-public:
-    TwinMemory();
+// What a surface is to an operation.
+struct Part {
+    uint32 bytes; // per pixel, or 0: the pixels are bits
+    RowRule rule = RowRule::kExact;
+    uint32 low = 0, count = 256; // the values that bytes may have
+    bool isTouched = true;
 
-    uint8 *data() const { return block_.data(); }
-    size_t size() const { return block_.size(); }
-
-    // New bytes, below limit each.
-    void refill(Random &random, uint32 limit = 256);
-
-    // The same place in the model.
-    Surface inModel(const Surface &surface) const;
-
-    testing::AssertionResult agree() const;
-
-private:
-    FencedBuffer block_;
-    std::vector<uint8> model_;
+    size_t rowBytes(uint32 width) const {
+        return bytes == 0 ? (size_t{width} + 7) / 8 : size_t{width} * bytes;
+    }
 };
 
-// What a row step comes to, in bytes.
-int64_t rowStep(int64_t line, int32 bytesPerPixel, RowRule rule);
+// A call with all its arguments but the surfaces, of which the first is the
+// destination, and the size.
+struct Operation {
+    std::string name;
+    std::vector<Part> parts;
+    std::function<void(const Surfaces &, Size)> library, reference;
+    bool mayOverlap = true;
+    bool isSigned = true;     // the line increments
+    bool isOneCorner = false; // the coordinates are the same on all surfaces
 
-// 0 to about 140 pixels, or a good many more.
-uint32 randomWidth(Random &random);
+    template <class Library, class Reference, class Call>
+    Operation(std::string title, std::vector<Part> surfaces, Library libraryFunction,
+              Reference referenceFunction, const Call &call)
+        : name(std::move(title)), parts(std::move(surfaces)),
+          library([=](const Surfaces &at, Size size) { call(libraryFunction, at, size); }),
+          reference([=](const Surfaces &at, Size size) { call(referenceFunction, at, size); }) {}
+};
 
-// A line increment for rows of the given length: fitting, padded, odd, shorter
-// than the row, 0; with isSigned also the negative of these.
-int64_t randomLine(Random &random, size_t rowBytes, bool isSigned);
-
-// The size with its height cut down until the rectangle fits the memory.
-Size fitted(Size size, const TwinMemory &memory, size_t rowBytes, int64_t step);
-
-// A rectangle somewhere in the memory, often flush against one of its fences.
-uint8 *randomPlace(Random &random, const TwinMemory &memory, Size size, size_t rowBytes,
-                   int64_t step);
-
-// The surface on which the first pixel of a rectangle has the given address, at
-// random coordinates that go up to the largest.
-Surface surfaceAt(Random &random, uint8 *first, int64_t line, int32 bytesPerPixel, RowRule rule);
-
-// Three rows with fences at one edge of each, and their model.
-class TwinRows {
+class Arena {
 public:
-    static constexpr uint32 kHeight = 3;
+    Arena();
 
-    TwinRows();
-
-    void refill(Random &random);
-
-    // The rows of a rectangle at the fences before or behind, and in the model.
-    Surface fenced(FencedBuffer::Flush flush, size_t rowBytes) const;
-    Surface inModel(FencedBuffer::Flush flush, size_t rowBytes);
-
-    testing::AssertionResult agree() const;
+    // One call: anywhere in memory, often flush against a fence; or with
+    // surfaces so near that a vector can run into itself; or with a fence at an
+    // edge of every row, the rows up to 2 GB apart; or with nothing to do.
+    void check(Random &random, const Operation &operation);
 
 private:
-    FencedRows rows_;
-    std::vector<uint8> model_;
+    std::array<TwinMemory, 4> blocks_, rows_, farRows_; // for each surface
 };
+
+// Random operations, on every instruction set.
+template <class Draw>
+void holdToReference(uint64_t cases, const Draw &draw) {
+    Arena arena;
+    forEachTarget(
+        [&] { forEachCase(cases, [&](Random &random) { arena.check(random, draw(random)); }); });
+}
 
 } // namespace quillon::test

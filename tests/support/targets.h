@@ -18,15 +18,14 @@ void forEachTarget(const Run &run) {
     struct Restore {
         ~Restore() {
             hwy::SetSupportedTargetsForTest(0);
-            noteTarget(nullptr);
-            noteStep(nullptr, 0);
+            running.target = "any";
         }
     } const restore;
     const std::vector<int64_t> targets = hwy::SupportedAndGeneratedTargets();
     ASSERT_FALSE(targets.empty());
     for (const int64_t target : targets) {
         SCOPED_TRACE(hwy::TargetName(target));
-        noteTarget(hwy::TargetName(target));
+        running.target = hwy::TargetName(target);
         hwy::SetSupportedTargetsForTest(target);
         run();
         if (testing::Test::HasFailure())
