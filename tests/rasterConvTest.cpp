@@ -62,6 +62,7 @@ void convertByReference(const Pair &pair, uint32 /*way*/, const Surfaces &at, Si
 
 TEST(ConvertPixels, matchesReference) {
     const FencedBuffer colors(256 * sizeof(uint32));
+    const FencedBuffer highColors(256 * sizeof(uint32), FencedBuffer::Flush::kBefore);
     holdToReference(20000, [&](Random &random) {
         Pair pair = {kSources[random.below(4)], kLayouts[random.below(7)], random.oneIn(4),
                      nullptr};
@@ -71,10 +72,19 @@ TEST(ConvertPixels, matchesReference) {
             pair.dstDepth = pair.srcDepth;
         Part src = {pair.pseudoColor ? 1 : bytesOf(pair.srcDepth)};
         if (pair.pseudoColor) {
-            pair.srcDepth = random.oneOf({8, 4, 0, -15, INT32_MIN});   // all mean one byte
-            src.count = random.oneIn(2) ? 256 : 1 + random.below(256); // there are no more entries
-            random.fill(colors.data(), colors.size());
-            pair.palette = reinterpret_cast<const uint32 *>(colors.end()) - src.count;
+            pair.srcDepth = random.oneOf({8, 4, 0, -15, INT32_MIN}); // all mean one byte
+            // There are no entries but those that pixels use, on one side at least.
+            const uint32 edge = random.below(256);
+            if (random.oneIn(2)) {
+                src.count = edge + 1;
+                random.fill(colors.data(), colors.size());
+                pair.palette = reinterpret_cast<const uint32 *>(colors.end()) - src.count;
+            } else {
+                src.low = edge;
+                src.count = 256 - edge;
+                random.fill(highColors.data(), highColors.size());
+                pair.palette = reinterpret_cast<const uint32 *>(highColors.data()) - src.low;
+            }
         }
         const bool isCopy = !pair.pseudoColor && pair.srcDepth == pair.dstDepth;
         const bool isExact = isCopy || (pair.pseudoColor && pair.dstDepth == 32);

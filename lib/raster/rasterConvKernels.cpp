@@ -107,9 +107,19 @@ struct FromIndex {
 
     template <class D>
     HWY_INLINE static hn::Vec<D> load(D d, const uint8_t *src, const uint32_t *palette) {
-        const hn::Rebind<int32_t, D> index;
-        const hn::Rebind<uint8_t, D> d8;
-        return hn::GatherIndex(d, palette, hn::PromoteTo(index, hn::LoadU(d8, src)));
+        // A gather of less than four lanes would look up the lanes that are not
+        // there, too.
+        constexpr size_t n = kLanes<D>;
+        if constexpr (n == 1) {
+            return hn::Set(d, palette[src[0]]);
+        } else if constexpr (n == 2) {
+            const hn::Repartition<uint64_t, D> d64;
+            return hn::BitCast(d, hn::Set(d64, palette[src[0]] | uint64_t{palette[src[1]]} << 32));
+        } else {
+            const hn::Rebind<int32_t, D> index;
+            const hn::Rebind<uint8_t, D> d8;
+            return hn::GatherIndex(d, palette, hn::PromoteTo(index, hn::LoadU(d8, src)));
+        }
     }
 };
 
