@@ -35,7 +35,7 @@ HWY_INLINE V shiftedRight(V v) {
 // Pixels moved into a one-byte layout, in lanes of any width.
 template <ChannelEnds kEnds, int kDepth, class D>
 HWY_INLINE hn::Vec<D> toSmall(D d, hn::Vec<D> v) {
-    constexpr auto &mask = RasterSmallMasks[kDepth];
+    constexpr const auto &mask = RasterSmallMasks[kDepth];
     const auto red = shiftedRight<shiftToMask(kEnds.red, mask[0])>(v);
     const auto green = shiftedRight<shiftToMask(kEnds.green, mask[1])>(v);
     const auto blue = shiftedRight<shiftToMask(kEnds.blue, mask[2])>(v);
