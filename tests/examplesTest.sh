@@ -7,15 +7,7 @@ set -u
 
 example=$1
 programs=$(realpath "$2")
-directory=$(mktemp -d)
-trap 'rm -rf "$directory"' EXIT
-cd "$directory" || exit 1
-failures=0
-
-complain() {
-    echo "FAILED: $*" >&2
-    failures=$((failures + 1))
-}
+. "$(dirname "$0")/support/scratch.sh"
 
 # same WHAT WANTED FOUND
 same() {

@@ -8,15 +8,7 @@ set -u
 
 gallery=$(realpath "$1")
 pictures=$(realpath "$2")
-directory=$(mktemp -d)
-trap 'rm -rf "$directory"' EXIT
-cd "$directory" || exit 1
-failures=0
-
-complain() {
-    echo "FAILED: $*" >&2
-    failures=$((failures + 1))
-}
+. "$(dirname "$0")/support/scratch.sh"
 
 # 4 by 2 pixels of a palette, one pixel of RGB, and 4 by 2 pixels of grey.
 base64 -d > palette.png <<'END'

@@ -6,15 +6,7 @@
 set -u
 
 thumbnail=$(realpath "$1")
-directory=$(mktemp -d)
-trap 'rm -rf "$directory"' EXIT
-cd "$directory" || exit 1
-failures=0
-
-complain() {
-    echo "FAILED: $*" >&2
-    failures=$((failures + 1))
-}
+. "$(dirname "$0")/support/scratch.sh"
 
 # Pictures of 4 by 2 pixels.
 base64 -d > rgba.png <<'END'

@@ -4,6 +4,7 @@
 
 #include "imageUtil.h"
 #include "raster.h"
+#include "raster/pixelLayout.h"
 
 #include <cstddef>
 #include <cstdint>
@@ -27,7 +28,7 @@ inline int32 conversionDepth(const ImageInfo &image) {
 
 // The bytes of a pixel that Raster_ConvertPixels reads at a depth.
 constexpr uint32 bytesAtDepth(int32 depth) {
-    return depth == 15 ? 2 : static_cast<uint32>(depth) / 8;
+    return static_cast<uint32>(bytesPerPixelOf(depth));
 }
 
 // True when Raster_ConvertPixels widens pixels of the depth.  Otherwise it is

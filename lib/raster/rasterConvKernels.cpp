@@ -202,25 +202,24 @@ struct ThroughWords {
 };
 
 struct Widen15To16 {
-    using Lane = uint16_t;
-    static constexpr size_t kSrcBytes = 2;
-    static constexpr size_t kDstBytes = 2;
-
-    uint8_t *dst;
-    const uint8_t *src;
-    const uint32_t *palette;
-
     template <class D>
-    HWY_INLINE void operator()(D d, size_t i) const {
-        const auto p = hn::LoadU(d, reinterpret_cast<const uint16_t *>(src + 2 * i));
+    HWY_INLINE static hn::Vec<D> converted(D d, hn::Vec<D> p) {
         const auto wide =
             hn::Or(hn::ShiftLeft<1>(masked(d, p, 0x7FE0)), hn::ShiftRight<4>(masked(d, p, 0x0200)));
-        hn::StoreU(hn::Or(masked(d, p, 0x001F), wide), d,
-                   reinterpret_cast<uint16_t *>(dst + 2 * i));
+        return hn::Or(masked(d, p, 0x001F), wide);
     }
 };
 
 struct Narrow16To15 {
+    template <class D>
+    HWY_INLINE static hn::Vec<D> converted(D d, hn::Vec<D> p) {
+        return hn::Or(masked(d, p, 0x001F), masked(d, hn::ShiftRight<1>(p), 0x7FE0));
+    }
+};
+
+// From one layout of 16 bits to the other.
+template <class Conversion>
+struct Within16 {
     using Lane = uint16_t;
     static constexpr size_t kSrcBytes = 2;
     static constexpr size_t kDstBytes = 2;
@@ -232,9 +231,7 @@ struct Narrow16To15 {
     template <class D>
     HWY_INLINE void operator()(D d, size_t i) const {
         const auto p = hn::LoadU(d, reinterpret_cast<const uint16_t *>(src + 2 * i));
-        const auto high = masked(d, hn::ShiftRight<1>(p), 0x7FE0);
-        hn::StoreU(hn::Or(masked(d, p, 0x001F), high), d,
-                   reinterpret_cast<uint16_t *>(dst + 2 * i));
+        hn::StoreU(Conversion::converted(d, p), d, reinterpret_cast<uint16_t *>(dst + 2 * i));
     }
 };
 
@@ -296,8 +293,8 @@ void convertWords(Layout dstLayout, const Job &job) {
     }
 }
 
-// From 15 or 16; Across goes to the other of the two.
-template <class Source, ChannelEnds kEnds, class Across>
+// From 15 or 16; Conversion goes to the other of the two.
+template <class Source, ChannelEnds kEnds, class Conversion>
 void convert16(Layout dstLayout, const Job &job) {
     switch (dstLayout) {
     case Layout::Small3:
@@ -308,7 +305,7 @@ void convert16(Layout dstLayout, const Job &job) {
         return walkRows<From16ToSmall<kEnds, 8>>(job);
     case Layout::Rgb15:
     case Layout::Rgb16:
-        return walkRows<Across>(job);
+        return walkRows<Within16<Conversion>>(job);
     case Layout::Rgb24:
         return walkRows<ThroughWords<Source, To24>>(job);
     case Layout::Rgb32:
