@@ -65,42 +65,18 @@ TEST(YuvToRgb, everyTriple) {
     }
 }
 
-// luma 100, U 90, V 200: 298 * 84 = 25032, U - 128 = -38, V - 128 = 72.
-// low  (25032 - 15542 + 128) >> 8 = 37
-// mid  (25032 + 7904 - 7200 + 128) >> 8 = 101
-// high (25032 + 37152 + 128) >> 8 = 243
-TEST(YuvToRgb, knownValues) {
-    const uint8 frames[][6] = {
-        {100, 90, 100, 200}, {90, 100, 200, 100}, {100, 100, 100, 100, 200, 90}};
-    const std::pair<int32, uint32> pixels[] = {{15, 30 << 11 | 12 << 6 | 4 << 1},
-                                               {16, 30 << 11 | 25 << 5 | 4},
-                                               {24, 0xF36525},
-                                               {32, 0xF36525}};
-    for (size_t i = 0; i < 3; ++i)
-        for (const auto &[depth, pixel] : pixels) {
-            uint32 dst[4] = {};
-            Raster_YUVtoRGB(frames[i], reinterpret_cast<uint8 *>(dst), 2, i == 2 ? 2 : 1,
-                            kFormats[i], depth);
-            EXPECT_EQ(dst[0] & (depth < 24 ? 0xFFFF : 0xFFFFFF), pixel) << depth;
-        }
-}
-
 TEST(YuvToRgb, touchesNothingWhereThereIsNothingToDo) {
     const FencedBuffer fence(1);
-    for (const int32 depth : kDepths)
-        for (const uint32 large : {1u, UINT32_MAX}) {
-            for (const uint32 format : kFormats) {
-                Raster_YUVtoRGB(fence.end(), fence.end(), 0, large, format, depth);
-                Raster_YUVtoRGB(fence.end(), fence.end(), large, 0, format, depth);
-            }
-            Raster_YUVtoRGB(fence.end(), fence.end(), large, 1, RASTER_VIDEO_YV12, depth);
-            Raster_YUVtoRGB(fence.end(), fence.end(), 1, large, RASTER_VIDEO_YV12, depth);
-        }
+    const std::pair<uint32, uint32> sizes[] = {{0, UINT32_MAX}, {UINT32_MAX, 0}, {1, 1}};
+    for (const auto &[width, height] : sizes)
+        for (const int32 depth : kDepths)
+            for (const uint32 format : kFormats)
+                Raster_YUVtoRGB(fence.end(), fence.end(), width, height, format, depth);
+    Raster_YUVtoRGB(fence.end(), fence.end(), UINT32_MAX, 1, RASTER_VIDEO_YV12, 32);
+    Raster_YUVtoRGB(fence.end(), fence.end(), 1, UINT32_MAX, RASTER_VIDEO_YV12, 32);
 }
 
 TEST(YuvToBgrx, matchesReference) {
-    EXPECT_EQ(RasterRGB_YUVtoBGRX(235, 128, 128), 0x00FEFEFEu);
-    EXPECT_EQ(RasterRGB_YUVtoBGRX(100, 90, 200), 0x00D43615u);
     forEachCase(300000, [](Random &random) {
         // Samples, samples out of range, and any int32 at all.
         const auto [low, high] =
@@ -166,37 +142,23 @@ TEST(ApplyColorKey, matchesReference) {
             key |= random.below(limit) << (8 * i);
         if (bytes == 4 || random.oneIn(8))
             key |= random.word() << (8 * std::min(bytes, 3u));
-        Operation operation(
-            "key of depth " + std::to_string(depth),
-            {{4}, {4}, {4}, {.bytes = bytes, .low = 0, .count = limit}}, Raster_ApplyColorKey,
-            reference::applyColorKey, [=](auto function, const Surfaces &at, Size size) {
-                function(at[1].buffer, at[0].buffer, at[2].first, at[3].buffer, at[1].signedLine(),
-                         at[0].signedLine(), at[2].signedLine(), at[3].signedLine(), key, at[0].x,
-                         at[0].y, size.width, size.height, depth);
-            });
-        operation.isOneCorner = true;
-        return operation;
+        const uint32 compared = depth == 32 ? 0x00FFFFFF : 0xFFFFFFFF;
+        return Operation{.name = "key of depth " + std::to_string(depth),
+                         .parts = {{4}, {4}, {4}, {.bytes = bytes, .low = 0, .count = limit}},
+                         .library =
+                             [=](const Surfaces &at, Size size) {
+                                 Raster_ApplyColorKey(at[1].buffer, at[0].buffer, at[2].first,
+                                                      at[3].buffer, at[1].signedLine(),
+                                                      at[0].signedLine(), at[2].signedLine(),
+                                                      at[3].signedLine(), key, at[0].x, at[0].y,
+                                                      size.width, size.height, depth);
+                             },
+                         .reference =
+                             [=](const Pixels &old) {
+                                 return (old[3] & compared) == (key & compared) ? old[2] : old[1];
+                             },
+                         .isOneCorner = true};
     });
-}
-
-TEST(ApplyColorKey, bitsThatCount) {
-    const auto matches = [&](uint32 pixel, uint32 key, uint32 keyDepth) {
-        const uint32 background = 0xB0000001, overlay = 0xA0000002;
-        uint32 dst = 0;
-        const auto bytes = [](const uint32 &word) {
-            return reinterpret_cast<const uint8 *>(&word);
-        };
-        Raster_ApplyColorKey(bytes(background), reinterpret_cast<uint8 *>(&dst), bytes(overlay),
-                             bytes(pixel), 4, 4, 4, 4, key, 0, 0, 1, 1, keyDepth);
-        EXPECT_TRUE(dst == background || dst == overlay) << dst;
-        return dst == overlay;
-    };
-    EXPECT_TRUE(matches(0x00123456, 0xFF123456, 32)); // the top byte does not
-    EXPECT_FALSE(matches(0x00123457, 0x00123456, 32));
-    EXPECT_TRUE(matches(0xFFFF2345, 0x00002345, 16));
-    EXPECT_FALSE(matches(0xFFFF2345, 0x00012345, 16)); // all of the key does
-    EXPECT_TRUE(matches(0xFFFFFF45, 0x45, 33));
-    EXPECT_FALSE(matches(0xFFFFFF45, 0x145, 8));
 }
 
 } // namespace

@@ -70,6 +70,12 @@ struct Case {
         return {std::max<int64_t>(0, -toLast),
                 std::max<int64_t>(0, toLast) + static_cast<int64_t>(rowBytes(i))};
     }
+
+    bool overlaps() const {
+        const Extent dst = extent(0), src = extent(1);
+        return memories[0] == memories[1] && at[0].first - dst.below < at[1].first + src.above &&
+               at[1].first - src.below < at[0].first + dst.above;
+    }
 };
 
 void drawCoordinates(Random &random, Case &c) {
@@ -82,8 +88,7 @@ void drawCoordinates(Random &random, Case &c) {
         surface.y = isOneRow ? y : randomCoordinate(random);
     }
     // Rounded steps are taken from the first row that is walked.
-    c.isUpwards = c.at.size() == 2 && c.operation.parts[1].rule == RowRule::kRoundedSteps &&
-                  c.at[1].y < c.at[0].y;
+    c.isUpwards = c.operation.walk == Walk::kAwayFromSource && c.at[1].y < c.at[0].y;
 }
 
 void drawLine(Random &random, Case &c, size_t i) {
@@ -131,7 +136,8 @@ void drawPlaces(Random &random, Case &c) {
         const bool isShared = isNear || (!c.isInRows && c.operation.mayOverlap && random.oneIn(3));
         c.memories[i] = &c.home[isShared ? 0 : i];
         Surface &surface = c.at[i];
-        surface.first = drawFirst(random, c, i, isFlushBehind, isNear);
+        surface.first = part.isTouched ? drawFirst(random, c, i, isFlushBehind, isNear)
+                                       : c.memories[i]->nowhere();
         const uint64_t row = uint64_t{surface.y} + (c.isUpwards ? c.size.height - 1 : 0);
         const int64_t line =
             part.rule == RowRule::kRounded ? rowStep(surface.line, part) : surface.line;
@@ -141,25 +147,45 @@ void drawPlaces(Random &random, Case &c) {
     }
 }
 
-Surface moved(const Surface &surface, uint8 *first) {
-    const uintptr_t distance =
-        reinterpret_cast<uintptr_t>(first) - reinterpret_cast<uintptr_t>(surface.first);
-    auto *buffer =
-        reinterpret_cast<uint8 *>(reinterpret_cast<uintptr_t>(surface.buffer) + distance);
-    return {buffer, first, surface.line, surface.x, surface.y};
+// Carries out the operation in the model.
+void walk(const Case &c) {
+    const std::vector<Part> &parts = c.operation.parts;
+    const bool isRowByRow = c.operation.walk == Walk::kRowByRow;
+    const bool isAway = c.operation.walk == Walk::kAwayFromSource;
+    const bool isSplit = isRowByRow || (isAway && parts[0].bytes == 3);
+    const uint32 split = isSplit ? parts[0].bytes : 1;
+    const auto address = [&](size_t i, int64_t row, int64_t column) {
+        const int64_t bits = parts[i].bytes == 0 ? 1 : 8 * parts[i].bytes / split;
+        return c.memories[i]->inModel(c.at[i].first + row * c.step(i) + column * bits / 8);
+    };
+    const auto pixel = [&](size_t i, int64_t row, int64_t column) {
+        uint32 value = 0;
+        std::memcpy(&value, address(i, row, column), std::max(parts[i].bytes / split, 1u));
+        return parts[i].bytes == 0 ? value >> (7 - column % 8) & 1 : value;
+    };
+    const int64_t width = int64_t{c.size.width} * split, height = c.size.height;
+    const bool isFromLast = isRowByRow && c.at[1].y < c.at[0].y && c.overlaps();
+    for (int64_t i = 0; i < height; ++i) {
+        const int64_t row = isFromLast ? height - 1 - i : i;
+        const bool isLeftwards = (isRowByRow && address(1, row, 0) < address(0, row, 0)) ||
+                                 (isAway && c.at[1].y == c.at[0].y && c.at[1].x < c.at[0].x);
+        for (int64_t j = 0; j < width; ++j) {
+            const int64_t column = isLeftwards ? width - 1 - j : j;
+            Pixels pixels = {};
+            for (size_t k = 0; k < parts.size(); ++k)
+                if (parts[k].isTouched)
+                    pixels[k] = pixel(k, row, column);
+            const uint32 result = c.operation.reference(pixels);
+            std::memcpy(address(0, row, column), &result, parts[0].bytes / split);
+        }
+    }
 }
 
 void compare(Random &random, const Case &c) {
-    Surfaces inModel = c.at, called = c.at;
-    for (size_t i = 0; i < c.at.size(); ++i) {
-        const Part &part = c.operation.parts[i];
-        c.memories[i]->refill(random, part.low, part.count);
-        inModel[i] = moved(c.at[i], c.memories[i]->inModel(c.at[i].first));
-        if (!part.isTouched)
-            called[i] = moved(c.at[i], c.memories[i]->nowhere());
-    }
-    c.operation.library(called, c.size);
-    c.operation.reference(inModel, c.size);
+    for (size_t i = 0; i < c.at.size(); ++i)
+        c.memories[i]->refill(random, c.operation.parts[i].low, c.operation.parts[i].count);
+    c.operation.library(c.at, c.size);
+    walk(c);
     for (const TwinMemory *memory : c.memories)
         EXPECT_TRUE(memory->agree());
     if (testing::Test::HasFailure())
