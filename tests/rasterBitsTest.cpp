@@ -49,9 +49,9 @@ Operation expansion(Random &random, bool isStencil) {
 }
 
 TEST(BitsToPixels, matchesReference) {
-    clearMessages();
+    warnings.clear();
     holdToReference(16000, [](Random &random) { return expansion(random, random.oneIn(2)); });
-    EXPECT_TRUE(warnings().empty());
+    EXPECT_TRUE(warnings.empty());
 }
 
 // A page of which pixels under set bits are part, amid inaccessible ones where
@@ -127,7 +127,7 @@ TEST(BitsToPixelsStencil, leavesClearPixelsToAnotherThread) {
 TEST(BitsToPixels, touchesNothingWhereThereIsNothingToDo) {
     const FencedBuffer fence(1);
     uint8 *nowhere = fence.end();
-    clearMessages();
+    warnings.clear();
     const auto call = [&](int32 bytes, int32 width) {
         Raster_BitsToPixels(nowhere, 8, nowhere, 64, bytes, width, 9, 1, 2);
         Raster_BitsToPixelsStencil(nowhere, 8, nowhere, 64, bytes, width, 9, 1);
@@ -137,7 +137,7 @@ TEST(BitsToPixels, touchesNothingWhereThereIsNothingToDo) {
             call(bytes, width);
     for (const int32 bytes : {0, 5, -1, 8, 0x101, INT32_MIN, INT32_MAX})
         call(bytes, 9);
-    EXPECT_TRUE(warnings().empty());
+    EXPECT_TRUE(warnings.empty());
 }
 
 } // namespace

@@ -184,9 +184,9 @@ TEST(Conversions, refuseUnknownDepths) {
     const Surface nowhere = {fence.end(), fence.end(), 4, 0, 0};
     const uint32 palette[] = {0};
     const auto refuses = [&](const std::string &text, int32 depth, const auto &call) {
-        panicLine(expectPanic(call), "NOT_IMPLEMENTED lib/raster/rasterConv");
-        EXPECT_EQ(warnings(), std::vector<std::string>{"Raster convert " + text + ' ' +
-                                                       std::to_string(depth) + '\n'});
+        expectPanic("NOT_IMPLEMENTED lib/raster/rasterConv", call);
+        EXPECT_EQ(warnings, std::vector<std::string>{"Raster convert " + text + ' ' +
+                                                     std::to_string(depth) + '\n'});
     };
     const auto check = [&](int32 src, int32 dst, bool pseudo, uint32 side) {
         const char *const kPseudo = "pixels invalid depth for pseudo color";

@@ -75,7 +75,7 @@ Operation blend() {
 }
 
 TEST(Raster, matchesReference) {
-    clearMessages();
+    warnings.clear();
     holdToReference(40000, [](Random &random) {
         const uint32 bytes = 1 + random.below(4), rop = randomRop(random);
         const uint32 pixel = random.oneIn(4) ? random.below(256) * 0x01010101 : random.word();
@@ -96,7 +96,7 @@ TEST(Raster, matchesReference) {
             return copy(rop, bytes, true);
         }
     });
-    EXPECT_TRUE(warnings().empty());
+    EXPECT_TRUE(warnings.empty());
 }
 
 // Every alpha over every destination value.
@@ -124,8 +124,8 @@ TEST(Raster, unsupportedDepth) {
     const FencedBuffer fence(1);
     uint8 *nowhere = fence.end();
     const auto refuses = [](const auto &call) {
-        panicLine(expectPanic(call), "NOT_IMPLEMENTED lib/raster/rasterops");
-        EXPECT_EQ(warnings(), std::vector<std::string>{"Raster: Unsupported frame buffer depth\n"});
+        expectPanic("NOT_IMPLEMENTED lib/raster/rasterops", call);
+        EXPECT_EQ(warnings, std::vector<std::string>{"Raster: Unsupported frame buffer depth\n"});
     };
     for (const int32 bytes : {0, 5, -1, 7, 0x101, INT32_MIN, INT32_MAX})
         for (const uint32 width : {0u, 1u}) {

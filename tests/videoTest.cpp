@@ -28,7 +28,6 @@ void expectConverted(Random &random, uint32 width, uint32 height, uint32 format,
     std::vector<uint8> expected(dst.data(), dst.end());
     Raster_YUVtoRGB(src.data(), dst.data(), width, height, format, bppdepth);
     reference::yuvToRgb(src.data(), expected.data(), width, height, format, bppdepth);
-    EXPECT_TRUE(dst.canariesIntact());
     EXPECT_TRUE(std::equal(dst.data(), dst.end(), expected.begin()))
         << std::hex << format << std::dec << " to " << bppdepth << ", " << width << " x " << height;
 }
@@ -111,7 +110,6 @@ TEST(VideoAttributes, geometry) {
 
 // Each message has a latch of its own; the depth is looked at first.
 TEST(VideoMessages, comeOnce) {
-    clearMessages();
     const FencedBuffer fence(1);
     size_t size = 1;
     for (const uint32 format : {0xFFFFFFFEu, 0u}) {
@@ -121,11 +119,11 @@ TEST(VideoMessages, comeOnce) {
     for (const auto &[format, depth] : std::initializer_list<std::pair<uint32, int32>>{
              {UINT32_MAX, -8}, {RASTER_VIDEO_YUY2, 8}, {UINT32_MAX, 32}, {0, 16}, {0, 0}})
         Raster_YUVtoRGB(fence.end(), fence.end(), 8, 8, format, depth);
-    EXPECT_EQ(logs(), (std::vector<std::string>{
-                          "RasterComputeVideoAttributes: format :4294967294 not supported.\n",
-                          "Raster_YUVtoRGB: bppdepth:-8 not supported.\n",
-                          "Raster_YUVtoRGB: format:4294967295 not supported.\n"}));
-    EXPECT_TRUE(warnings().empty());
+    EXPECT_EQ(logs, (std::vector<std::string>{
+                        "RasterComputeVideoAttributes: format :4294967294 not supported.\n",
+                        "Raster_YUVtoRGB: bppdepth:-8 not supported.\n",
+                        "Raster_YUVtoRGB: format:4294967295 not supported.\n"}));
+    EXPECT_TRUE(warnings.empty());
 }
 
 // --- Colour key
