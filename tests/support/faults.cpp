@@ -23,13 +23,12 @@ namespace {
 
 MemoryFault *current = nullptr;
 
-bool requestFails(Requests kind) {
-    MemoryFault *const fault = current;
-    if (fault == nullptr || fault->happened || (kind == Requests::kAll && kind != fault->counted)) {
+bool requestFails() {
+    if (current == nullptr || current->happened) {
         return false;
     }
-    fault->happened = fault->requestsLeft-- == 0;
-    return fault->happened;
+    current->happened = current->requestsLeft-- == 0;
+    return current->happened;
 }
 
 // The function that this program's own one hides.
@@ -40,7 +39,7 @@ Function *hidden(Function * /*own*/, const char *name) {
 
 } // namespace
 
-MemoryFault::MemoryFault(uint64_t n, Requests kind) : counted(kind), requestsLeft(n) {
+MemoryFault::MemoryFault(uint64_t n) : requestsLeft(n) {
     current = this;
 }
 
@@ -73,18 +72,18 @@ static void *noted(void *block, int64_t count = 1) {
 }
 
 void *malloc(size_t size) noexcept {
-    return requestFails(Requests::kAll) ? nullptr : noted(__libc_malloc(size));
+    return requestFails() ? nullptr : noted(__libc_malloc(size));
 }
 
 void *calloc(size_t count, size_t size) noexcept {
-    return requestFails(Requests::kAll) ? nullptr : noted(__libc_calloc(count, size));
+    return requestFails() ? nullptr : noted(__libc_calloc(count, size));
 }
 
 void *realloc(void *block, size_t size) noexcept {
-    if (requestFails(Requests::kAll)) {
-        return nullptr;
+    if (block == nullptr) {
+        return malloc(size);
     }
-    return block == nullptr ? noted(__libc_malloc(size)) : __libc_realloc(block, size);
+    return requestFails() ? nullptr : __libc_realloc(block, size);
 }
 
 void free(void *block) noexcept {
@@ -96,19 +95,19 @@ void free(void *block) noexcept {
 
 void *UtilSafeMalloc0(size_t size) {
     static auto *const next = hidden(UtilSafeMalloc0, "UtilSafeMalloc0");
-    void *const block = requestFails(Requests::kHearth) ? nullptr : next(size);
+    void *const block = requestFails() ? nullptr : next(size);
     // Not all of a block that no page is behind yet.
     return block == nullptr ? nullptr : std::memset(block, kStale, size < 1u << 24 ? size : 0);
 }
 
 void *UtilSafeCalloc0(size_t count, size_t size) {
     static auto *const next = hidden(UtilSafeCalloc0, "UtilSafeCalloc0");
-    return requestFails(Requests::kHearth) ? nullptr : next(count, size);
+    return requestFails() ? nullptr : next(count, size);
 }
 
 bool DynBuf_Append(DynBuf *buffer, const void *source, size_t length) {
     static auto *const next = hidden(DynBuf_Append, "DynBuf_Append");
-    return !requestFails(Requests::kHearth) && next(buffer, source, length);
+    return !requestFails() && next(buffer, source, length);
 }
 
 int FileIO_Open(FileIODescriptor *file, const char *name, int access, int action) {

@@ -14,19 +14,13 @@ namespace quillon::test {
 
 inline constexpr uint8_t kStale = 0xA5;
 
-enum class Requests {
-    kAll,   // those of the libraries beneath too
-    kHearth // UtilSafeMalloc0, UtilSafeCalloc0 and DynBuf_Append
-};
-
 // While one lives, the n-th request for memory, from 0, fails: that one alone.
 struct MemoryFault {
-    explicit MemoryFault(uint64_t n, Requests kind = Requests::kAll);
+    explicit MemoryFault(uint64_t n);
     ~MemoryFault();
     MemoryFault(const MemoryFault &) = delete;
     MemoryFault &operator=(const MemoryFault &) = delete;
 
-    const Requests counted;
     uint64_t requestsLeft; // until the one that fails
     bool happened = false;
     // Blocks taken since construction and not given back.  0 under a sanitizer,
@@ -35,21 +29,17 @@ struct MemoryFault {
 };
 
 // Calls run() once for each request for memory it makes, with that one failing,
-// and once more with none failing.  run() gives back what it got.  After each,
-// check(failed) looks at what run() has noted down.
-template <class Run, class Check>
-void forEachMemoryFault(const Run &run, const Check &check) {
+// and once more with none failing.  run() gives back what it got, and tells
+// whether there was anything.
+template <class Run>
+void forEachMemoryFault(const Run &run) {
     bool failed = true;
     for (uint64_t n = 0; failed && !testing::Test::HasFailure(); ++n) {
-        int64_t held = 0;
-        {
-            const MemoryFault fault(n);
-            run();
-            failed = fault.happened;
-            held = fault.blocksHeld;
-        }
-        EXPECT_EQ(held, 0) << "request " << n;
-        check(failed);
+        const MemoryFault fault(n);
+        const bool succeeded = run();
+        failed = fault.happened;
+        EXPECT_EQ(fault.blocksHeld, 0) << "request " << n;
+        EXPECT_EQ(succeeded, !failed) << "request " << n;
     }
 }
 
