@@ -242,8 +242,10 @@ TEST(PngRead, Files) {
     EXPECT_FALSE(read()); // empty
     file.write(reinterpret_cast<const char *>(content.data()), std::ssize(content)).flush();
     for (const FileFault fault : {FileFault::kSizeFails, FileFault::kReadFails}) {
+        const MemoryFault none(UINT64_MAX);
         fileFault = fault;
         EXPECT_FALSE(read());
+        EXPECT_EQ(none.blocksHeld, 0);
     }
     EXPECT_FALSE(ImageUtil_ReadPNGBuffer(&image, content.data(), 0, 0));
     EXPECT_TRUE(isRecordOf(image, kUntouched));
@@ -258,6 +260,11 @@ TEST(PngRead, Files) {
         ImageUtil_FreeImageData(&image);
         return isRead;
     });
+    for (const uint64_t request : {1u, 2u, 3u}) { // the state, the pixels, the rows
+        const MemoryFault fault(request, true);
+        EXPECT_FALSE(read());
+        EXPECT_EQ(image.data, nullptr);
+    }
     EXPECT_EQ(filesOpen, 0);
     std::remove(path.c_str());
 }

@@ -23,8 +23,8 @@ namespace {
 
 MemoryFault *current = nullptr;
 
-bool requestFails() {
-    if (current == nullptr || current->happened) {
+bool requestFails(bool ofHearth = true) {
+    if (current == nullptr || current->happened || (current->isOfHearth && !ofHearth)) {
         return false;
     }
     current->happened = current->requestsLeft-- == 0;
@@ -39,7 +39,7 @@ Function *hidden(Function * /*own*/, const char *name) {
 
 } // namespace
 
-MemoryFault::MemoryFault(uint64_t n) : requestsLeft(n) {
+MemoryFault::MemoryFault(uint64_t n, bool ofHearth) : requestsLeft(n), isOfHearth(ofHearth) {
     current = this;
 }
 
@@ -72,18 +72,18 @@ static void *noted(void *block, int64_t count = 1) {
 }
 
 void *malloc(size_t size) noexcept {
-    return requestFails() ? nullptr : noted(__libc_malloc(size));
+    return requestFails(false) ? nullptr : noted(__libc_malloc(size));
 }
 
 void *calloc(size_t count, size_t size) noexcept {
-    return requestFails() ? nullptr : noted(__libc_calloc(count, size));
+    return requestFails(false) ? nullptr : noted(__libc_calloc(count, size));
 }
 
 void *realloc(void *block, size_t size) noexcept {
     if (block == nullptr) {
         return malloc(size);
     }
-    return requestFails() ? nullptr : __libc_realloc(block, size);
+    return requestFails(false) ? nullptr : __libc_realloc(block, size);
 }
 
 void free(void *block) noexcept {

@@ -15,13 +15,15 @@ namespace quillon::test {
 inline constexpr uint8_t kStale = 0xA5;
 
 // While one lives, the n-th request for memory, from 0, fails: that one alone.
+// All requests count, or only those to libhearth.
 struct MemoryFault {
-    explicit MemoryFault(uint64_t n);
+    explicit MemoryFault(uint64_t n, bool ofHearth = false);
     ~MemoryFault();
     MemoryFault(const MemoryFault &) = delete;
     MemoryFault &operator=(const MemoryFault &) = delete;
 
     uint64_t requestsLeft; // until the one that fails
+    const bool isOfHearth;
     bool happened = false;
     // Blocks taken since construction and not given back.  0 under a sanitizer,
     // which finds leaks itself.
