@@ -1,9 +1,9 @@
-// Faults of memory and of files, put in where a test wants them.
+// Memory that fails where a test wants it to.
 //
-// A test program that links this has its own UtilSafeMalloc0, UtilSafeCalloc0,
-// DynBuf_Append and FileIO_*, which pass on to libhearth's, and its own malloc,
-// calloc, realloc and free; the latter not under a sanitizer, which brings its
-// own.  Blocks of UtilSafeMalloc0 come filled with kStale.
+// A test program that links this has its own malloc, calloc, realloc and free;
+// not under a sanitizer, which brings its own.  And it has its own UtilSafeMalloc0,
+// UtilSafeCalloc0 and DynBuf_Append, which pass on to libhearth's.  Blocks of
+// UtilSafeMalloc0 come filled with kStale.
 #pragma once
 
 #include <gtest/gtest.h>
@@ -44,17 +44,5 @@ void forEachMemoryFault(const Run &run) {
         EXPECT_EQ(succeeded, !failed) << "request " << n;
     }
 }
-
-enum class FileFault {
-    kNone,
-    kSizeFails,
-    kReadFails,  // EIO
-    kReadShort,  // all but the last byte
-    kWriteFails, // ENOSPC
-    kWriteShort, // all but the last byte
-};
-
-inline FileFault fileFault = FileFault::kNone; // of every file operation
-inline int filesOpen = 0;                      // opened and not closed
 
 } // namespace quillon::test
