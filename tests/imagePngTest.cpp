@@ -48,39 +48,38 @@ bool isRecordOf(const ImageInfo &image, uint8 byte) {
 // --- Files made by libpng alone
 
 struct PngPicture {
-    PngPicture(Random &random, int type, int depth, uint32 pictureWidth, uint32 pictureHeight)
-        : width(pictureWidth), height(pictureHeight), colorType(type), bitDepth(depth),
-          isInterlaced(random.oneIn(2)),
-          hasTransparency((type & PNG_COLOR_MASK_ALPHA) == 0 && random.oneIn(2)),
-          palette(type == PNG_COLOR_TYPE_PALETTE ? 2 + random.below((1u << depth) - 1)
-                  : type == PNG_COLOR_TYPE_RGB   ? random.oneOf({0u, 3u}) // a suggested one
-                                                 : 0),
-          samples(size_t{width} * height * pixelBytes()) {
-        random.fill(palette.data(), sizeof(png_color) * palette.size());
-        random.fill(samples.data(), samples.size());
-        for (uint8 &sample : samples)
-            if (type == PNG_COLOR_TYPE_PALETTE)
-                sample = static_cast<uint8>(sample % palette.size());
-            else if (depth < 8)
-                sample &= static_cast<uint8>((1 << depth) - 1);
-    }
-    uint32 channels() const {
-        if (colorType == PNG_COLOR_TYPE_PALETTE)
-            return 1;
-        return ((colorType & PNG_COLOR_MASK_COLOR) != 0 ? 3 : 1) +
-               ((colorType & PNG_COLOR_MASK_ALPHA) != 0 ? 1 : 0);
-    }
-    uint32 pixelBytes() const { return channels() * (bitDepth == 16 ? 2 : 1); }
-
-    uint32 width, height;
     int colorType, bitDepth;
-    bool isInterlaced, hasTransparency;
-    std::vector<png_color> palette;
-    Bytes samples; // as stored, but for a byte each at least
+    uint32 width, height;
+    std::vector<png_color> palette = {};
+    Bytes samples = {}; // as stored, but for a byte each at least
+
+    bool isIndexed() const { return colorType == PNG_COLOR_TYPE_PALETTE; }
+    bool hasAlpha() const { return (colorType & PNG_COLOR_MASK_ALPHA) != 0; }
+    bool isGrey() const { return (colorType & PNG_COLOR_MASK_COLOR) == 0; }
+    size_t pixelBytes() const {
+        const size_t channels = isIndexed() ? 1 : (isGrey() ? 1 : 3) + (hasAlpha() ? 1 : 0);
+        return channels * (bitDepth == 16 ? 2 : 1);
+    }
 };
 
+PngPicture randomPicture(Random &random, std::pair<int, int> kind, uint32 width, uint32 height) {
+    PngPicture picture = {kind.first, kind.second, width, height};
+    if (picture.isIndexed())
+        picture.palette.resize(2 + random.below((1u << picture.bitDepth) - 1));
+    else if (!picture.isGrey() && random.oneIn(2))
+        picture.palette.resize(3); // a suggested one
+    random.fill(picture.palette.data(), sizeof(png_color) * picture.palette.size());
+    picture.samples.resize(width * height * picture.pixelBytes());
+    random.fill(picture.samples.data(), picture.samples.size());
+    if (picture.isIndexed() || picture.bitDepth < 8)
+        for (uint8 &sample : picture.samples)
+            sample =
+                static_cast<uint8>(sample % (picture.isIndexed() ? picture.palette.size() : 2));
+    return picture;
+}
+
 // Without samples, a file that ends in the first bytes of its pixels.
-Bytes encode(const PngPicture &picture) {
+Bytes encode(Random &random, const PngPicture &picture) {
     Bytes file;
     png_structp png = png_create_write_struct(PNG_LIBPNG_VER_STRING, nullptr, nullptr, nullptr);
     png_infop info = png_create_info_struct(png);
@@ -90,23 +89,23 @@ Bytes encode(const PngPicture &picture) {
     };
     png_set_write_fn(png, &file, append, nullptr);
     png_set_IHDR(png, info, picture.width, picture.height, picture.bitDepth, picture.colorType,
-                 picture.isInterlaced ? PNG_INTERLACE_ADAM7 : PNG_INTERLACE_NONE,
+                 random.oneOf({PNG_INTERLACE_ADAM7, PNG_INTERLACE_NONE}),
                  PNG_COMPRESSION_TYPE_DEFAULT, PNG_FILTER_TYPE_DEFAULT);
     if (!picture.palette.empty())
         png_set_PLTE(png, info, picture.palette.data(), static_cast<int>(picture.palette.size()));
     const png_byte alphas[] = {0, 64};
     const png_color_16 key = {0, 1, 1, 1, 1};
-    if (picture.hasTransparency)
+    if (!picture.hasAlpha() && random.oneIn(2))
         png_set_tRNS(png, info, alphas, 2, &key);
-    if (picture.samples.empty()) {
+    std::vector<const png_byte *> rows;
+    for (size_t i = 0; i < picture.samples.size(); i += picture.width * picture.pixelBytes())
+        rows.push_back(&picture.samples[i]);
+    png_set_rows(png, info, const_cast<png_bytepp>(rows.data()));
+    if (rows.empty()) {
+        const uint8 pixels[] = {'I', 'D', 'A', 'T', 0x78, 0x9C};
         png_write_info(png, info);
-        png_write_chunk(png, reinterpret_cast<png_const_bytep>("IDAT"),
-                        reinterpret_cast<png_const_bytep>("\x78\x9C"), 2);
+        png_write_chunk(png, pixels, pixels + 4, 2);
     } else {
-        std::vector<const png_byte *> rows;
-        for (size_t y = 0; y < picture.height; ++y)
-            rows.push_back(&picture.samples[y * picture.width * picture.pixelBytes()]);
-        png_set_rows(png, info, const_cast<png_bytepp>(rows.data()));
         png_write_png(png, info, PNG_TRANSFORM_PACKING, nullptr);
     }
     png_destroy_write_struct(&png, &info);
@@ -143,58 +142,58 @@ void expectColors(const ImageInfo &image, bool isBottomUp, const ColorOf &colorO
 }
 
 void expectRecord(const ImageInfo &image, const PngPicture &picture, uint32 flags) {
-    const bool isIndexed = picture.colorType == PNG_COLOR_TYPE_PALETTE;
     const bool hasAlpha =
-        (flags & (picture.colorType == PNG_COLOR_TYPE_RGB_ALPHA ? IMAGEUTIL_READ_KEEP_ALPHA
-                                                                : IMAGEUTIL_READ_ADD_ALPHA)) != 0;
-    ASSERT_EQ(image.width, picture.width);
-    ASSERT_EQ(image.height, picture.height);
-    EXPECT_EQ(image.depth, isIndexed ? 8u : 24u);
-    ASSERT_EQ(image.bpp, isIndexed ? 8u : hasAlpha ? 32u : 24u);
+        (flags & (picture.hasAlpha() ? IMAGEUTIL_READ_KEEP_ALPHA : IMAGEUTIL_READ_ADD_ALPHA)) != 0;
+    ASSERT_TRUE(image.width == picture.width && image.height == picture.height);
+    EXPECT_EQ(image.depth, picture.isIndexed() ? 8u : 24u);
+    ASSERT_EQ(image.bpp, picture.isIndexed() ? 8u : hasAlpha ? 32u : 24u);
     EXPECT_EQ(image.flags, 0u);
     const uint32 rowBytes = picture.width * image.bpp / 8;
     ASSERT_EQ(image.bytesPerLine, (rowBytes + 3) / 4 * 4);
-    ASSERT_EQ(image.numColors, isIndexed ? picture.palette.size() : 0);
+    ASSERT_EQ(image.numColors, picture.isIndexed() ? picture.palette.size() : 0);
     for (const ImageUtilColor &color : image.palette)
         EXPECT_EQ(color.reserved, 0);
     expectColors(image, (flags & IMAGEUTIL_READ_BOTTOM_UP) != 0, [&](uint32 x, uint32 y) {
         const uint8 *s = &picture.samples[(size_t{y} * picture.width + x) * picture.pixelBytes()];
-        if (isIndexed) {
-            const png_color &color = picture.palette[s[0]];
-            return Color{color.blue, color.green, color.red, 255};
-        }
+        if (picture.isIndexed())
+            return Color{picture.palette[s[0]].blue, picture.palette[s[0]].green,
+                         picture.palette[s[0]].red, 255};
         // To the nearest, as v / 65535 = r / 255 has it.
         const auto at8Bits = [&](size_t c) {
             return static_cast<uint8>(
                 picture.bitDepth == 16 ? (s[2 * c] * 256 + s[2 * c + 1] + 128) / 257 : s[c]);
         };
         return Color{at8Bits(2), at8Bits(1), at8Bits(0),
-                     picture.channels() == 4 ? at8Bits(3) : uint8{255}};
+                     picture.hasAlpha() ? at8Bits(3) : uint8{255}};
     });
-    for (uint32 y = 0; y < image.height; ++y)
-        for (uint32 i = rowBytes; i < image.bytesPerLine; ++i)
-            EXPECT_EQ(image.data[y * image.bytesPerLine + i], kStale) << "padding is left alone";
+    for (uint32 i = 0; i < image.height * image.bytesPerLine; ++i)
+        EXPECT_TRUE(i % image.bytesPerLine < rowBytes || image.data[i] == kStale) << "padding";
 }
 
-constexpr std::pair<int, int> kKinds[] = {
-    {PNG_COLOR_TYPE_RGB, 8},       {PNG_COLOR_TYPE_RGB, 16},       {PNG_COLOR_TYPE_RGB_ALPHA, 8},
-    {PNG_COLOR_TYPE_PALETTE, 1},   {PNG_COLOR_TYPE_PALETTE, 2},    {PNG_COLOR_TYPE_PALETTE, 4},
-    {PNG_COLOR_TYPE_PALETTE, 8},   {PNG_COLOR_TYPE_RGB_ALPHA, 16}, {PNG_COLOR_TYPE_GRAY, 1},
-    {PNG_COLOR_TYPE_GRAY_ALPHA, 8}};
+constexpr std::pair<int, int> kRgb16(PNG_COLOR_TYPE_RGB, 16), kRgba8(PNG_COLOR_TYPE_RGB_ALPHA, 8),
+    kRgba16(PNG_COLOR_TYPE_RGB_ALPHA, 16), kPalette4(PNG_COLOR_TYPE_PALETTE, 4);
+constexpr std::pair<int, int> kKinds[] = {kRgb16,
+                                          kRgba8,
+                                          kRgba16,
+                                          kPalette4,
+                                          {PNG_COLOR_TYPE_RGB, 8},
+                                          {PNG_COLOR_TYPE_PALETTE, 1},
+                                          {PNG_COLOR_TYPE_PALETTE, 2},
+                                          {PNG_COLOR_TYPE_PALETTE, 8},
+                                          {PNG_COLOR_TYPE_GRAY, 1},
+                                          {PNG_COLOR_TYPE_GRAY_ALPHA, 8}};
 
 // Chunks that suggest colours or make some of them transparent change nothing;
 // bits of the flags that mean nothing do not either.  Grey is refused.
 TEST(PngRead, EveryFormatAndFlag) {
     testing::internal::CaptureStderr();
     forEachCase(600, [](Random &random) {
-        const auto &[colorType, bitDepth] = kKinds[random.below(std::size(kKinds))];
-        const PngPicture picture(random, colorType, bitDepth, 1 + random.below(20),
-                                 1 + random.below(20));
+        const PngPicture picture = randomPicture(random, kKinds[random.below(std::size(kKinds))],
+                                                 1 + random.below(20), 1 + random.below(20));
         const uint32 flags = random.below(8) | (random.oneIn(2) ? 0xFFFFFFF8u : 0);
-        const bool isGrey = (colorType & PNG_COLOR_MASK_COLOR) == 0;
         ImageInfo image;
-        ASSERT_NE(readBuffer(&image, encode(picture), flags), isGrey);
-        if (isGrey) {
+        ASSERT_NE(readBuffer(&image, encode(random, picture), flags), picture.isGrey());
+        if (picture.isGrey()) {
             EXPECT_TRUE(isRecordOf(image, 0));
             return;
         }
@@ -209,13 +208,11 @@ TEST(PngRead, EveryFormatAndFlag) {
 // 65536 rows of 65536 bytes are one byte too many, counted in 32 bits.
 TEST(PngRead, PicturesTooLarge) {
     Random random(10);
-    PngPicture large(random, PNG_COLOR_TYPE_RGB_ALPHA, 8, 1, 1);
-    large.samples.clear();
-    large.width = 65536 / 4;
+    PngPicture large = {PNG_COLOR_TYPE_RGB_ALPHA, 8, 65536 / 4, 0};
     for (const uint32 height : {65536u, 999999u}) {
         large.height = height;
         ImageInfo image;
-        EXPECT_FALSE(readBuffer(&image, encode(large), IMAGEUTIL_READ_KEEP_ALPHA));
+        EXPECT_FALSE(readBuffer(&image, encode(random, large), IMAGEUTIL_READ_KEEP_ALPHA));
         EXPECT_EQ(image.data, nullptr);
         EXPECT_EQ(image.height, height);
     }
@@ -224,8 +221,8 @@ TEST(PngRead, PicturesTooLarge) {
 // What was decoded ahead of the error stays with the caller.
 TEST(PngRead, DamagedOrEndingEarlyAtEveryLength) {
     Random random(11);
-    for (const auto &[colorType, bitDepth] : {kKinds[0], kKinds[5], kKinds[7]}) {
-        const Bytes whole = encode(PngPicture(random, colorType, bitDepth, 5, 7));
+    for (const auto &kind : {kRgb16, kRgba8, kPalette4}) {
+        const Bytes whole = encode(random, randomPicture(random, kind, 5, 7));
         for (size_t length = whole.size(); length > 0; --length) {
             Bytes file(whole.begin(), whole.begin() + static_cast<ptrdiff_t>(length));
             if (length == whole.size())
@@ -244,7 +241,7 @@ TEST(PngRead, DamagedOrEndingEarlyAtEveryLength) {
 TEST(PngRead, Files) {
     const std::string path = testing::TempDir() + "quillonRead" + std::to_string(getpid());
     Random random(12);
-    const Bytes content = encode(PngPicture(random, PNG_COLOR_TYPE_RGB_ALPHA, 16, 5, 7));
+    const Bytes content = encode(random, randomPicture(random, kRgba16, 5, 7));
     ImageInfo image = recordOf(kUntouched);
     const auto read = [&](const char *name, int64_t size) {
         toldSize = size;
@@ -336,27 +333,24 @@ TEST(PngWrite, EveryFormat) {
 TEST(PngWrite, WhatCannotBeWritten) {
     Random random(8);
     TestImage image(random, {24, 24}, 4, 4);
-    void (*const changes[])(ImageInfo &) = {
-        [](ImageInfo &info) { info.width = 0; },
-        [](ImageInfo &info) { info.height = 0xFFFFFFFF; },
-        [](ImageInfo &info) { info.data = nullptr; },
-        [](ImageInfo &info) { info.bytesPerLine = 11; }, // shorter than its pixels
-        [](ImageInfo &info) { info.bpp = 8; },           // without colours
-        [](ImageInfo &info) { info.bpp = 16, info.depth = 32; },
-        [](ImageInfo &info) { // found out when the pixels are written already
-            info.bpp = 8;
-            info.numColors = 3;
-            info.data[0] = 3;
-        }};
-    for (const auto &change : changes) {
+    const uint32 cases[][6] = {{0, 4, 24, 24, 12, 0}, {4, 0xFFFFFFFF, 24, 24, 12, 0},
+                               {4, 4, 24, 24, 11, 0}, // shorter than its pixels
+                               {4, 4, 32, 16, 12, 0}, {4, 4, 8, 8, 12, 0}, // without colours
+                               {4, 4, 8, 8, 12, 3}}; // found out when pixels are written already
+    image.info.data[0] = 3;
+    for (const auto &[width, height, depth, bpp, bytesPerLine, numColors] : cases) {
         ImageInfo info = image.info;
-        change(info);
-        EXPECT_TRUE(construct(info, nullptr).empty()) << "number " << &change - changes;
+        info.width = width, info.height = height, info.depth = depth, info.bpp = bpp;
+        info.bytesPerLine = bytesPerLine, info.numColors = numColors;
+        EXPECT_TRUE(construct(info, nullptr).empty());
     }
     // The exception must find nothing held; the leak sanitizer would tell.
     image.info.depth = 12;
     image.info.bpp = 16;
     expectPanic("NOT_IMPLEMENTED lib/raster/rasterConv", [&] { construct(image.info, nullptr); });
+    image.info.data = nullptr;
+    image.info.depth = 16;
+    EXPECT_TRUE(construct(image.info, nullptr).empty());
 }
 
 // The block stays for the caller to release; what is in it is given up.

@@ -207,7 +207,7 @@ TEST(RectMap, positions) {
         Rect_ScalePoint(&source, &target, &point, &point);
         EXPECT_TRUE(point.x == expected.left && point.y == expected.top);
 
-        Rect common, dst, clipped;
+        Rect common, dst, clipped = source;
         const bool isOverlap = Rect_Intersect(&common, &source, &target);
         expected = fieldwise(
             [&](auto f, auto low, auto high) {
@@ -215,7 +215,7 @@ TEST(RectMap, positions) {
                        (f == low ? 0 : extent(common.*low, common.*high));
             },
             isExact);
-        EXPECT_EQ(Rect_MapRect(&source, &target, &dst, &clipped), isOverlap);
+        EXPECT_EQ(Rect_MapRect(&clipped, &target, &dst, &clipped), isOverlap);
         EXPECT_EQ(dst, isOverlap ? expected : Rect{});
         EXPECT_EQ(clipped, common);
     });
