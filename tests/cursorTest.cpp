@@ -31,13 +31,10 @@ Bytes bytesOf(const FencedBuffer &buffer) {
 
 // --- Planes
 
-// In 32 bits, step by step.
 uint32 modelSize(uint32 width, uint32 height, uint32 depth) {
-    uint32 bits = 0, padded = 0, size = 0;
-    if (__builtin_mul_overflow(width, depth, &bits) || __builtin_add_overflow(bits, 31u, &padded) ||
-        __builtin_mul_overflow((padded >> 5) << 2, height, &size))
-        return kNoSize;
-    return size;
+    const uint64_t bits = uint64_t{width} * depth + 31, row = bits / 32 * 4;
+    const bool hasSize = bits <= kNoSize && (height == 0 || row <= kNoSize / height);
+    return hasSize ? static_cast<uint32>(row * height) : kNoSize;
 }
 
 TEST(CursorPlanes, haveASize) {
@@ -143,17 +140,19 @@ struct TestCursor {
     RasterCursor &record;
 };
 
-// One axis, at 64 bits: false when nothing is visible.
-bool modelVisible(int32 position, uint32 hotspot, uint32 size, uint32 screen, uint32 &dst,
-                  uint32 &visible, uint32 &src) {
-    const int64_t start = static_cast<int32>(static_cast<uint32>(position) - hotspot);
-    const int64_t first = std::max<int64_t>(start, 0), end = start + int64_t{size};
-    const int64_t last = std::min<int64_t>(end, screen);
-    dst = static_cast<uint32>(first);
-    visible = static_cast<uint32>(last - first);
-    src = static_cast<uint32>(first - start);
-    return first < last && end - first <= std::numeric_limits<int32>::max();
-}
+// One axis, at 64 bits.
+struct ModelRange {
+    ModelRange(int32 position, uint32 hotspot, uint32 size, uint32 screen)
+        : start(static_cast<int32>(static_cast<uint32>(position) - hotspot)),
+          first(std::max<int64_t>(start, 0)), end(start + int64_t{size}),
+          isVisible(first < std::min<int64_t>(end, screen) && end - first <= INT32_MAX),
+          dst(static_cast<uint32>(first)),
+          visible(static_cast<uint32>(std::min<int64_t>(end, screen) - first)),
+          src(static_cast<uint32>(first - start)) {}
+    int64_t start, first, end;
+    bool isVisible;
+    uint32 dst, visible, src;
+};
 
 TEST(CursorDrawing, boxesEqualTheirModel) {
     forEachCase(300000, [](Random &random) {
@@ -166,15 +165,14 @@ TEST(CursorDrawing, boxesEqualTheirModel) {
         cursor.width = draw(), cursor.height = draw();
         const RasterCursorScreen screen = {draw(), draw()};
         const auto x = static_cast<int32>(draw()), y = static_cast<int32>(draw());
-        RasterCursorBox box{}, expected{};
-        const bool hasColumns = modelVisible(x, cursor.hotspotX, cursor.width, screen.width,
-                                             expected.dstX, expected.width, expected.srcX);
-        const bool hasRows = modelVisible(y, cursor.hotspotY, cursor.height, screen.height,
-                                          expected.dstY, expected.height, expected.srcY);
-        if (!hasColumns || !hasRows)
-            expected = {}; // untouched
-        ASSERT_EQ(Raster_ComputeCursorBox(&screen, &cursor, x, y, &box),
-                  hasColumns && hasRows ? 1u : 0u);
+        const ModelRange columns(x, cursor.hotspotX, cursor.width, screen.width);
+        const ModelRange rows(y, cursor.hotspotY, cursor.height, screen.height);
+        const bool isVisible = columns.isVisible && rows.isVisible;
+        RasterCursorBox box{}, expected{}; // untouched
+        if (isVisible)
+            expected = {columns.dst,  rows.dst,    columns.visible,
+                        rows.visible, columns.src, rows.src};
+        ASSERT_EQ(Raster_ComputeCursorBox(&screen, &cursor, x, y, &box), isVisible ? 1u : 0u);
         ASSERT_EQ(std::memcmp(&box, &expected, sizeof box), 0);
     });
 }
