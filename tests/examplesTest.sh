@@ -82,23 +82,18 @@ testThumbnail() {
     fails 'No such file' missing.png out.png
     fails 'not a whole PNG' truncated.png out.png
     fails 'cannot be written' rgba.png nowhere/out.png
-    fails 'must end in .png or .bmp' rgba.png .png
-    fails 'unknown option' rgba.png out.png --sharpen
     fails 'takes a whole number' rgba.png out.png --width 32768
-    fails 'takes X,Y,WxH' rgba.png out.png --crop 1,1,2x2x
     fails 'cannot be cut' rgba.png out.png --crop 3,0,2x2
 }
 
 testGallery() {
-    for picture in "$pictures/lake.png" palette.png; do
-        mkdir page
-        runs "$picture" "$pictures/marble.png" page
-        # The files named on the page are the files there are.
-        grep -o '\(src\|href\)="[^"#]*"' page/index.html | cut -d'"' -f2 | sort -u >named
-        same "$picture" "$(cat named)" "$(ls page | grep -v '^index.html$' | sort)"
-        [ -s named ] || complain "$picture: nothing on the page"
-        rm -r page
-    done
+    mkdir page
+    runs palette.png "$pictures/marble.png" page
+    # The files named on the page are the files there are.
+    grep -o '\(src\|href\)="[^"#]*"' page/index.html | cut -d'"' -f2 | sort -u >named
+    same "page" "$(cat named)" "$(ls page | grep -v '^index.html$' | sort)"
+    [ -s named ] || complain "nothing on the page"
+    rm -r page
     mkdir page
     fails 'cannot be read as a PNG' grey.png "$pictures/marble.png" page
 }
@@ -120,7 +115,6 @@ testCursorScreen() {
     # On the second display the rim of a disc, on the one below that of the arrow.
     same "rim" 4b6787506080 "$(row 51 688 216 219 2)"
     same "arrow" 606068000000ffffff "$(row 160 688 216 203 3)"
-    fails 'give the name' nowhere/sheet.png
 }
 
 testDamage() {
@@ -152,12 +146,8 @@ testYuvToPng() {
     frame YV12 3 3 "$red$red$blue $green$green$white"
     frame YV12 4 4 "$red$red$blue$blue $green$green$white$black"
 
-    fails 'usage: ' frame.yuv 4 4 YV12
     fails 'has 24 bytes, but such a frame has 32' frame.yuv 4 4 YUY2 out.png
-    fails 'the format must be' frame.yuv 4 4 yv12 out.png
-    fails 'the width must be' frame.yuv 16385 4 YV12 out.png
     fails 'the height must be' frame.yuv 4 4294967300 YV12 out.png
-    fails 'No such file' missing.yuv 4 4 YV12 out.png
 }
 
 case $example in

@@ -55,34 +55,24 @@ TEST(Bmp, EveryFormat) {
         const Format format = kFormats[random.below(std::size(kFormats))];
         const uint32 inRow = 1 + random.below(40), height = 1 + random.below(20);
         const TestImage image(random, format, inRow, height, random.below(5)); // odd distances too
-        // Of rows that lie closer than they are long, what there is comes first.
-        const uint32 width = inRow + (random.oneIn(4) ? 4 + random.below(9) : 0);
         ImageInfo info = image.info;
-        info.width = width;
+        // Of rows that lie closer than they are long, what there is comes first.
+        const uint32 width = info.width = inRow + (random.oneIn(4) ? 4 + random.below(9) : 0);
         const bool isIndexed = format.bpp == 8;
-        const uint32 numColors = isIndexed ? random.oneOf({256u, 256u, 257u, 0xFFFFFFFFu}) : 0;
-        info.numColors = numColors;
+        const uint32 numColors = info.numColors =
+            isIndexed ? random.oneOf({256u, 257u, 0xFFFFFFFFu}) : 0;
         const Bytes file = bmpOf(&info);
 
         const uint32 offset = 54 + std::min(numColors, 256u) * 4;
         const uint32 rowBytes = (width * (isIndexed ? 1 : 3) + 3) / 4 * 4;
         ASSERT_EQ(file.size(), offset + rowBytes * height);
         const uint32 imageBytes = rowBytes * height;
-        const uint32 header[] = {offset + imageBytes,
-                                 0,
-                                 offset,
-                                 40,
-                                 width,
-                                 height,
-                                 isIndexed ? 8u << 16 | 1 : 24u << 16 | 1,
-                                 0,
-                                 imageBytes,
-                                 0,
-                                 0,
-                                 std::min(numColors, 256u),
-                                 0};
+        const uint32 planesAndBits = isIndexed ? 8u << 16 | 1 : 24u << 16 | 1;
+        const uint32 sizes[] = {offset + imageBytes, 0, offset, 40, width, height, planesAndBits};
+        const uint32 rest[] = {0, imageBytes, 0, 0, std::min(numColors, 256u), 0};
         EXPECT_EQ(Bytes(&file[0], &file[2]), (Bytes{'B', 'M'}));
-        EXPECT_EQ(std::memcmp(&file[2], header, sizeof header), 0);
+        EXPECT_EQ(std::memcmp(&file[2], sizes, sizeof sizes), 0);
+        EXPECT_EQ(std::memcmp(&file[30], rest, sizeof rest), 0);
         for (uint32 y = 0; y < height; ++y) {
             const uint8 *const row = &file[offset + (height - 1 - y) * rowBytes];
             for (uint32 x = 0; x < inRow; ++x) {
@@ -93,10 +83,8 @@ TEST(Bmp, EveryFormat) {
             // Behind them: padding of the image where rows are copied, then zeros.
             const bool isCopied = isIndexed || format.bpp == 24;
             const uint32 converted = std::min(width, info.bytesPerLine / (format.bpp / 8));
-            uint32 i = isCopied ? info.bytesPerLine : converted * 3;
-            for (; i < rowBytes; ++i) {
+            for (uint32 i = isCopied ? info.bytesPerLine : converted * 3; i < rowBytes; ++i)
                 EXPECT_EQ(row[i], 0);
-            }
         }
     });
 }
