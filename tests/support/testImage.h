@@ -63,4 +63,17 @@ inline Color pictureColorAt(const ImageInfo &image, uint32 x, uint32 y) {
     return colorAt(image, x, isReversed ? image.height - 1 - y : y);
 }
 
+// Holds the rows, from the first of the picture to the last, to colorOf(x, y).
+template <class ColorOf>
+void expectColors(const ImageInfo &image, bool isBottomUp, const ColorOf &colorOf) {
+    for (uint32 y = 0; y < image.height; ++y)
+        for (uint32 x = 0; x < image.width; ++x) {
+            Color expected = colorOf(x, y);
+            if (image.bpp != 32)
+                expected.alpha = 255;
+            ASSERT_EQ(colorAt(image, x, isBottomUp ? image.height - 1 - y : y), expected)
+                << "pixel " << x << ", " << y;
+        }
+}
+
 } // namespace quillon::test

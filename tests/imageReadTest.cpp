@@ -1,15 +1,11 @@
-// PNG files of every kind, whole and broken, into image records, and images of
-// every format into PNG streams.
+// PNG files of every kind, whole and broken, into image records.
 
 #include "hearth.h"
 #include "imageUtil.h"
 #include "support/faults.h"
-#include "support/messages.h"
 #include "support/testImage.h"
 
 #include <algorithm>
-#include <csetjmp>
-#include <cstdlib>
 #include <cstring>
 #include <fstream>
 #include <png.h>
@@ -119,26 +115,11 @@ size_t pixelStream(const Bytes &file) {
     return static_cast<size_t>(found - file.begin()) + 4;
 }
 
-// --- Reading
-
 bool readBuffer(ImageInfo *image, const Bytes &file, uint32 flags) {
     *image = recordOf(kUntouched);
     const FencedBuffer fenced(file.size());
     std::copy(file.begin(), file.end(), fenced.data());
     return ImageUtil_ReadPNGBuffer(image, fenced.data(), static_cast<uint32>(file.size()), flags);
-}
-
-// Holds the rows, from the first of the picture to the last, to colorOf(x, y).
-template <class ColorOf>
-void expectColors(const ImageInfo &image, bool isBottomUp, const ColorOf &colorOf) {
-    for (uint32 y = 0; y < image.height; ++y)
-        for (uint32 x = 0; x < image.width; ++x) {
-            Color expected = colorOf(x, y);
-            if (image.bpp != 32)
-                expected.alpha = 255;
-            ASSERT_EQ(colorAt(image, x, isBottomUp ? image.height - 1 - y : y), expected)
-                << "pixel " << x << ", " << y;
-        }
 }
 
 void expectRecord(const ImageInfo &image, const PngPicture &picture, uint32 flags) {
@@ -275,144 +256,6 @@ TEST(PngRead, Files) {
     }
     EXPECT_EQ(dup(STDIN_FILENO), descriptor);
     std::remove(path.c_str());
-}
-
-// --- Writing
-
-Bytes construct(const ImageInfo &image, const ImageUtilPngOptions *options) {
-    DynBuf buffer = {};
-    std::memset(&buffer, 0x5A, sizeof buffer);
-    const bool isWritten = ImageUtil_ConstructPNGBuffer(&image, options, &buffer);
-    EXPECT_EQ(buffer.data != nullptr, isWritten);
-    const Bytes file(buffer.data, buffer.data + buffer.size);
-    DynBuf_Destroy(&buffer);
-    return file;
-}
-
-void expectSamePicture(const Bytes &file, const ImageInfo &image) {
-    ImageInfo read;
-    ASSERT_TRUE(readBuffer(&read, file, IMAGEUTIL_READ_KEEP_ALPHA));
-    ASSERT_EQ(read.width, image.width);
-    ASSERT_EQ(read.height, image.height);
-    ASSERT_EQ(read.numColors, std::min(image.numColors, 256u));
-    expectColors(read, false, [&](uint32 x, uint32 y) { return pictureColorAt(image, x, y); });
-    ImageUtil_FreeImageData(&read);
-}
-
-TEST(PngWrite, EveryFormat) {
-    forEachCase(400, [](Random &random) {
-        const Format format = kFormats[random.below(std::size(kFormats))];
-        TestImage image(random, format, 1 + random.below(40), 1 + random.below(20),
-                        random.below(4));
-        ImageInfo &info = image.info;
-        if (format.bpp == 8 && random.oneIn(4)) {
-            std::memset(info.data, 0, image.pixels.size());
-            info.numColors = random.oneOf({1u, 16u, 257u, 0xFFFFFFFFu});
-        }
-        const int32 level = random.between(-2, 12);
-        const ImageUtilPngOptions options = {level, random.oneIn(2)};
-        const bool isDefault = random.oneIn(3);
-        const Bytes file = construct(info, isDefault ? nullptr : &options);
-        const bool hasAlpha = format.bpp == 32 && !isDefault && !options.stripAlpha;
-        const int colorType = format.bpp == 8 ? PNG_COLOR_TYPE_PALETTE
-                              : hasAlpha      ? PNG_COLOR_TYPE_RGB_ALPHA
-                                              : PNG_COLOR_TYPE_RGB;
-        ASSERT_GT(file.size(), 40u);
-        EXPECT_EQ(Bytes(&file[24], &file[29]), (Bytes{8, static_cast<uint8>(colorType), 0, 0, 0}));
-        info.bytesPerLine -= format.bpp == 16 ? info.bytesPerLine % 2 : 0; // counts as even
-        expectSamePicture(file, info);
-
-        // Bits 6 and 7 of the second byte of a zlib stream tell the effort made.
-        const int effort = file[pixelStream(file) + 1] >> 6;
-        const bool isLevel = !isDefault && level >= 0 && level <= 9 && level != 6;
-        const bool isSlow = isLevel && level > 6, isFast = isLevel && level < 2;
-        EXPECT_TRUE(effort == (isSlow ? 3 : isFast ? 0 : 2) || (isLevel && level < 6 && !isFast));
-    });
-}
-
-TEST(PngWrite, WhatCannotBeWritten) {
-    Random random(8);
-    TestImage image(random, {24, 24}, 4, 4);
-    const uint32 cases[][6] = {{0, 4, 24, 24, 12, 0}, {4, 0xFFFFFFFF, 24, 24, 12, 0},
-                               {4, 4, 24, 24, 11, 0}, // shorter than its pixels
-                               {4, 4, 32, 16, 12, 0}, {4, 4, 8, 8, 12, 0}, // without colours
-                               {4, 4, 8, 8, 12, 3}}; // found out when pixels are written already
-    image.info.data[0] = 3;
-    for (const auto &[width, height, depth, bpp, bytesPerLine, numColors] : cases) {
-        ImageInfo info = image.info;
-        info.width = width, info.height = height, info.depth = depth, info.bpp = bpp;
-        info.bytesPerLine = bytesPerLine, info.numColors = numColors;
-        EXPECT_TRUE(construct(info, nullptr).empty());
-    }
-    // The exception must find nothing held; the leak sanitizer would tell.
-    image.info.depth = 12;
-    image.info.bpp = 16;
-    expectPanic("NOT_IMPLEMENTED lib/raster/rasterConv", [&] { construct(image.info, nullptr); });
-    image.info.data = nullptr;
-    image.info.depth = 16;
-    EXPECT_TRUE(construct(image.info, nullptr).empty());
-}
-
-// The block stays for the caller to release; what is in it is given up.
-TEST(PngWrite, StreamBeyond4GiB) {
-    png_structp png = png_create_write_struct(PNG_LIBPNG_VER_STRING, nullptr, nullptr, nullptr);
-    const ImageUtilMemOps noMemory = {};
-    uint8 block[4] = {};
-    for (const size_t length : {size_t{16}, ~size_t{0}}) {
-        ImageUtilPngBuffer buffer = {block, 0xFFFFFFF8u, 0xFFFFFFF8u, &noMemory};
-        png_set_write_fn(png, &buffer, ImageUtilBufferWriteCallback, nullptr);
-        if (setjmp(png_jmpbuf(png)) == 0) {
-            ImageUtilBufferWriteCallback(png, block, length);
-            ADD_FAILURE() << "no error";
-        }
-        EXPECT_TRUE(buffer.data == block && buffer.size == 0 && buffer.capacity == 0);
-    }
-    png_destroy_write_struct(&png, nullptr);
-}
-
-// Memory operations whose blocks no other functions could resize or free.
-size_t kAhead = 64; // its address is their context
-
-void *resizeBlock(void *context, void *block, size_t size) {
-    EXPECT_EQ(context, &kAhead);
-    void *whole = block == nullptr ? nullptr : static_cast<uint8 *>(block) - kAhead;
-    whole = std::realloc(whole, size + kAhead);
-    return whole == nullptr ? nullptr : static_cast<uint8 *>(whole) + kAhead;
-}
-
-void *takeBlock(void *context, size_t size) {
-    return resizeBlock(context, nullptr, size);
-}
-
-void releaseBlock(void *context, void *block) {
-    EXPECT_EQ(context, &kAhead);
-    std::free(block == nullptr ? nullptr : static_cast<uint8 *>(block) - kAhead);
-}
-
-TEST(PngWrite, WithoutMemoryOrWithThatOfTheCaller) {
-    Random random(11);
-    for (const Format format : {Format{8, 8}, Format{15, 16}, Format{24, 32}}) {
-        const TestImage image(random, format, 50, 40);
-        const Bytes file = construct(image.info, nullptr);
-        forEachMemoryFault([&] {
-            DynBuf buffer = {};
-            const bool isWritten = ImageUtil_ConstructPNGBuffer(&image.info, nullptr, &buffer);
-            DynBuf_Destroy(&buffer);
-            return isWritten;
-        });
-        forEachMemoryFault([&] {
-            const ImageUtilMemOps ops = {&kAhead, takeBlock, releaseBlock, resizeBlock};
-            uint8 *data = image.info.data;
-            uint32 size = 77;
-            const bool isWritten =
-                ImageUtil_ConstructPNGBufferWithMemOps(&image.info, nullptr, &data, &size, &ops);
-            EXPECT_TRUE(isWritten ? std::equal(file.begin(), file.end(), data, data + size)
-                                  : data == image.info.data && size == 0);
-            if (isWritten)
-                releaseBlock(&kAhead, data);
-            return isWritten;
-        });
-    }
 }
 
 } // namespace
