@@ -24,18 +24,15 @@ struct RopPattern {
     BytePattern<kBytes> flip;
 };
 
-// One vector from byte i of a row on; kPeriod is the number of bytes after which
-// the pattern repeats, and 1 where it is the same in all vectors.
-template <size_t kPeriod, size_t kBytes>
+template <size_t kBytes>
 struct RopFillBody {
     uint8_t *dst;
     const RopPattern<kBytes> &pattern;
 
     template <class D, class Lanes>
     HWY_INLINE void operator()(D d, size_t i, Lanes lanes) const {
-        const size_t phase = i % kPeriod;
-        const auto keep = hn::LoadU(d, pattern.keep.bytes + phase);
-        const auto flip = hn::LoadU(d, pattern.flip.bytes + phase);
+        const auto keep = hn::LoadU(d, pattern.keep.from(i));
+        const auto flip = hn::LoadU(d, pattern.flip.from(i));
         lanes.store(d, hn::Xor(hn::And(lanes.load(d, dst + i), keep), flip), dst + i);
     }
 };
@@ -71,14 +68,9 @@ void RopFill(DstRows dst, Size bytes, int32 bytesPerPixel, uint32 keep, uint32 f
     bytes = joinedRows(bytes, bytes.width, dst.step);
     for (size_t y = 0; y < bytes.height; ++y) {
         uint8_t *row = dst.row(y);
-        // Vectors of a single byte, on the scalar target, see a byte of the pixel each.
-        if constexpr (n < 4) {
-            walkParts<uint8_t>(bytes.width, RopFillBody<12, n>{row, pattern});
-        } else {
-            const size_t done = ropFillThrees(d, row, bytes.width, pattern);
-            const RopFillBody<3, n> rest = {row + done, pattern};
-            walkParts<uint8_t>(bytes.width - done, rest);
-        }
+        // Vectors of a single byte, on the scalar target, hold no whole pixels.
+        const size_t done = n < 4 ? 0 : ropFillThrees(d, row, bytes.width, pattern);
+        walkParts<uint8_t>(row + done, bytes.width - done, RopFillBody<n>{row + done, pattern});
     }
 }
 
@@ -150,7 +142,7 @@ void ropRows(DstRows dst, SrcRows src, Size bytes, int32 bytesPerPixel, bool bac
             if (backwards)
                 walkPartsBackwards<uint8_t>(bytes.width, body);
             else
-                walkParts<uint8_t>(bytes.width, body);
+                walkParts<uint8_t>(to, bytes.width, body);
         } else if (bytesPerPixel == 2) {
             ropPixels<kRop, uint16_t>(to, from, bytes.width, backwards);
         } else if (bytesPerPixel == 4) {

@@ -99,18 +99,20 @@ struct SetAlpha {
     uint8_t *dst;
     uint32_t alpha; // in the top byte
 
-    template <class D>
-    HWY_INLINE void operator()(D d, size_t i) const {
+    template <class D, class Lanes>
+    HWY_INLINE void operator()(D d, size_t i, Lanes lanes) const {
         auto *pixels = reinterpret_cast<uint32_t *>(dst + 4 * i);
-        const auto colour = hn::And(hn::LoadU(d, pixels), hn::Set(d, 0x00FFFFFF));
-        hn::StoreU(hn::Or(colour, hn::Set(d, alpha)), d, pixels);
+        const auto colour = hn::And(lanes.load(d, pixels), hn::Set(d, 0x00FFFFFF));
+        lanes.store(d, hn::Or(colour, hn::Set(d, alpha)), pixels);
     }
 };
 
 void FillAlpha(DstRows dst, Size size, uint8 alpha) {
     size = joinedRows(size, 4 * size.width, dst.step);
-    for (size_t y = 0; y < size.height; ++y)
-        walkAgain<uint32_t>(size.width, SetAlpha{dst.row(y), uint32_t{alpha} << 24});
+    for (size_t y = 0; y < size.height; ++y) {
+        uint8_t *row = dst.row(y);
+        walkParts<uint32_t>(row, size.width, SetAlpha{row, uint32_t{alpha} << 24});
+    }
 }
 
 // ---- Blend --------------------------------------------------------------
@@ -149,39 +151,64 @@ HWY_INLINE V blendOver(D d, V src, V dst) {
     const auto green = hn::MulHigh(hn::AndNot(low, dst16), factor);
     const auto under = hn::OrAnd(blueRed, green, hn::Set(d16, 0xFF00));
 
-    const auto colour = hn::Set(d, 0x00FFFFFF);
-    const auto covered = hn::Ne(hn::BitCast(d, factor), hn::Zero(d));
-    const auto kept =
-        hn::IfVecThenElse(hn::IfThenElseZero(covered, colour), hn::BitCast(d, under), dst);
-    return hn::BitCast(
-        d, hn::SaturatedAdd(hn::BitCast(d8, hn::And(src, colour)), hn::BitCast(d8, kept)));
+    const auto uncovered = hn::Eq(hn::BitCast(d, factor), hn::Zero(d));
+    const auto kept = hn::IfThenElse(uncovered, dst, hn::BitCast(d, under));
+    const auto sum = hn::SaturatedAdd(hn::BitCast(d8, src), hn::BitCast(d8, kept));
+    return hn::IfVecThenElse(hn::Set(d, 0x00FFFFFF), hn::BitCast(d, sum), dst);
 }
 
 #endif
 
+// In surfaces that no cache holds the arithmetic leaves memory waiting, unless it
+// is told ahead.
+constexpr size_t kAhead = 2048;
+
+template <bool kIsLarge>
 struct BlendOver {
     uint8_t *dst;
     const uint8_t *src;
 
     template <class D, class Lanes = AllLanes>
     HWY_INLINE void operator()(D d, size_t i, Lanes lanes = {}) const {
-        auto *pixels = reinterpret_cast<uint32_t *>(dst + 4 * i);
-        const auto over = lanes.load(d, reinterpret_cast<const uint32_t *>(src + 4 * i));
-        // Much of what lies over a picture is clear, in long runs, and changes nothing.
-        if (!hn::AllTrue(d, hn::Eq(over, hn::Zero(d))))
-            lanes.store(d, blendOver(d, over, lanes.load(d, pixels)), pixels);
+        uint8_t *at = dst + 4 * i;
+        const uint8_t *from = src + 4 * i;
+        if constexpr (kIsLarge) {
+            hwy::Prefetch(at + kAhead);
+            hwy::Prefetch(from + kAhead);
+        }
+        auto *pixels = reinterpret_cast<uint32_t *>(at);
+        const auto over = lanes.load(d, reinterpret_cast<const uint32_t *>(from));
+        // Much of what lies over a picture is clear, in long runs, and changes
+        // nothing.  A look at one pixel is cheaper than one at a vector.
+        if (isClear(from) && hn::AllTrue(d, hn::Eq(over, hn::Zero(d))))
+            return;
+        lanes.store(d, blendOver(d, over, lanes.load(d, pixels)), pixels);
+    }
+
+    HWY_INLINE static bool isClear(const uint8_t *from) {
+        uint32_t pixel;
+        hwy::CopyBytes<4>(from, &pixel);
+        return pixel == 0;
     }
 };
 
-void Blend(DstRows dst, SrcRows src, Size size) {
-    size = joinedRows(size, 4 * size.width, dst.step, 4 * size.width, src.step);
+template <bool kIsLarge>
+void blendRows(DstRows dst, SrcRows src, Size size) {
     for (size_t y = 0; y < size.height; ++y) {
-        const BlendOver body = {dst.row(y), src.row(y)};
+        const BlendOver<kIsLarge> body = {dst.row(y), src.row(y)};
         if (runsIntoItself(body.dst, body.src, 4 * kLanes<Widest<uint32_t>>))
             walkSingly<uint32_t>(size.width, body);
         else
-            walkParts<uint32_t>(size.width, body);
+            walkParts<uint32_t>(body.dst, size.width, body);
     }
+}
+
+void Blend(DstRows dst, SrcRows src, Size size) {
+    size = joinedRows(size, 4 * size.width, dst.step, 4 * size.width, src.step);
+    if (isStreamed(4 * size.width, size.height))
+        blendRows<true>(dst, src, size);
+    else
+        blendRows<false>(dst, src, size);
 }
 
 } // namespace
