@@ -2,6 +2,7 @@
 #include "operations/operations.h"
 #include "peers/peers.h"
 #include "report.h"
+#include "shapes.h"
 
 #include <sched.h>
 #include <unistd.h>
@@ -25,9 +26,10 @@ void pinToOneCore() {
 
 Plan makePlan() {
     Plan plan;
-    for (const auto add : {addFills, addCopies, addBlends, addBits, addConversions, addScaling,
-                           addVideo, addRectLists, addImages})
-        add(plan);
+    for (const Area &area : kAreas)
+        addPixelOperations(plan, area);
+    addRectLists(plan);
+    addImages(plan);
     addPeers(plan);
     return plan;
 }
@@ -37,14 +39,17 @@ Plan makePlan() {
 int main(int argc, char **argv) {
     pinToOneCore();
     benchmark::Initialize(&argc, argv);
-    // What is left over is ours: --report=FOLDER.
+    // What Google Benchmark leaves over is ours.
     std::string reportFolder;
     for (int i = 1; i < argc; ++i) {
         const std::string argument = argv[i];
-        if (argument.rfind("--report=", 0) == 0)
-            reportFolder = argument.substr(9);
-        else
+        if (argument == "--sweep")
+            return sweep();
+        if (argument == "--growth")
+            return growth();
+        if (argument.rfind("--report=", 0) != 0)
             return benchmark::ReportUnrecognizedArguments(argc, argv), 1;
+        reportFolder = argument.substr(9);
     }
 
     const Plan plan = makePlan();

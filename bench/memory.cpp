@@ -41,7 +41,8 @@ uint8 *arena() {
 } // namespace
 
 Plane plane(const Area &area, uint32 bitsPerPixel, const Content &content) {
-    return {area.width, area.height, bitsPerPixel, area.surfaceWidth, content};
+    return {area.width, area.height, bitsPerPixel,  area.surfaceWidth,
+            content,    area.offset, area.extraStep};
 }
 
 size_t arenaBytes() {
@@ -64,8 +65,9 @@ Places::Places(const Operation &operation) : dstPlane(operation.planes.front()) 
         for (size_t p = 0; p < operation.planes.size(); ++p) {
             const Plane &plane = operation.planes[p];
             const size_t left = plane.surfaceWidth == 0 ? 0 : kLeft * plane.bitsPerPixel / 8;
-            const Buffer buffer = {next + (p + 1) * 64 + left, plane.step(), plane.width,
-                                   plane.height, plane.rowBytes()};
+            const size_t start = (p + 1) * 64 + left + plane.offset;
+            const Buffer buffer = {next + start, plane.step(), plane.width, plane.height,
+                                   plane.rowBytes()};
             (p == 0 ? job.dst : job.sources[p - 1]) = buffer;
             if (place == 0)
                 plane.content(buffer.data, plane.bytes());
