@@ -4,7 +4,7 @@
 //
 // Scale factors are doubles, but what is derived from them is meant to be
 // rounded at 64 bits and truncated after that: 65536.0 / 0.1 is 655359, where
-// division of doubles gives 655360.
+// division of doubles gives 655360.  docs/numbers.md has the reasoning.
 //
 // Exponents have no limit that a few operations on doubles could reach, so
 // nothing overflows and nothing becomes denormal.  There are no infinities (one

@@ -6,9 +6,11 @@
 #include "hwy/highway.h"
 
 #include "raster.h"
+#include "raster/copyRows.h"
 
 #include "raster/bytePattern-inl.h"
 #include "raster/kernels-inl.h"
+#include "raster/streaming-inl.h"
 
 HWY_BEFORE_NAMESPACE();
 namespace quillon::HWY_NAMESPACE {
@@ -22,34 +24,53 @@ struct RopPattern {
     BytePattern<kBytes> flip;
 };
 
-// One vector from byte i of a row on; kPeriod is the number of bytes after which
-// the pattern repeats, and 1 where it is the same in all vectors.
-template <size_t kPeriod, size_t kBytes>
+template <size_t kBytes>
 struct RopFillBody {
     uint8_t *dst;
     const RopPattern<kBytes> &pattern;
 
-    template <class D>
-    HWY_INLINE void operator()(D d, size_t i) const {
-        const size_t phase = kPeriod == 1 ? 0 : i % kPeriod;
-        const auto keep = hn::LoadU(d, pattern.keep.bytes + phase);
-        const auto flip = hn::LoadU(d, pattern.flip.bytes + phase);
-        hn::StoreU(hn::Xor(hn::And(hn::LoadU(d, dst + i), keep), flip), d, dst + i);
+    template <class D, class Lanes>
+    HWY_INLINE void operator()(D d, size_t i, Lanes lanes) const {
+        const auto keep = hn::LoadU(d, pattern.keep.from(i));
+        const auto flip = hn::LoadU(d, pattern.flip.from(i));
+        lanes.store(d, hn::Xor(hn::And(lanes.load(d, dst + i), keep), flip), dst + i);
     }
 };
 
+// Vectors by threes, which hold whole pixels of every size: the pattern stays in
+// registers.  Returns how far that went.
+template <class D, size_t kBytes>
+HWY_INLINE size_t ropFillThrees(D d, uint8_t *row, size_t bytes,
+                                const RopPattern<kBytes> &pattern) {
+    constexpr size_t n = kBytes;
+    const auto at = [&](const BytePattern<kBytes> &part, size_t vector)
+                        HWY_ATTR { return hn::LoadU(d, part.from(vector * n)); };
+    const auto keep0 = at(pattern.keep, 0), flip0 = at(pattern.flip, 0);
+    const auto keep1 = at(pattern.keep, 1), flip1 = at(pattern.flip, 1);
+    const auto keep2 = at(pattern.keep, 2), flip2 = at(pattern.flip, 2);
+    const auto combined = [&](uint8_t *to, hn::Vec<D> keep, hn::Vec<D> flip)
+                              HWY_ATTR { return hn::Xor(hn::And(hn::LoadU(d, to), keep), flip); };
+    size_t i = 0;
+    for (; bytes - i >= 3 * n; i += 3 * n) {
+        uint8_t *to = row + i;
+        hn::StoreU(combined(to, keep0, flip0), d, to);
+        hn::StoreU(combined(to + n, keep1, flip1), d, to + n);
+        hn::StoreU(combined(to + 2 * n, keep2, flip2), d, to + 2 * n);
+    }
+    return i;
+}
+
 void RopFill(DstRows dst, Size bytes, int32 bytesPerPixel, uint32 keep, uint32 flip) {
-    constexpr size_t n = kLanes<Widest<uint8_t>>;
+    const Widest<uint8_t> d;
+    constexpr size_t n = kLanes<decltype(d)>;
     const RopPattern<n> pattern = {BytePattern<n>(keep, bytesPerPixel),
                                    BytePattern<n>(flip, bytesPerPixel)};
     bytes = joinedRows(bytes, bytes.width, dst.step);
-    // Vectors of a single byte, on the scalar target, see a byte of the pixel each.
-    constexpr size_t kPeriod = n < 4 ? 12 : 3;
     for (size_t y = 0; y < bytes.height; ++y) {
-        if (bytesPerPixel == 3 || n < 4)
-            walkOnce<uint8_t>(bytes.width, RopFillBody<kPeriod, n>{dst.row(y), pattern});
-        else
-            walkOnce<uint8_t>(bytes.width, RopFillBody<1, n>{dst.row(y), pattern});
+        uint8_t *row = dst.row(y);
+        // Vectors of a single byte, on the scalar target, hold no whole pixels.
+        const size_t done = n < 4 ? 0 : ropFillThrees(d, row, bytes.width, pattern);
+        walkParts<uint8_t>(row + done, bytes.width - done, RopFillBody<n>{row + done, pattern});
     }
 }
 
@@ -88,11 +109,11 @@ struct RopCopyBody {
     uint8_t *dst;
     const uint8_t *src;
 
-    template <class D>
-    HWY_INLINE void operator()(D d, size_t i) const {
+    template <class D, class Lanes = AllLanes>
+    HWY_INLINE void operator()(D d, size_t i, Lanes lanes = {}) const {
         auto *to = reinterpret_cast<T *>(dst) + i;
-        const auto s = hn::LoadU(d, reinterpret_cast<const T *>(src) + i);
-        hn::StoreU(combine<kRop>(s, hn::LoadU(d, to)), d, to);
+        const auto s = lanes.load(d, reinterpret_cast<const T *>(src) + i);
+        lanes.store(d, combine<kRop>(s, lanes.load(d, to)), to);
     }
 };
 
@@ -119,9 +140,9 @@ void ropRows(DstRows dst, SrcRows src, Size bytes, int32 bytesPerPixel, bool bac
         if (!ordered) {
             const RopCopyBody<kRop, uint8_t> body = {to, from};
             if (backwards)
-                walkOnceBackwards<uint8_t>(bytes.width, body);
+                walkPartsBackwards<uint8_t>(bytes.width, body);
             else
-                walkOnce<uint8_t>(bytes.width, body);
+                walkParts<uint8_t>(to, bytes.width, body);
         } else if (bytesPerPixel == 2) {
             ropPixels<kRop, uint16_t>(to, from, bytes.width, backwards);
         } else if (bytesPerPixel == 4) {
@@ -139,11 +160,25 @@ void ropRowsOf(uint32_t rop, DstRows dst, SrcRows src, Size bytes, int32 bytesPe
            ...);
 }
 
+// The one operation of these that does not read what it writes.
+void copyInvertedStreamed(DstRows dst, SrcRows src, Size bytes) {
+    for (size_t y = 0; y < bytes.height; ++y) {
+        const RopCopyBody<RASTER_ROP_COPY_INVERTED, uint8_t> body = {dst.row(y), src.row(y)};
+        walkStreaming<uint8_t, 1>(
+            body.dst, bytes.width, [&](auto d, size_t i) HWY_ATTR { body(d, i); },
+            [&](auto d, size_t i) HWY_ATTR { body(d, i, AroundCaches()); });
+    }
+    hwy::FlushStream();
+}
+
 void RopCopy(DstRows dst, SrcRows src, Size bytes, int32 bytesPerPixel, uint32 rop,
              RowDirection direction) {
     const bool backwards = direction == RowDirection::RightToLeft;
     if (!backwards)
         bytes = joinedRows(bytes, bytes.width, dst.step, bytes.width, src.step);
+    if (rop == RASTER_ROP_COPY_INVERTED && isStreamed(bytes.width, bytes.height) &&
+        !rowsOverlap(dst, src, bytes))
+        return copyInvertedStreamed(dst, src, bytes);
     ropRowsOf<RASTER_ROP_AND, RASTER_ROP_AND_REVERSE, RASTER_ROP_AND_INVERTED, RASTER_ROP_XOR,
               RASTER_ROP_OR, RASTER_ROP_NOR, RASTER_ROP_EQUIV, RASTER_ROP_OR_REVERSE,
               RASTER_ROP_COPY_INVERTED, RASTER_ROP_OR_INVERTED, RASTER_ROP_NAND>(

@@ -1,0 +1,17 @@
+// The picture that the image operations work on, 32 bits a pixel.
+#pragma once
+
+#include "imageUtil.h"
+
+#include <vector>
+
+namespace quillon::bench {
+
+const ImageInfo &picture();
+
+constexpr int32 kPngLevel = 6;
+
+// The same as a PNG, compressed at that level.
+const std::vector<uint8> &pngFile();
+
+} // namespace quillon::bench

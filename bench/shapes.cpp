@@ -1,0 +1,206 @@
+#include "shapes.h"
+
+#include "memory.h"
+#include "operations/operations.h"
+#include "peers/peers.h"
+
+#include <algorithm>
+#include <chrono>
+#include <cstdio>
+#include <map>
+
+namespace quillon::bench {
+namespace {
+
+// The fastest of several tries: slower ones were disturbed.
+double nanoseconds(const Work &work, double tryNanoseconds) {
+    using Clock = std::chrono::steady_clock;
+    const auto timed = [&](size_t calls) {
+        const auto begin = Clock::now();
+        for (size_t call = 0; call < calls; ++call) {
+            work();
+            benchmark::ClobberMemory();
+        }
+        const std::chrono::duration<double, std::nano> elapsed = Clock::now() - begin;
+        return elapsed.count() / static_cast<double>(calls);
+    };
+    double least = timed(2);
+    const auto calls = static_cast<size_t>(std::max(tryNanoseconds / least, 1.0));
+    for (int i = 0; i < 5; ++i)
+        least = std::min(least, timed(calls));
+    return least;
+}
+
+// ---- Sweep ----------------------------------------------------------------
+
+constexpr uint32 kWidths = 300;
+constexpr uint32 kHeight = 16;
+constexpr double kTry = 4000;
+
+// Nanoseconds of a call for every width, those of one operation and one layout.
+struct Series {
+    std::vector<double> ours = std::vector<double>(kWidths + 1);
+    std::vector<double> plain = std::vector<double>(kWidths + 1); // 0: no such loop
+};
+using AllSeries = std::map<std::string, Series>;
+
+double median(std::vector<double> values) {
+    std::sort(values.begin(), values.end());
+    return values[values.size() / 2];
+}
+
+// The time for a pixel of widths up to a quarter smaller or larger.
+double neighbours(const std::vector<double> &times, uint32 width) {
+    const uint32 reach = std::min(width / 4, 16U);
+    std::vector<double> pixelTimes;
+    for (uint32 near = width - reach; near <= std::min(width + reach, kWidths); ++near) {
+        if (near != width)
+            pixelTimes.push_back(times[near] / near);
+    }
+    return median(pixelTimes);
+}
+
+// Each width, as an operation of that area.
+void measureWidth(const Area &area, AllSeries &series) {
+    Plan plan;
+    addPixelOperations(plan, area);
+    Offers plain;
+    offerPlainLoops(plain);
+    for (const Operation &operation : plan) {
+        Places places(operation);
+        const auto timed = [&](const Contender &contender) {
+            return nanoseconds(contender.prepare(places.job(0)), kTry);
+        };
+        Series &at = series[operation.name];
+        at.ours[area.width] = timed(operation.contenders[0]);
+        const auto loop = plain.find(operation.name);
+        if (loop != plain.end())
+            at.plain[area.width] = timed(loop->second[0]);
+    }
+}
+
+struct Finding {
+    double factor;
+    std::string text;
+};
+
+void findSlow(const std::string &operation, const std::string &layout, const Series &series,
+              std::vector<Finding> &findings) {
+    char text[200];
+    for (uint32 width = 1; width <= kWidths; ++width) {
+        const double ours = series.ours[width];
+        const double like = width < 4 ? 0 : width * neighbours(series.ours, width);
+        if (like > 0 && ours > 2 * like) {
+            std::snprintf(text, sizeof(text), "%s, %s, width %u: %.1f ns, its neighbours %.1f",
+                          operation.c_str(), layout.c_str(), width, ours, like);
+            findings.push_back({ours / like, text});
+        }
+        if (series.plain[width] > 0 && ours > series.plain[width]) {
+            std::snprintf(text, sizeof(text), "%s, %s, width %u: %.1f ns, a plain loop %.1f",
+                          operation.c_str(), layout.c_str(), width, ours, series.plain[width]);
+            findings.push_back({ours / series.plain[width], text});
+        }
+    }
+}
+
+// Each alignment, against the others of the same width.
+void sweepAlignments(std::vector<Finding> &findings) {
+    for (const uint32 width : {16U, 61U, 250U}) {
+        std::map<std::string, std::vector<double>> times;
+        for (uint32 offset = 0; offset < 64; ++offset) {
+            AllSeries series;
+            measureWidth({"", width, kHeight, kWidths, false, offset, 0}, series);
+            for (const auto &[operation, at] : series)
+                times[operation].push_back(at.ours[width]);
+        }
+        for (const auto &[operation, at] : times) {
+            for (uint32 offset = 0; offset < 64; ++offset) {
+                const double factor = at[offset] / median(at);
+                char text[200];
+                std::snprintf(text, sizeof(text), "%s, width %u, byte %u: %.1f ns, others %.1f",
+                              operation.c_str(), width, offset, at[offset], median(at));
+                if (factor > 2)
+                    findings.push_back({factor, text});
+            }
+        }
+    }
+}
+
+// ---- Growth ---------------------------------------------------------------
+
+constexpr uint32 kSides[] = {16, 32, 64, 128, 256, 512, 1024, 2048, 4096, 8192};
+
+bool isShown(const std::string &operation) {
+    constexpr const char *kShown[] = {
+        "fill 32",          "alpha fill",       "raster fill xor 32", "copy 32",
+        "scroll up",        "blend noise",      "bits noise to 32",   "stencil text to 32",
+        "convert 16 to 32", "convert 32 to 24", "index to 32",        "nearest by 1.5",
+        "linear by 1.5",    "box by 0.75",      "YUY2 to 32",         "YV12 to 32"};
+    return std::find(std::begin(kShown), std::end(kShown), operation) != std::end(kShown);
+}
+
+} // namespace
+
+int sweep() {
+    struct Layout {
+        const char *name;
+        uint32 surfaceWidth, extraStep;
+    };
+    constexpr Layout kLayouts[] = {
+        {"packed", 0, 0}, {"in a surface", 2 * kWidths, 0}, {"odd line increments", kWidths, 1}};
+
+    std::vector<Finding> findings;
+    for (const Layout &layout : kLayouts) {
+        AllSeries series;
+        for (uint32 width = 1; width <= kWidths; ++width) {
+            if (width % 10 == 0) {
+                std::fprintf(stderr, "\r%s: width %u of %u ", layout.name, width, kWidths);
+                std::fflush(stderr);
+            }
+            measureWidth({"", width, kHeight, layout.surfaceWidth, false, 0, layout.extraStep},
+                         series);
+        }
+        std::fprintf(stderr, "\n");
+        for (const auto &[operation, at] : series)
+            findSlow(operation, layout.name, at, findings);
+    }
+    std::fprintf(stderr, "alignments\n");
+    sweepAlignments(findings);
+
+    std::sort(findings.begin(), findings.end(),
+              [](const Finding &a, const Finding &b) { return a.factor > b.factor; });
+    for (const Finding &finding : findings)
+        std::printf("%5.2f  %s\n", finding.factor, finding.text.c_str());
+    std::printf("%zu slow corners\n", findings.size());
+    return findings.empty() ? 0 : 1;
+}
+
+int growth() {
+    std::printf("%-22s%8s", "ns a pixel, size", "empty*");
+    for (const uint32 side : kSides)
+        std::printf("%8u", side);
+    std::printf("\n");
+    Plan names;
+    addPixelOperations(names, kAreas[0]);
+    for (size_t index = 0; index < names.size(); ++index) {
+        if (!isShown(names[index].name))
+            continue;
+        const auto timed = [index](const Area &area) {
+            Plan plan;
+            addPixelOperations(plan, area);
+            Places places(plan[index]);
+            return nanoseconds(plan[index].contenders[0].prepare(places.job(0)), 1e6);
+        };
+        std::printf("%-22s%8.1f", names[index].name.c_str(), timed({"", 0, 1, 0, false}));
+        for (const uint32 side : kSides) {
+            const double pixels = double{1} * side * side;
+            std::printf("%8.3f", timed({"", side, side, 0, false}) / pixels);
+            std::fflush(stdout);
+        }
+        std::printf("\n");
+    }
+    std::printf("* nanoseconds of a call whose width is 0\n");
+    return 0;
+}
+
+} // namespace quillon::bench
