@@ -8,10 +8,12 @@
 namespace quillon::test {
 namespace {
 
-// A code is all of its 32 bits: 0x103 is not RASTER_ROP_COPY.
+// A code is all of its 32 bits: 0x103 is not RASTER_ROP_COPY.  One has kernels of
+// its own.
 uint32 randomRop(Random &random) {
-    return random.oneIn(16) ? random.oneOf({16u, 17u, 0x103u, 0x10006u, 0x80000000u, UINT32_MAX})
-                            : random.below(16);
+    if (random.oneIn(16))
+        return random.oneOf({16u, 17u, 0x103u, 0x10006u, 0x80000000u, UINT32_MAX});
+    return random.oneIn(8) ? uint32{RASTER_ROP_COPY_INVERTED} : random.below(16);
 }
 
 bool isIdle(uint32 rop) {

@@ -8,6 +8,7 @@ namespace {
 
 constexpr uint32 kFencedRows = 3;
 constexpr uint32 kMost = UINT32_MAX;
+constexpr size_t kLargePages = 450; // more than is kept in the caches of a core
 
 // The largest step there is downwards, and a step that only unsigned line
 // increments can have upwards.
@@ -152,31 +153,29 @@ void walk(const Case &c) {
     const std::vector<Part> &parts = c.operation.parts;
     const bool isRowByRow = c.operation.walk == Walk::kRowByRow;
     const bool isAway = c.operation.walk == Walk::kAwayFromSource;
-    const bool isSplit = isRowByRow || (isAway && parts[0].bytes == 3);
+    const bool isSplit = parts[0].bytes > sizeof(uint32) || (isAway && parts[0].bytes == 3);
     const uint32 split = isSplit ? parts[0].bytes : 1;
-    const auto address = [&](size_t i, int64_t row, int64_t column) {
-        const int64_t bits = parts[i].bytes == 0 ? 1 : 8 * parts[i].bytes / split;
-        return c.memories[i]->inModel(c.at[i].first + row * c.step(i) + column * bits / 8);
-    };
-    const auto pixel = [&](size_t i, int64_t row, int64_t column) {
-        uint32 value = 0;
-        std::memcpy(&value, address(i, row, column), std::max(parts[i].bytes / split, 1u));
-        return parts[i].bytes == 0 ? value >> (7 - column % 8) & 1 : value;
-    };
     const int64_t width = int64_t{c.size.width} * split, height = c.size.height;
     const bool isFromLast = isRowByRow && c.at[1].y < c.at[0].y && c.overlaps();
     for (int64_t i = 0; i < height; ++i) {
-        const int64_t row = isFromLast ? height - 1 - i : i;
-        const bool isLeftwards = (isRowByRow && address(1, row, 0) < address(0, row, 0)) ||
+        std::array<uint8 *, 4> rows = {};
+        for (size_t k = 0; k < parts.size(); ++k)
+            rows[k] = c.memories[k]->inModel(c.at[k].first +
+                                             (isFromLast ? height - 1 - i : i) * c.step(k));
+        const bool isLeftwards = (isRowByRow && rows[1] < rows[0]) ||
                                  (isAway && c.at[1].y == c.at[0].y && c.at[1].x < c.at[0].x);
         for (int64_t j = 0; j < width; ++j) {
             const int64_t column = isLeftwards ? width - 1 - j : j;
             Pixels pixels = {};
-            for (size_t k = 0; k < parts.size(); ++k)
-                if (parts[k].isTouched)
-                    pixels[k] = pixel(k, row, column);
-            const uint32 result = c.operation.reference(pixels);
-            std::memcpy(address(0, row, column), &result, parts[0].bytes / split);
+            for (size_t k = 0; k < parts.size(); ++k) {
+                const uint32 bytes = parts[k].bytes / split;
+                if (bytes == 0)
+                    pixels[k] = rows[k][column / 8] >> (7 - column % 8) & 1;
+                else if (parts[k].isTouched)
+                    std::memcpy(&pixels[k], rows[k] + column * bytes, bytes);
+            }
+            const uint32 result = c.operation.reference(pixels), bytes = parts[0].bytes / split;
+            std::memcpy(rows[0] + column * bytes, &result, bytes);
         }
     }
 }
@@ -239,22 +238,32 @@ testing::AssertionResult TwinMemory::agree() const {
 }
 
 Arena::Arena()
-    : blocks_(four(6, 1, 0)), rows_(four(1, kFencedRows, 2 * pageSize())),
-      farRows_(four(1, kFencedRows, kFar)) {}
+    : blocks_(four(6, 1, 0)), largeBlocks_(four(kLargePages, 1, 0)),
+      rows_(four(1, kFencedRows, 2 * pageSize())), farRows_(four(1, kFencedRows, kFar)) {}
 
 void Arena::check(Random &random, const Operation &operation) {
     if (!operation.parts[0].isTouched || random.oneIn(32))
         return callForNothing(random, operation, random.oneIn(4) ? nullptr : blocks_[0].nowhere());
 
-    const bool isFar = random.oneIn(16), isInRows = isFar || random.oneIn(3);
-    const bool isNear = !isInRows && operation.mayOverlap && random.oneIn(2);
+    const bool isLarge = random.oneIn(2000), isFar = !isLarge && random.oneIn(16);
+    const bool isInRows = isFar || (!isLarge && random.oneIn(3));
+    const bool isNear = !isInRows && !isLarge && operation.mayOverlap && random.oneIn(2);
     Size size = {randomWidth(random), random.below(random.oneIn(16) ? 40 : 6)};
     if (isInRows)
         size = {random.below(141), kFencedRows};
     else if (isNear)
         size = {random.below(100), 1 + random.below(4)};
+    else if (isLarge)
+        size.width = 256 + random.below(2000);
+    if (isLarge)
+        size.height = static_cast<uint32>(largeBlocks_[0].runBytes() /
+                                          operation.parts[0].rowBytes(size.width));
 
-    Case c = {operation, isInRows, isNear, size, isFar ? farRows_ : isInRows ? rows_ : blocks_};
+    Case c = {operation, isInRows, isNear, size,
+              isLarge    ? largeBlocks_
+              : isFar    ? farRows_
+              : isInRows ? rows_
+                         : blocks_};
     drawCoordinates(random, c);
     for (size_t i = 0; i < c.at.size(); ++i)
         drawLine(random, c, i);

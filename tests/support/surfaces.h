@@ -101,11 +101,12 @@ public:
 
     // One call: anywhere in memory, often flush against a fence; or with
     // surfaces so near that a vector can run into itself; or with a fence at an
-    // edge of every row, the rows up to 2 GB apart; or with nothing to do.
+    // edge of every row, the rows up to 2 GB apart; or so large that caches are
+    // passed by; or with nothing to do.
     void check(Random &random, const Operation &operation);
 
 private:
-    std::array<TwinMemory, 4> blocks_, rows_, farRows_; // for each surface
+    std::array<TwinMemory, 4> blocks_, largeBlocks_, rows_, farRows_; // for each surface
 };
 
 // Random operations, on every instruction set.
