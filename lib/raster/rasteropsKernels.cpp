@@ -1,5 +1,7 @@
 #include "raster/rasteropsKernels.h"
 
+#include <cstring>
+
 #undef HWY_TARGET_INCLUDE
 #define HWY_TARGET_INCLUDE "raster/rasteropsKernels.cpp"
 #include "hwy/foreach_target.h"
@@ -16,80 +18,71 @@ namespace {
 // ---- Fill ---------------------------------------------------------------
 
 // Rows too short for the smallest vector, of 1 to 3 bytes.
-void fillFewBytes(DstRows dst, Size bytes, const uint8_t *pattern) {
-    for (size_t y = 0; y < bytes.height; ++y) {
-        uint8_t *row = dst.row(y);
-        for (size_t i = 0; i < bytes.width; ++i)
-            row[i] = pattern[i];
-    }
+void fillFewBytes(DstRows dst, Size bytes, const PixelPattern &pattern) {
+    const uint32_t word = hn::GetLane(pattern.from(hn::CappedTag<uint32_t, 1>(), 0));
+    for (size_t y = 0; y < bytes.height; ++y)
+        std::memcpy(dst.row(y), &word, bytes.width);
 }
 
-// The bytes of a row from where vectors are aligned on, three vectors in turn so
-// that each holds its part of the pattern.
-template <class Stores, size_t kCap, class D>
-HWY_INLINE void fillAligned(D d, uint8_t *row, size_t i, size_t end,
-                            const BytePattern<kCap> &pattern) {
-    constexpr size_t n = kCap;
-    const auto from = [&](size_t offset) HWY_ATTR {
-        return hn::LoadU(d, reinterpret_cast<const uint32_t *>(pattern.from(offset)));
-    };
-    const auto first = from(i);
-    const auto second = from(i + n);
-    const auto third = from(i + 2 * n);
-    for (; end - i >= 3 * n; i += 3 * n) {
-        Stores::store(d, first, row + i);
-        Stores::store(d, second, row + i + n);
-        Stores::store(d, third, row + i + 2 * n);
+// The vectors from byte i on, but for the last one of the row.
+template <class Stores, class D>
+HWY_INLINE void fillFrom(D d, uint8_t *row, size_t i, size_t end, const PatternVectors<D> &v) {
+    constexpr size_t n = PatternVectors<D>::kBytes;
+    for (; end - i > 3 * n; i += 3 * n) {
+        Stores::store(d, v.first, row + i);
+        Stores::store(d, v.second, row + i + n);
+        Stores::store(d, v.third, row + i + 2 * n);
     }
-    if (end - i >= n)
-        Stores::store(d, first, row + i);
-    if (end - i >= 2 * n)
-        Stores::store(d, second, row + i + n);
+    if (end - i > n)
+        Stores::store(d, v.first, row + i);
+    if (end - i > 2 * n)
+        Stores::store(d, v.second, row + i + n);
 }
 
 // Rows of at least one vector.  The first and the last vector are stored as they
 // come and may overlap what is between them, which is aligned where it is long
 // enough to be worth that.
-template <class Stores, size_t kCap>
-void fillVectors(DstRows dst, Size bytes, const BytePattern<kCap> &pattern) {
-    // In words: the fallback has no other lanes of 4 bytes.
-    const hn::CappedTag<uint32_t, kCap / 4> d;
-    constexpr size_t n = kCap;
-    const auto from = [&](size_t offset) HWY_ATTR {
-        return hn::LoadU(d, reinterpret_cast<const uint32_t *>(pattern.from(offset)));
-    };
-    const auto first = from(0);
-    const auto last = from(bytes.width - n);
+template <class Stores, class D>
+void fillVectors(D d, DstRows dst, Size bytes, const PixelPattern &pattern) {
+    constexpr size_t n = PatternVectors<D>::kBytes;
+    const auto first = pattern.from(d, 0);
+    const auto last = pattern.from(d, bytes.width - n);
     const bool isLong = bytes.width >= 8 * n;
+    size_t begin = n;
+    PatternVectors<D> between(d, pattern, begin);
     for (size_t y = 0; y < bytes.height; ++y) {
         uint8_t *row = dst.row(y);
+        const size_t toAligned = n - reinterpret_cast<uintptr_t>(row) % n;
+        if (isLong && begin != toAligned) {
+            begin = toAligned;
+            between = PatternVectors<D>(d, pattern, begin);
+        }
         ThroughCaches::store(d, first, row);
-        const size_t begin = isLong ? n - reinterpret_cast<uintptr_t>(row) % n : n;
-        fillAligned<Stores, kCap>(d, row, begin, bytes.width, pattern);
+        fillFrom<Stores>(d, row, begin, bytes.width, between);
         ThroughCaches::store(d, last, row + bytes.width - n);
     }
 }
 
-// The widest vectors that fit a row.
-template <size_t kCap>
-void fillCapped(DstRows dst, Size bytes, uint32_t pixel, int32_t bytesPerPixel) {
-    if (bytes.width >= kCap)
-        fillVectors<ThroughCaches>(dst, bytes, BytePattern<kCap>(pixel, bytesPerPixel));
-    else if constexpr (kCap > 4)
-        fillCapped<kCap / 2>(dst, bytes, pixel, bytesPerPixel);
+// The widest vectors that fit a row, in words: the fallback has no others of 4 bytes.
+template <size_t kBytes>
+void fillCapped(DstRows dst, Size bytes, const PixelPattern &pattern) {
+    if (bytes.width >= kBytes)
+        fillVectors<ThroughCaches>(hn::CappedTag<uint32_t, kBytes / 4>(), dst, bytes, pattern);
+    else if constexpr (kBytes > 4)
+        fillCapped<kBytes / 2>(dst, bytes, pattern);
     else
-        fillFewBytes(dst, bytes, BytePattern<4>(pixel, bytesPerPixel).bytes);
+        fillFewBytes(dst, bytes, pattern);
 }
 
 void Fill(DstRows dst, Size size, int32 bytesPerPixel, uint32 pixel) {
     const size_t rowBytes = size.width * static_cast<size_t>(bytesPerPixel);
     const Size bytes = joinedRows({rowBytes, size.height}, rowBytes, dst.step);
-    constexpr size_t n = 4 * kLanes<Widest<uint32_t>>;
+    const PixelPattern pattern(pixel, bytesPerPixel);
     if (isStreamed(bytes.width, bytes.height)) {
-        fillVectors<AroundCaches>(dst, bytes, BytePattern<n>(pixel, bytesPerPixel));
+        fillVectors<AroundCaches>(Widest<uint32_t>(), dst, bytes, pattern);
         hwy::FlushStream();
     } else {
-        fillCapped<n>(dst, bytes, pixel, bytesPerPixel);
+        fillCapped<4 * kLanes<Widest<uint32_t>>>(dst, bytes, pattern);
     }
 }
 
