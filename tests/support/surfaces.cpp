@@ -120,12 +120,13 @@ uint8 *drawFirst(Random &random, Case &c, size_t i, bool isFlushBehind, bool isN
     if (c.isInRows)
         return memory.run(c.step(i) < 0 ? kFencedRows - 1 : 0) +
                (isFlushBehind ? memory.runBytes() - c.rowBytes(i) : 0);
-    if (isNear)
-        return memory.run(0) + memory.runBytes() / 2 + (i == 0 ? 0 : random.between(-128, 128));
     const Extent extent = c.extent(i);
+    uint8 *const lowest = memory.run(0) + extent.below;
     const int64_t room = static_cast<int64_t>(memory.runBytes()) - extent.below - extent.above;
+    if (isNear && i > 0)
+        return std::clamp(c.at[0].first + random.between(-128, 128), lowest, lowest + room);
     const int64_t anywhere = random.below(static_cast<uint32>(room) + 1);
-    return memory.run(0) + extent.below + random.oneOf({int64_t{0}, room, room, anywhere});
+    return lowest + (isNear ? room / 2 : random.oneOf({int64_t{0}, room, room, anywhere}));
 }
 
 void drawPlaces(Random &random, Case &c) {
@@ -245,19 +246,19 @@ void Arena::check(Random &random, const Operation &operation) {
     if (!operation.parts[0].isTouched || random.oneIn(32))
         return callForNothing(random, operation, random.oneIn(4) ? nullptr : blocks_[0].nowhere());
 
-    const bool isLarge = random.oneIn(2000), isFar = !isLarge && random.oneIn(16);
+    const bool isLarge = random.oneIn(1000), isFar = !isLarge && random.oneIn(16);
     const bool isInRows = isFar || (!isLarge && random.oneIn(3));
-    const bool isNear = !isInRows && !isLarge && operation.mayOverlap && random.oneIn(2);
+    const bool isNear = !isInRows && operation.mayOverlap && random.oneIn(2);
     Size size = {randomWidth(random), random.below(random.oneIn(16) ? 40 : 6)};
-    if (isInRows)
+    if (isInRows) {
         size = {random.below(141), kFencedRows};
-    else if (isNear)
-        size = {random.below(100), 1 + random.below(4)};
-    else if (isLarge)
+    } else if (isLarge) {
         size.width = 256 + random.below(2000);
-    if (isLarge)
-        size.height = static_cast<uint32>(largeBlocks_[0].runBytes() /
-                                          operation.parts[0].rowBytes(size.width));
+        const size_t rowBytes = operation.parts[0].rowBytes(size.width);
+        size.height = static_cast<uint32>(largeBlocks_[0].runBytes() / rowBytes);
+    } else if (isNear) {
+        size = {random.below(100), 1 + random.below(4)};
+    }
 
     Case c = {operation, isInRows, isNear, size,
               isLarge    ? largeBlocks_
