@@ -1,7 +1,5 @@
 #include "raster/rasteropsKernels.h"
 
-#include <cstring>
-
 #undef HWY_TARGET_INCLUDE
 #define HWY_TARGET_INCLUDE "raster/rasteropsKernels.cpp"
 #include "hwy/foreach_target.h"
@@ -20,8 +18,13 @@ namespace {
 // Rows too short for the smallest vector, of 1 to 3 bytes.
 void fillFewBytes(DstRows dst, Size bytes, const PixelPattern &pattern) {
     const uint32_t word = hn::GetLane(pattern.from(hn::CappedTag<uint32_t, 1>(), 0));
-    for (size_t y = 0; y < bytes.height; ++y)
-        std::memcpy(dst.row(y), &word, bytes.width);
+    const size_t middle = bytes.width / 2, last = bytes.width - 1;
+    for (size_t y = 0; y < bytes.height; ++y) {
+        uint8_t *row = dst.row(y);
+        row[0] = static_cast<uint8_t>(word);
+        row[middle] = static_cast<uint8_t>(word >> (8 * middle));
+        row[last] = static_cast<uint8_t>(word >> (8 * last));
+    }
 }
 
 // The vectors from byte i on, but for the last one of the row.
@@ -100,8 +103,18 @@ struct SetAlpha {
     }
 };
 
+// Rows too short for vectors, of 1 to 3 pixels: only the bytes that change.
+void fillFewAlphas(DstRows dst, Size size, uint8 alpha) {
+    for (size_t y = 0; y < size.height; ++y) {
+        uint8_t *row = dst.row(y);
+        row[3] = row[4 * (size.width / 2) + 3] = row[4 * size.width - 1] = alpha;
+    }
+}
+
 void FillAlpha(DstRows dst, Size size, uint8 alpha) {
     size = joinedRows(size, 4 * size.width, dst.step);
+    if (size.width < 4)
+        return fillFewAlphas(dst, size, alpha);
     for (size_t y = 0; y < size.height; ++y) {
         uint8_t *row = dst.row(y);
         walkParts<uint32_t>(row, size.width, SetAlpha{row, uint32_t{alpha} << 24});
