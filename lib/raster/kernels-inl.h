@@ -187,7 +187,20 @@ HWY_INLINE void walkPartsBackwards(size_t count, const Body &body) {
 
 template <class T, class Body>
 HWY_INLINE void walkParts(const uint8_t * /*dst*/, size_t count, const Body &body) {
-    walkOnce<T>(count, [&](auto d, size_t i) HWY_ATTR { body(d, i, AllLanes()); });
+    const auto whole = [&](auto d, size_t i) HWY_ATTR { body(d, i, AllLanes()); };
+    const Widest<T> d;
+    constexpr size_t n = kLanes<decltype(d)>;
+    size_t i = 0;
+    for (; count - i >= 2 * n; i += 2 * n) {
+        whole(d, i);
+        whole(d, i + n);
+    }
+    if (count - i >= n) {
+        whole(d, i);
+        i += n;
+    }
+    if constexpr (n > 1)
+        walkTail<T, n / 2>(i, count, whole);
 }
 
 template <class T, class Body>
