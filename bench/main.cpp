@@ -81,7 +81,7 @@ int main(int argc, char **argv) {
     if (arguments.sweep)
         return sweep();
     if (arguments.growth)
-        return growth();
+        return growth(arguments.reportFolder);
 
     const Plan plan = makePlan();
     std::vector<Result> results;

@@ -7,6 +7,7 @@
 #include <algorithm>
 #include <chrono>
 #include <cstdio>
+#include <fstream>
 #include <map>
 
 namespace quillon::bench {
@@ -174,13 +175,18 @@ bool isShown(const std::string &operation) {
     return std::find(std::begin(kShown), std::end(kShown), operation) != std::end(kShown);
 }
 
-void showGrowth(const std::string &name) {
-    std::printf("%8.1f", timeOf(name, {"", 0, 1, 0, false}, kLongTry));
+// A row of the table: first a call that has nothing to do, then the squares.
+std::string growthRow(const std::string &name) {
+    char text[32];
+    std::snprintf(text, sizeof(text), "| %.1f", timeOf(name, {"", 0, 1, 0, false}, kLongTry));
+    std::string row = "| " + name + " " + text;
     for (const uint32 side : kSides) {
-        std::printf("%8.3f",
-                    timeOf(name, {"", side, side, 0, false}, kLongTry) / (double{1} * side * side));
-        std::fflush(stdout);
+        const double pixels = double{1} * side * side;
+        const double time = timeOf(name, {"", side, side, 0, false}, kLongTry);
+        std::snprintf(text, sizeof(text), " | %.3f", time / pixels);
+        row += time > 0 ? text : " | ";
     }
+    return row + " |\n";
 }
 
 } // namespace
@@ -214,21 +220,33 @@ int sweep() {
     return findings.empty() ? 0 : 1;
 }
 
-int growth() {
-    std::printf("%-22s%8s", "ns a pixel, size", "empty*");
+int growth(const std::string &folder) {
+    std::string page =
+        "# Growth\n\nWritten by `scripts/bench --growth --report=docs`; not by hand. "
+        "Nanoseconds a pixel of squares whose rows lie end to end, again and again "
+        "on the same memory, so that the steps are those from one cache to the "
+        "next; the first number is the nanoseconds of a call that has nothing to "
+        "do, its width being 0.\n\n| Operation | empty call";
     for (const uint32 side : kSides)
-        std::printf("%8u", side);
-    std::printf("\n");
+        page += " | " + std::to_string(side);
+    page += " |\n|---|--:";
+    for (size_t i = 0; i < std::size(kSides); ++i)
+        page += "|--:";
+    page += "|\n";
+    std::printf("%s", page.c_str());
+
     Plan names;
     addPixelOperations(names, kAreas[0]);
     for (const Operation &named : names) {
         if (!isShown(named.name))
             continue;
-        std::printf("%-22s", named.name.c_str());
-        showGrowth(named.name);
-        std::printf("\n");
+        const std::string row = growthRow(named.name);
+        std::printf("%s", row.c_str());
+        std::fflush(stdout);
+        page += row;
     }
-    std::printf("* nanoseconds of a call whose width is 0\n");
+    if (!folder.empty())
+        std::ofstream(folder + "/growth.md") << page;
     return 0;
 }
 
