@@ -31,10 +31,18 @@ void fillFewBytes(DstRows dst, Size bytes, const PixelPattern &pattern) {
 template <class Stores, class D>
 HWY_INLINE void fillFrom(D d, uint8_t *row, size_t i, size_t end, const PatternVectors<D> &v) {
     constexpr size_t n = PatternVectors<D>::kBytes;
-    for (; end - i > 3 * n; i += 3 * n) {
-        Stores::store(d, v.first, row + i);
-        Stores::store(d, v.second, row + i + n);
-        Stores::store(d, v.third, row + i + 2 * n);
+    const auto storeThree = [&](size_t at) HWY_ATTR {
+        Stores::store(d, v.first, row + at);
+        Stores::store(d, v.second, row + at + n);
+        Stores::store(d, v.third, row + at + 2 * n);
+    };
+    for (; end - i > 6 * n; i += 6 * n) {
+        storeThree(i);
+        storeThree(i + 3 * n);
+    }
+    if (end - i > 3 * n) {
+        storeThree(i);
+        i += 3 * n;
     }
     if (end - i > n)
         Stores::store(d, v.first, row + i);
@@ -50,7 +58,7 @@ void fillVectors(D d, DstRows dst, Size bytes, const PixelPattern &pattern) {
     constexpr size_t n = PatternVectors<D>::kBytes;
     const auto first = pattern.from(d, 0);
     const auto last = pattern.from(d, bytes.width - n);
-    const bool isLong = bytes.width >= 8 * n;
+    const bool isLong = bytes.width >= 4 * n;
     size_t begin = n;
     PatternVectors<D> between(d, pattern, begin);
     for (size_t y = 0; y < bytes.height; ++y) {
