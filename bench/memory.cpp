@@ -18,13 +18,6 @@ constexpr size_t kLeft = 100;
 // different distances from a page, and in the surface at kLeft.
 constexpr size_t kSlack = 1024;
 
-size_t placeBytes(const Operation &operation) {
-    size_t bytes = 0;
-    for (const Plane &plane : operation.planes)
-        bytes += (plane.bytes() + kSlack + kPage - 1) / kPage * kPage;
-    return bytes;
-}
-
 // The memory that all operations share, one after the other.
 uint8 *arena() {
     static uint8 *const memory = [] {
@@ -52,8 +45,15 @@ size_t arenaBytes() {
     return std::clamp(2 * static_cast<size_t>(std::max(lastCache, 0L)), kLeast, kMost);
 }
 
+size_t Places::bytesOf(const Operation &operation) {
+    size_t bytes = 0;
+    for (const Plane &plane : operation.planes)
+        bytes += (plane.bytes() + kSlack + kPage - 1) / kPage * kPage;
+    return bytes;
+}
+
 Places::Places(const Operation &operation) : dstPlane(operation.planes.front()) {
-    const size_t bytes = placeBytes(operation);
+    const size_t bytes = bytesOf(operation);
     if (bytes > arenaBytes())
         throw std::runtime_error(operation.name + " is larger than the memory for it");
     const size_t places = operation.area.uncached ? arenaBytes() / bytes : 1;

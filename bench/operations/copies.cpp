@@ -27,6 +27,8 @@ void addCopy(Plan &plan, const Area &area, uint32 bits) {
 // Within one surface, by lines and pixels: what memmove does row by row.
 void addScroll(Plan &plan, const Area &area, const std::string &name, uint32 fromX, uint32 fromY,
                uint32 toX, uint32 toY) {
+    if (area.width <= fromX + toX || area.height <= fromY + toY)
+        return;
     const auto ours = [=](const Job &job) -> Work {
         return [=, dst = job.dst] {
             Raster_RectCopy(dst.data, dst.line(), dst.data, dst.line(), 4, fromX, fromY, toX, toY,

@@ -76,7 +76,7 @@ HWY_INLINE void copyCapped(DstRows dst, SrcRows src, Size bytes) {
 }
 
 void CopyShort(DstRows dst, SrcRows src, Size bytes) {
-    constexpr size_t kMost = 4 * 4 * kLanes<hn::CappedTag<uint32_t, 16>>;
+    constexpr size_t kMost = size_t{16} * kLanes<hn::CappedTag<uint32_t, 16>>;
     if (bytes.width <= kMost)
         return copyCapped<64>(dst, src, bytes);
     for (size_t y = 0; y < bytes.height; ++y)

@@ -1,7 +1,5 @@
 #include "raster/rasteropsKernels.h"
 
-#include <cstring>
-
 #undef HWY_TARGET_INCLUDE
 #define HWY_TARGET_INCLUDE "raster/rasteropsKernels.cpp"
 #include "hwy/foreach_target.h"
@@ -20,18 +18,31 @@ namespace {
 // Rows too short for the smallest vector, of 1 to 3 bytes.
 void fillFewBytes(DstRows dst, Size bytes, const PixelPattern &pattern) {
     const uint32_t word = hn::GetLane(pattern.from(hn::CappedTag<uint32_t, 1>(), 0));
-    for (size_t y = 0; y < bytes.height; ++y)
-        std::memcpy(dst.row(y), &word, bytes.width);
+    const size_t middle = bytes.width / 2, last = bytes.width - 1;
+    for (size_t y = 0; y < bytes.height; ++y) {
+        uint8_t *row = dst.row(y);
+        row[0] = static_cast<uint8_t>(word);
+        row[middle] = static_cast<uint8_t>(word >> (8 * middle));
+        row[last] = static_cast<uint8_t>(word >> (8 * last));
+    }
 }
 
 // The vectors from byte i on, but for the last one of the row.
 template <class Stores, class D>
 HWY_INLINE void fillFrom(D d, uint8_t *row, size_t i, size_t end, const PatternVectors<D> &v) {
     constexpr size_t n = PatternVectors<D>::kBytes;
-    for (; end - i > 3 * n; i += 3 * n) {
-        Stores::store(d, v.first, row + i);
-        Stores::store(d, v.second, row + i + n);
-        Stores::store(d, v.third, row + i + 2 * n);
+    const auto storeThree = [&](size_t at) HWY_ATTR {
+        Stores::store(d, v.first, row + at);
+        Stores::store(d, v.second, row + at + n);
+        Stores::store(d, v.third, row + at + 2 * n);
+    };
+    for (; end - i > 6 * n; i += 6 * n) {
+        storeThree(i);
+        storeThree(i + 3 * n);
+    }
+    if (end - i > 3 * n) {
+        storeThree(i);
+        i += 3 * n;
     }
     if (end - i > n)
         Stores::store(d, v.first, row + i);
@@ -47,7 +58,7 @@ void fillVectors(D d, DstRows dst, Size bytes, const PixelPattern &pattern) {
     constexpr size_t n = PatternVectors<D>::kBytes;
     const auto first = pattern.from(d, 0);
     const auto last = pattern.from(d, bytes.width - n);
-    const bool isLong = bytes.width >= 8 * n;
+    const bool isLong = bytes.width >= 4 * n;
     size_t begin = n;
     PatternVectors<D> between(d, pattern, begin);
     for (size_t y = 0; y < bytes.height; ++y) {
@@ -100,8 +111,18 @@ struct SetAlpha {
     }
 };
 
+// Rows too short for vectors, of 1 to 3 pixels: only the bytes that change.
+void fillFewAlphas(DstRows dst, Size size, uint8 alpha) {
+    for (size_t y = 0; y < size.height; ++y) {
+        uint8_t *row = dst.row(y);
+        row[3] = row[4 * (size.width / 2) + 3] = row[4 * size.width - 1] = alpha;
+    }
+}
+
 void FillAlpha(DstRows dst, Size size, uint8 alpha) {
     size = joinedRows(size, 4 * size.width, dst.step);
+    if (size.width < 4)
+        return fillFewAlphas(dst, size, alpha);
     for (size_t y = 0; y < size.height; ++y) {
         uint8_t *row = dst.row(y);
         walkParts<uint32_t>(row, size.width, SetAlpha{row, uint32_t{alpha} << 24});
