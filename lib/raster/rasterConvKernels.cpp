@@ -220,7 +220,8 @@ template <class Conversion>
 void convertRectangle(Job job) {
     job.size = joinedRows(job.size, Conversion::kDstBytes * job.size.width, job.dst.step,
                           Conversion::kSrcBytes * job.size.width, job.src.step);
-    if (kLanes < Widest < uint8_t >>> 1 && job.size.width >= kLongRow)
+    constexpr size_t n = kLanes<Widest<uint8_t>>;
+    if (n > 1 && job.size.width >= kLongRow)
         convertLongRows<Conversion>(job);
     else
         convertRows<Conversion>(job);
