@@ -134,9 +134,22 @@ struct Job {
 // From how many pixels on it pays to align the blocks to the destination's lines.
 inline constexpr size_t kLongRow = 512;
 
-// How many bytes to ask for ahead of the block at hand where the source is not in
-// the caches: what the processor asks for itself ends with a page.
-inline constexpr size_t kAhead = 3072;
+// How far ahead of the block at hand to ask for memory, in bytes; 0 not at all.  The
+// processor asks ahead itself, but only inside a page, and not for the next row.
+struct Ahead {
+    ptrdiff_t src, dst;
+};
+inline constexpr Ahead kAheadInCaches = {768, 768};
+inline constexpr Ahead kAheadOfCaches = {3072, 0};
+
+// Asks for the lines of so many bytes.
+HWY_INLINE void prefetchBytes(const uint8_t *from, size_t bytes, ptrdiff_t ahead) {
+    if (ahead == 0)
+        return;
+    const uint8_t *line = advance(from, static_cast<uint64_t>(ahead));
+    for (size_t i = 0; i < bytes; i += 64)
+        hwy::Prefetch(advance(line, i));
+}
 
 // A row of a conversion, by pixels.
 template <class Conversion>
@@ -150,9 +163,9 @@ struct RowOf {
         Conversion::template convert<Stores>(d, dst + i * Conversion::kDstBytes,
                                              src + i * Conversion::kSrcBytes, tables);
     }
-    HWY_INLINE void prefetch(size_t i, size_t count) const {
-        for (size_t ahead = kAhead; ahead < kAhead + count * Conversion::kSrcBytes; ahead += 64)
-            hwy::Prefetch(src + i * Conversion::kSrcBytes + ahead);
+    HWY_INLINE void prefetch(size_t i, size_t count, const Ahead &ahead) const {
+        prefetchBytes(src + i * Conversion::kSrcBytes, count * Conversion::kSrcBytes, ahead.src);
+        prefetchBytes(dst + i * Conversion::kDstBytes, count * Conversion::kDstBytes, ahead.dst);
     }
 };
 
@@ -166,9 +179,12 @@ HWY_NOINLINE void convertRows(const Job &job) {
     }
     const hn::CappedTag<uint8_t, kBlock> d;
     const size_t last = job.size.width - kBlock;
+    const Ahead nextRow = {job.src.step, job.dst.step};
     RowOf<Conversion> row = {job.dst.first, job.src.first, job.tables};
     for (size_t y = 0; y < job.size.height; ++y) {
         for (size_t i = 0;; i = std::min(i + kBlock, last)) {
+            if constexpr (kBlock >= 32)
+                row.prefetch(i, kBlock, nextRow);
             row.template convert<ThroughCaches>(d, i);
             if (i == last)
                 break;
@@ -203,12 +219,14 @@ HWY_NOINLINE void convertLongRows(const Job &job) {
         convertPiece(row, 0, begin);
         if (streams) {
             for (; width - i >= n; i += n) {
-                row.prefetch(i, n);
+                row.prefetch(i, n, kAheadOfCaches);
                 row.template convert<AroundCaches>(d, i);
             }
         } else {
-            for (; width - i >= n; i += n)
+            for (; width - i >= n; i += n) {
+                row.prefetch(i, n, kAheadInCaches);
                 row.template convert<ToWholeLines>(d, i);
+            }
         }
         convertPiece(row, i, width);
     }

@@ -173,22 +173,25 @@ HWY_INLINE V blendOver(D d, V src, V dst) {
 
 #endif
 
-// In surfaces that no cache holds the arithmetic leaves memory waiting, unless it
-// is told ahead.
-constexpr size_t kAhead = 2048;
+// Bytes to ask for ahead of the vector at hand.  Rows of some length ask for the
+// same place of the next row, which the processor does not do of itself.
+constexpr ptrdiff_t kAheadInCaches = 768;
+constexpr ptrdiff_t kAheadOfCaches = 2048;
+constexpr size_t kLongRow = 1024; // pixels
 
-template <bool kIsLarge>
+template <bool kPrefetches>
 struct BlendOver {
     uint8_t *dst;
     const uint8_t *src;
+    ptrdiff_t dstAhead, srcAhead;
 
     template <class D, class Lanes = AllLanes>
     HWY_INLINE void operator()(D d, size_t i, Lanes lanes = {}) const {
         uint8_t *at = dst + 4 * i;
         const uint8_t *from = src + 4 * i;
-        if constexpr (kIsLarge) {
-            hwy::Prefetch(at + kAhead);
-            hwy::Prefetch(from + kAhead);
+        if constexpr (kPrefetches) {
+            hwy::Prefetch(advance(at, static_cast<uint64_t>(dstAhead)));
+            hwy::Prefetch(advance(from, static_cast<uint64_t>(srcAhead)));
         }
         auto *pixels = reinterpret_cast<uint32_t *>(at);
         const auto over = lanes.load(d, reinterpret_cast<const uint32_t *>(from));
@@ -206,10 +209,10 @@ struct BlendOver {
     }
 };
 
-template <bool kIsLarge>
-void blendRows(DstRows dst, SrcRows src, Size size) {
+template <bool kPrefetches>
+void blendRows(DstRows dst, SrcRows src, Size size, ptrdiff_t dstAhead, ptrdiff_t srcAhead) {
     for (size_t y = 0; y < size.height; ++y) {
-        const BlendOver<kIsLarge> body = {dst.row(y), src.row(y)};
+        const BlendOver<kPrefetches> body = {dst.row(y), src.row(y), dstAhead, srcAhead};
         if (runsIntoItself(body.dst, body.src, 4 * kLanes<Widest<uint32_t>>))
             walkSingly<uint32_t>(size.width, body);
         else
@@ -219,10 +222,14 @@ void blendRows(DstRows dst, SrcRows src, Size size) {
 
 void Blend(DstRows dst, SrcRows src, Size size) {
     size = joinedRows(size, 4 * size.width, dst.step, 4 * size.width, src.step);
-    if (isStreamed(4 * size.width, size.height))
-        blendRows<true>(dst, src, size);
+    const ptrdiff_t ahead =
+        isStreamed(4 * size.width, size.height) ? kAheadOfCaches : kAheadInCaches;
+    if (size.width >= kLongRow)
+        blendRows<true>(dst, src, size, ahead, ahead);
+    else if (size.width >= 64)
+        blendRows<true>(dst, src, size, dst.step, src.step);
     else
-        blendRows<false>(dst, src, size);
+        blendRows<false>(dst, src, size, 0, 0);
 }
 
 } // namespace
