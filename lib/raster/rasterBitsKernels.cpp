@@ -27,6 +27,17 @@ HWY_INLINE uint64_t leftmostHighest(uint64_t number) {
     return __builtin_bswap64(number);
 }
 
+// A row of 1 to 8 bytes, some of them read twice.
+HWY_INLINE uint64_t fewBytes(const uint8_t *bits, size_t bytes) {
+    const size_t middle = bytes / 2, last = bytes - 1;
+    if (bytes < 4)
+        return bits[0] | uint64_t{bits[middle]} << 8 * middle | uint64_t{bits[last]} << 8 * last;
+    uint32_t first4 = 0, last4 = 0;
+    hwy::CopyBytes<4>(bits, &first4);
+    hwy::CopyBytes<4>(bits + bytes - 4, &last4);
+    return first4 | uint64_t{last4} << 8 * (bytes - 4);
+}
+
 // The bits of a row, from a byte on.
 struct WholeBytes {
     const uint8_t *first;
@@ -245,8 +256,8 @@ class Stencil {
 public:
     explicit Stencil(uint32_t pixel) : pixel_(pixel) {}
 
-    // dst is where the number's highest bit belongs.
-    HWY_INLINE void block(uint64_t number, uint8_t *dst) const {
+    // Of a row that ends no sooner than after so many pixels.
+    HWY_INLINE void block(uint64_t number, uint8_t *dst, size_t /*pixels*/ = kBlock) const {
         for (; number != 0; number &= number - 1)
             storePixel<kBytes>(dst + static_cast<size_t>(std::countr_zero(number) ^ 7) * kBytes,
                                pixel_);
@@ -264,11 +275,12 @@ class Stencil<kBytes> {
 public:
     explicit Stencil(uint32_t pixel) : colour_(D(), pixel) {}
 
-    HWY_INLINE void block(uint64_t number, uint8_t *dst) const {
-        if (number == 0)
+    HWY_INLINE void block(uint64_t number, uint8_t *dst, size_t pixels = kBlock) const {
+        // One store takes no longer than it does to find that it is not needed.
+        if (kBytes > 1 && number == 0)
             return;
         const D d;
-        for (size_t k = 0; k < kBlock * kBytes / kLanes<D>; ++k) {
+        for (size_t k = 0; k * kLanes<D> < pixels * kBytes; ++k) {
             const auto set = setBytes<kBytes>(d, number, k);
             uint8_t *to = dst + k * kLanes<D>;
 #if HWY_TARGET == HWY_AVX3
@@ -290,22 +302,25 @@ private:
 // line where a pixel does.
 template <size_t kBytes>
 HWY_INLINE void stencilRow(const Stencil<kBytes> &stencil, uint8_t *dst, const uint8_t *bits,
-                           size_t count) {
+                           size_t count, bool isLarge) {
     // The leftmost pixels of a block, all of them but so many.
     const auto without = [](size_t rest) { return leftmostHighest(~uint64_t{0} << rest); };
-    if (count < kBlock) {
-        uint64_t number = 0;
-        for (size_t byte = 0; byte < (count + 7) / 8; ++byte)
-            number |= uint64_t{bits[byte]} << 8 * byte;
-        return stencil.block(number & without(kBlock - count), dst);
-    }
+    if (count < kBlock)
+        return stencil.block(fewBytes(bits, (count + 7) / 8) & without(kBlock - count), dst, count);
     const size_t head = kMasked<kBytes> ? pixelsToLine<kBytes>(dst) % kBlock : 0;
     if (head != 0)
         stencil.block(WholeBytes{bits}.block<kBlock>(0) & without(kBlock - head), dst);
     const size_t last = count - kBlock;
+    // Stores that leave bytes alone wait for the lines that hold them.
+    constexpr size_t kAhead = 2048 / kBytes;
+    const size_t fetched = isLarge && last > kAhead ? last - kAhead : 0;
     withBits(bits, head, [&](const auto &from) HWY_ATTR {
-        for (size_t i = head; i <= last; i += kBlock)
+        for (size_t i = head; i <= last; i += kBlock) {
+            if (i < fetched)
+                for (size_t line = 0; line < kBytes; ++line)
+                    hwy::Prefetch(dst + (i + kAhead) * kBytes + 64 * line);
             stencil.block(from.template block<kBlock>(i - head), dst + i * kBytes);
+        }
     });
     // Pixels of the last block that the one before had: all but the rightmost.
     const size_t had = (kBlock - (count - head) % kBlock) % kBlock;
@@ -320,8 +335,9 @@ template <size_t kBytes>
 void stencilRows(DstRows dst, SrcRows bits, Size size, uint32 pixel) {
     const Stencil<kBytes> stencil(pixel);
     size = joinedBitRows(size, kBytes, dst.step, bits.step);
+    const bool isLarge = size.width * kBytes * size.height >= kStreamedBytes;
     for (size_t y = 0; y < size.height; ++y)
-        stencilRow(stencil, dst.row(y), bits.row(y), size.width);
+        stencilRow(stencil, dst.row(y), bits.row(y), size.width, isLarge);
 }
 
 void StencilRows(DstRows dst, SrcRows bits, Size size, int32 bytesPerPixel, uint32 pixel) {

@@ -7,6 +7,7 @@
 
 #include "raster/kernels-inl.h"
 #include "raster/packed24-inl.h"
+#include "raster/streaming-inl.h"
 
 #include <algorithm>
 #include <array>
@@ -370,7 +371,7 @@ HWY_INLINE hn::Vec<D> loadKeys(D d, const Pixel *keys) {
     return hn::PromoteTo(d, hn::LoadU(narrow, keys));
 }
 
-template <class Pixel>
+template <class Pixel, class Store>
 struct ApplyKey {
     uint8_t *dst;
     const uint8_t *background, *overlay, *keys;
@@ -383,22 +384,59 @@ struct ApplyKey {
         };
         const auto matches =
             hn::Eq(loadKeys(d, reinterpret_cast<const Pixel *>(keys) + i), hn::Set(d, key));
-        hn::StoreU(hn::IfThenElse(matches, words(overlay), words(background)), d,
-                   reinterpret_cast<uint32_t *>(dst) + i);
+        Store::store(d, hn::IfThenElse(matches, words(overlay), words(background)), dst + 4 * i);
+    }
+};
+
+// From first up to behind last.
+struct Bytes {
+    uintptr_t first, last;
+
+    bool overlaps(const Bytes &other) const { return first < other.last && other.first < last; }
+};
+
+Bytes bytesOf(const uint8_t *row, ptrdiff_t step, size_t rowBytes, size_t rows) {
+    const auto first = reinterpret_cast<uintptr_t>(row);
+    const uintptr_t toLast = static_cast<uintptr_t>(step) * (rows - 1);
+    return {step < 0 ? first + toLast : first, (step < 0 ? first : first + toLast) + rowBytes};
+}
+
+template <class Pixel>
+struct KeyedSurfaces {
+    KeyedRows rows;
+    Size size;
+    uint32_t key;
+
+    template <class Store>
+    ApplyKey<Pixel, Store> body(size_t y) const {
+        return {rows.dst.row(y), rows.background.row(y), rows.overlay.row(y), rows.key.row(y), key};
     }
 
     // Whether the pixels of a row have to be gone through one by one.  Writing
     // goes on faster than the reading of narrow key pixels and may catch up with
     // it anywhere, so there any overlap counts.
-    bool overlaps(size_t width) const {
+    bool runsIntoItself(size_t y) const {
         constexpr size_t kVector = 4 * kLanes<Widest<uint32_t>>;
-        if (runsIntoItself(dst, background, kVector) || runsIntoItself(dst, overlay, kVector))
+        const uint8_t *dst = rows.dst.row(y), *keys = rows.key.row(y);
+        const auto catchesUp = [&](const uint8_t *src) {
+            return HWY_NAMESPACE::runsIntoItself(dst, src, kVector);
+        };
+        if (catchesUp(rows.background.row(y)) || catchesUp(rows.overlay.row(y)))
             return true;
         if constexpr (sizeof(Pixel) == 4)
-            return runsIntoItself(dst, keys, kVector);
-        return reinterpret_cast<uintptr_t>(keys) < reinterpret_cast<uintptr_t>(dst) + 4 * width &&
-               reinterpret_cast<uintptr_t>(dst) <
-                   reinterpret_cast<uintptr_t>(keys) + sizeof(Pixel) * width;
+            return catchesUp(keys);
+        return bytesOf(dst, 0, 4 * size.width, 1)
+            .overlaps(bytesOf(keys, 0, sizeof(Pixel) * size.width, 1));
+    }
+
+    // Whether nothing that is written is read.
+    bool isApart() const {
+        const auto all = [&](const auto &surface, size_t pixelBytes) {
+            return bytesOf(surface.row(0), surface.step, pixelBytes * size.width, size.height);
+        };
+        const Bytes dst = all(rows.dst, 4);
+        return !dst.overlaps(all(rows.background, 4)) && !dst.overlaps(all(rows.overlay, 4)) &&
+               !dst.overlaps(all(rows.key, sizeof(Pixel)));
     }
 };
 
@@ -410,14 +448,21 @@ void applyKey(const KeyedRows &rows, Size size, uint32 key) {
     };
     if (fits(rows.background, rowBytes) && fits(rows.overlay, rowBytes))
         size = joinedRows(size, rowBytes, rows.dst.step, sizeof(Pixel) * size.width, rows.key.step);
+
+    const KeyedSurfaces<Pixel> surfaces = {rows, size, key};
+    const bool streams = isStreamed(4 * size.width, size.height) && surfaces.isApart();
     for (size_t y = 0; y < size.height; ++y) {
-        const ApplyKey<Pixel> body = {rows.dst.row(y), rows.background.row(y), rows.overlay.row(y),
-                                      rows.key.row(y), key};
-        if (body.overlaps(size.width))
+        const auto body = surfaces.template body<ThroughCaches>(y);
+        if (streams)
+            walkStreaming<uint32_t, 4>(body.dst, size.width, body,
+                                       surfaces.template body<AroundCaches>(y));
+        else if (surfaces.runsIntoItself(y))
             walkSingly<uint32_t>(size.width, body);
         else
             walkOnce<uint32_t>(size.width, body);
     }
+    if (streams)
+        hwy::FlushStream();
 }
 
 void Key(const KeyedRows &rows, Size size, KeyPixel keyPixel, uint32 key) {
