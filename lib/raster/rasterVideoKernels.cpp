@@ -6,11 +6,11 @@
 #include "hwy/highway.h"
 
 #include "raster/kernels-inl.h"
-#include "raster/packed24-inl.h"
 #include "raster/streaming-inl.h"
 
 #include <algorithm>
 #include <array>
+#include <cstring>
 
 HWY_BEFORE_NAMESPACE();
 namespace quillon::HWY_NAMESPACE {
@@ -56,73 +56,104 @@ HWY_INLINE void convertPair(uint8_t luma0, uint8_t luma1, uint8_t chromaLow, uin
 
 // ---- Colours ------------------------------------------------------------
 
-// With c = luma - 16, a = chromaLow - 128, b = chromaHigh - 128 the fields are
+// With y = luma - 128, a = chromaLow - 128, b = chromaHigh - 128 the fields are
 //
-//     low  = (298 c + 409 a + 128) >> 8           = (149 c + 64 + ((-103 a) >> 1) + 256 a) >> 7
-//     mid  = (298 c - 208 a - 100 b + 128) >> 8   = (149 c + 64 + (-104 a - 50 b)) >> 7
-//     high = (298 c + 516 b + 128) >> 8           = (149 c + 64 + 2 b + 256 b) >> 7
+//     low  = (298 (y + 112) + 409 a + 128) >> 8          = (16752 + 149 y + (409 a >> 1)) >> 7
+//     mid  = (298 (y + 112) - 208 a - 100 b + 128) >> 8  = (16752 + 149 y - 104 a - 50 b) >> 7
+//     high = (298 (y + 112) + 516 b + 128) >> 8          = (16752 + 149 y + 258 b) >> 7
 //
 // exactly: all terms but 409 a are even, and an odd bit alone never carries.
 //
 // Fields of 0 to 255 come from sums (on the right, ahead of the shift) of 0 to
-// 32767, which is half of what 16 bits hold.  Less 16384, these are the middle
-// half: a saturating addition at the end of the sum keeps it in 16 bits, another
-// one that doubles it holds it to this half.  The upper byte is then the field,
-// less 128.
-//
-// No addition but the last one of a sum saturates, because what comes before
-// fits: 149 c + 64 - 16384 is -18704 to 19291, to which -6541 to 6592 is added
-// for low and -256 to 254 for high; -104 a - 50 b is -19558 to 19712.
+// 32767.  Less 16384 these are the middle half of what 16 bits hold.  So a sum
+// that saturates belongs to a field that does, and no other addition leaves 16
+// bits: 149 y + 368 is -18704 to 19291, the terms of chroma are less than 26177.
 constexpr int kLumaFactor = 149;
-constexpr int kLumaRest = 64 - kLumaFactor * 16 - 16384;
+constexpr int kLumaRest = 16752 - 16384;
 
-// Samples come in the upper byte of their lanes, and factors too: the upper half
-// of such a product is the product itself.
-constexpr uint16_t upper(int value) {
-    return static_cast<uint16_t>(value * 256);
+#if HWY_ARCH_X86 && HWY_TARGET != HWY_EMU128
+#define QUILLON_PAIRS_X86 1
+HWY_INLINE __m128i multiplyPairs(__m128i factors, __m128i samples) {
+    return _mm_maddubs_epi16(factors, samples);
+}
+HWY_INLINE __m128i packPairs(__m128i first, __m128i second) {
+    return _mm_packs_epi16(first, second);
+}
+#if HWY_TARGET <= HWY_AVX2
+HWY_INLINE __m256i multiplyPairs(__m256i factors, __m256i samples) {
+    return _mm256_maddubs_epi16(factors, samples);
+}
+HWY_INLINE __m256i packPairs(__m256i first, __m256i second) {
+    return _mm256_packs_epi16(first, second);
+}
+#endif
+#if HWY_TARGET <= HWY_AVX3
+HWY_INLINE __m512i multiplyPairs(__m512i factors, __m512i samples) {
+    return _mm512_maddubs_epi16(factors, samples);
+}
+HWY_INLINE __m512i packPairs(__m512i first, __m512i second) {
+    return _mm512_packs_epi16(first, second);
+}
+#endif
+#endif
+
+// Per word: its lower byte times a factor and its upper one times another.
+template <uint8_t kLower, uint8_t kUpper, class D>
+HWY_INLINE hn::Vec<D> weighed(D d, hn::Vec<D> samples) {
+#ifdef QUILLON_PAIRS_X86
+    const auto factors = hn::Set(d, static_cast<int16_t>(kUpper << 8 | kLower));
+    return hn::Vec<D>{multiplyPairs(factors.raw, samples.raw)};
+#else
+    const auto lower = hn::ShiftRight<8>(hn::ShiftLeft<8>(samples));
+    return hn::Add(hn::Mul(lower, hn::Set(d, kLower)),
+                   hn::Mul(hn::ShiftRight<8>(samples), hn::Set(d, kUpper)));
+#endif
 }
 
-// What a pair of chroma samples has to do with its pixels.
+// Words as signed bytes, held to what those can be.  In each block of 16 bytes
+// come the words of the first vector's block, then those of the second one's.
+template <class D, class D16 = hn::Repartition<int16_t, D>>
+HWY_INLINE hn::Vec<D> narrowed(D d, hn::Vec<D16> first, hn::Vec<D16> second) {
+#ifdef QUILLON_PAIRS_X86
+    (void)d;
+    return hn::Vec<D>{packPairs(first.raw, second.raw)};
+#else
+    const hn::Half<hn::RebindToSigned<D>> half;
+    const hn::RebindToSigned<D> d8;
+    return hn::BitCast(d, hn::Combine(d8, hn::DemoteTo(half, second), hn::DemoteTo(half, first)));
+#endif
+}
+#undef QUILLON_PAIRS_X86
+
+// What a pair of chroma samples has to do with its pixels: -(409 a >> 1),
+// 104 a + 50 b, 129 b.
 template <class V>
 struct ChromaTerms {
-    V low, a256, mid, high, b256;
-};
-
-// Samples less 128.
-template <class D>
-HWY_INLINE ChromaTerms<hn::Vec<D>> chromaTerms(D d, hn::Vec<D> a256, hn::Vec<D> b256) {
-    const auto times = [d](hn::Vec<D> v, int16_t factor256)
-                           HWY_ATTR { return hn::MulHigh(v, hn::Set(d, factor256)); };
-    return {times(a256, -103 * 256 / 2), a256,
-            hn::Add(times(a256, -104 * 256), times(b256, -50 * 256)), hn::ShiftRight<7>(b256),
-            b256};
-}
-
-// Fields of pixels, in the upper byte of their lanes, less 128; the lower bytes
-// are of no meaning.
-template <class V>
-struct Fields {
     V low, mid, high;
 };
 
-template <class D, class DU = hn::RebindToUnsigned<D>>
-HWY_INLINE Fields<hn::Vec<DU>> fieldsOf(D d, hn::Vec<DU> luma,
-                                        const ChromaTerms<hn::Vec<D>> &chroma) {
-    const DU du;
-    const auto product = hn::MulHigh(luma, hn::Set(du, upper(kLumaFactor)));
-    const auto base =
-        hn::BitCast(d, hn::Add(product, hn::Set(du, static_cast<uint16_t>(kLumaRest))));
-    const auto field = [&](hn::Vec<D> sum, hn::Vec<D> last) HWY_ATTR {
-        const auto held = hn::SaturatedAdd(sum, last);
-        return hn::BitCast(du, hn::SaturatedAdd(held, held));
-    };
-    return {field(hn::Add(base, chroma.low), chroma.a256), field(base, chroma.mid),
-            field(hn::Add(base, chroma.high), chroma.b256)};
+// Given 256 a, and a and b in the bytes of a word.
+template <class D>
+HWY_INLINE ChromaTerms<hn::Vec<D>> chromaTerms(D d, hn::Vec<D> a256, hn::Vec<D> ab) {
+    return {hn::MulFixedPoint15(a256, hn::Set(d, -409 * 64)), weighed<104, 50>(d, ab),
+            weighed<0, 129>(d, ab)};
+}
+
+// The sums of pixels, less 16384.
+template <class V>
+struct Sums {
+    V low, mid, high;
+};
+
+template <class V>
+HWY_INLINE Sums<V> sumsOf(V luma, const ChromaTerms<V> &chroma) {
+    return {hn::SaturatedSub(luma, chroma.low), hn::SaturatedSub(luma, chroma.mid),
+            hn::SaturatedAdd(hn::SaturatedAdd(luma, chroma.high), chroma.high)};
 }
 
 // ---- Destinations -------------------------------------------------------
 
-// The top kBits of fields, moved to begin at bit kAt.
+// The top kBits of fields in the upper bytes of words, moved to begin at bit kAt.
 template <int kBits, int kAt, class D>
 HWY_INLINE hn::Vec<D> placed(D d, hn::Vec<D> field) {
     constexpr int kDistance = 16 - kBits - kAt;
@@ -133,97 +164,162 @@ HWY_INLINE hn::Vec<D> placed(D d, hn::Vec<D> field) {
     return field;
 }
 
-// To take 128 off a byte turns its top bit over.  This turns it back, given
-// where the bit stands now.
-template <class D>
-HWY_INLINE hn::Vec<D> turned(D d, hn::Vec<D> v, int topBits) {
-    return hn::Xor(v, hn::Set(d, static_cast<uint16_t>(topBits)));
-}
-
-template <RasterVideoPixelLayout kLayout, class D>
-HWY_INLINE void storeNarrow(D d, const Fields<hn::Vec<D>> &fields, uint8_t *dst) {
+// Pixels of two bytes.  To take 128 off a field turns its top bit over; in the
+// end these are turned back.
+template <RasterVideoPixelLayout kLayout, class D16, class D = hn::RebindToUnsigned<D16>>
+HWY_INLINE hn::Vec<D> words(D16, const Sums<hn::Vec<D16>> &sums) {
     constexpr int kLowAt = kLayout.finalShift;
     constexpr int kMidAt = kLowAt + kLayout.lowBits;
     constexpr int kHighAt = kMidAt + kLayout.midBits;
     static_assert(kLayout.lowBits == 8 - kLayout.fieldShift);
     static_assert(kLayout.midBits == 8 - kLayout.midShift);
     static_assert(kHighAt + kLayout.lowBits == 16);
-    const auto low = placed<kLayout.lowBits, kLowAt>(d, fields.low);
-    const auto mid = placed<kLayout.midBits, kMidAt>(d, fields.mid);
-    const auto high = placed<kLayout.lowBits, kHighAt>(d, fields.high);
-    const auto pixels =
-        turned(d, hn::Or(low, hn::Or(mid, high)), 1 << 15 | 1 << (kHighAt - 1) | 1 << (kMidAt - 1));
-    hn::StoreU(pixels, d, reinterpret_cast<uint16_t *>(dst));
+    const D d;
+    const auto field = [&](hn::Vec<D16> sum)
+                           HWY_ATTR { return hn::BitCast(d, hn::SaturatedAdd(sum, sum)); };
+    const auto low = placed<kLayout.lowBits, kLowAt>(d, field(sums.low));
+    const auto mid = placed<kLayout.midBits, kMidAt>(d, field(sums.mid));
+    const auto high = placed<kLayout.lowBits, kHighAt>(d, field(sums.high));
+    constexpr int kTopBits = 1 << 15 | 1 << (kHighAt - 1) | 1 << (kMidAt - 1);
+    return hn::Xor(hn::Or(low, hn::Or(mid, high)), hn::Set(d, static_cast<uint16_t>(kTopBits)));
 }
 
-template <size_t kBytes, class D>
-HWY_INLINE void storeWords(D d, hn::Vec<D> words, uint8_t *dst) {
-    if constexpr (kBytes == 3)
-        store24(d, words, dst);
-    else
-        hn::StoreU(words, d, reinterpret_cast<uint32_t *>(dst));
+// Where narrowed() puts four pixels, the quad-th of all, by words of 4 bytes.
+constexpr uint32_t placeOfQuad(size_t quad, size_t blocks) {
+    const size_t inVector = quad % (2 * blocks);
+    return static_cast<uint32_t>(inVector / 2 * 4 + quad / (2 * blocks) * 2 + inVector % 2);
 }
 
-// Whole bytes a field.  d counts the pixels; wider pixels come in two vectors.
-template <size_t kBytes, class D>
-HWY_INLINE void storeWide(D d, const Fields<hn::Vec<D>> &fields, uint8_t *dst) {
-    const auto lowMid =
-        turned(d, hn::Or(placed<8, 0>(d, fields.low), placed<8, 8>(d, fields.mid)), 0x8080);
-    const auto high = turned(d, placed<8, 0>(d, fields.high), 0x80);
+// The order of quads in the blocks of a vector: that of memory, for pixels of 3
+// bytes; for pixels of 4 bytes the one that makes four vectors in the order of
+// memory when each block is spread to a block of each.
+template <size_t kBytes, size_t kBlocks>
+HWY_ALIGN constexpr auto kQuadOrder = [] {
+    std::array<uint32_t, 4 * kBlocks> order{};
+    for (size_t block = 0; block < kBlocks; ++block)
+        for (size_t i = 0; i < 4; ++i)
+            order[4 * block + i] =
+                placeOfQuad(kBytes == 3 ? 4 * block + i : kBlocks * i + block, kBlocks);
+    return order;
+}();
+
+// The bytes of one field, from the sums of the first half of the pixels and of the
+// second.
+template <size_t kBytes, class D, class V>
+HWY_INLINE hn::Vec<D> fieldBytes(D d, V first, V second) {
+    constexpr size_t kBlocks = kLanes<D> / 16;
+    const auto bytes =
+        hn::Xor(narrowed(d, hn::ShiftRight<7>(first), hn::ShiftRight<7>(second)), hn::Set(d, 0x80));
     const hn::Repartition<uint32_t, D> d32;
-    const auto first = hn::InterleaveLower(d, lowMid, high);
-    const auto second = hn::InterleaveUpper(d, lowMid, high);
-    storeWords<kBytes>(d32, hn::BitCast(d32, first), dst);
-    storeWords<kBytes>(d32, hn::BitCast(d32, second), dst + kBytes * kLanes<decltype(d32)>);
+    if constexpr (kBlocks == 1)
+        return bytes;
+    else
+        return hn::BitCast(
+            d, hn::TableLookupLanes(hn::BitCast(d32, bytes),
+                                    hn::SetTableIndices(d32, kQuadOrder<kBytes, kBlocks>.data())));
 }
 
-template <RasterVideoPixelLayout kLayout, class D>
-HWY_INLINE void storePixels(D d, const Fields<hn::Vec<D>> &fields, uint8_t *dst) {
-    if constexpr (kLayout.bytesPerPixel == 2)
-        storeNarrow<kLayout>(d, fields, dst);
-    else
-        storeWide<kLayout.bytesPerPixel>(d, fields, dst);
+template <class Store, class D>
+HWY_INLINE void storeFourBytes(D d, hn::Vec<D> low, hn::Vec<D> mid, hn::Vec<D> high, uint8_t *dst) {
+    const hn::Repartition<uint16_t, D> d16;
+    const auto storeTwo = [&](hn::Vec<D> lowMid, hn::Vec<D> highZero, uint8_t *to) HWY_ATTR {
+        const auto words = hn::BitCast(d16, lowMid), tops = hn::BitCast(d16, highZero);
+        Store::store(d16, hn::InterleaveLower(d16, words, tops), to);
+        Store::store(d16, hn::InterleaveUpper(d16, words, tops), to + kLanes<D>);
+    };
+    storeTwo(hn::InterleaveLower(d, low, mid), hn::InterleaveLower(d, high, hn::Zero(d)), dst);
+    storeTwo(hn::InterleaveUpper(d, low, mid), hn::InterleaveUpper(d, high, hn::Zero(d)),
+             dst + 2 * kLanes<D>);
+}
+
+// For 16 bytes, the kPart-th of the 48 of a block of pixels: where they are among
+// the block's bytes of a field.
+template <size_t kPart, size_t kField>
+HWY_ALIGN constexpr auto kToPart = [] {
+    std::array<uint8_t, 16> sources{};
+    for (size_t i = 0; i < 16; ++i) {
+        const size_t byte = 16 * kPart + i;
+        sources[i] = byte % 3 == kField ? static_cast<uint8_t>(byte / 3) : 0x80;
+    }
+    return sources;
+}();
+
+template <class Store, class D>
+HWY_INLINE void storeBlocks(D d, hn::Vec<D> v, uint8_t *to, size_t apart) {
+    if constexpr (kLanes<D> == 16) {
+        Store::store(d, v, to);
+    } else {
+        const hn::Half<D> half;
+        storeBlocks<Store>(half, hn::LowerHalf(half, v), to, apart);
+        storeBlocks<Store>(half, hn::UpperHalf(half, v), to + kLanes<D> / 32 * apart, apart);
+    }
+}
+
+template <class Store, class D>
+HWY_INLINE void storeThreeBytes(D d, hn::Vec<D> low, hn::Vec<D> mid, hn::Vec<D> high,
+                                uint8_t *dst) {
+    const auto table = [&](hn::Vec<D> field, const std::array<uint8_t, 16> &sources) HWY_ATTR {
+        return hn::TableLookupBytesOr0(field, hn::LoadDup128(d, sources.data()));
+    };
+    const auto part = [&](const auto &lowTo, const auto &midTo, const auto &highTo) HWY_ATTR {
+        return hn::Or(hn::Or(table(low, lowTo), table(mid, midTo)), table(high, highTo));
+    };
+    storeBlocks<Store>(d, part(kToPart<0, 0>, kToPart<0, 1>, kToPart<0, 2>), dst, 48);
+    storeBlocks<Store>(d, part(kToPart<1, 0>, kToPart<1, 1>, kToPart<1, 2>), dst + 16, 48);
+    storeBlocks<Store>(d, part(kToPart<2, 0>, kToPart<2, 1>, kToPart<2, 2>), dst + 32, 48);
+}
+
+// As many pixels as d has bytes, from their sums in two vectors.
+template <RasterVideoPixelLayout kLayout, class Store, class D, class V>
+HWY_INLINE void storePixels(D d, const Sums<V> &first, const Sums<V> &second, uint8_t *dst) {
+    constexpr size_t kBytes = kLayout.bytesPerPixel;
+    if constexpr (kBytes == 2) {
+        const hn::Repartition<int16_t, D> d16;
+        const hn::RebindToUnsigned<decltype(d16)> du16;
+        Store::store(du16, words<kLayout>(d16, first), dst);
+        Store::store(du16, words<kLayout>(d16, second), dst + kLanes<D>);
+    } else {
+        const auto low = fieldBytes<kBytes>(d, first.low, second.low);
+        const auto mid = fieldBytes<kBytes>(d, first.mid, second.mid);
+        const auto high = fieldBytes<kBytes>(d, first.high, second.high);
+        if constexpr (kBytes == 3)
+            storeThreeBytes<Store>(d, low, mid, high, dst);
+        else
+            storeFourBytes<Store>(d, low, mid, high, dst);
+    }
 }
 
 // ---- Sources ------------------------------------------------------------
 
-// Interleaving works within blocks of 16 bytes.  So that it gives pixels in
-// their order, the pairs of words that are to be interleaved with each other's
-// neighbours are first put into one block: the first half of the vector into the
-// lower halves of the blocks, the second half into the upper ones.
-template <size_t kWords>
-HWY_ALIGN [[maybe_unused]] constexpr auto kBlockOrder = [] {
-    std::array<uint32_t, kWords> order{};
-    for (uint32_t i = 0; i < kWords; ++i) {
-        const uint32_t pair = i / 2;
-        order[i] = 2 * (pair / 2 + pair % 2 * (kWords / 4)) + i % 2;
+// For both pixels of each word of 4 bytes: the bytes kLower and kUpper of it, as
+// those of a word of 2.
+constexpr uint8_t kNone = 0x80;
+template <uint8_t kLower, uint8_t kUpper>
+HWY_ALIGN constexpr auto kToBothPixels = [] {
+    std::array<uint8_t, 16> sources{};
+    for (size_t i = 0; i < 16; ++i) {
+        const uint8_t byte = i % 2 == 0 ? kLower : kUpper;
+        sources[i] = byte == kNone ? kNone : static_cast<uint8_t>(i / 4 * 4 + byte);
     }
-    return order;
+    return sources;
 }();
 
-// Pixels in 32-bit lanes of two, in the order that storePixels has to get them.
-template <RasterVideoPixelLayout kLayout, class D>
-HWY_INLINE hn::Vec<D> inStoreOrder(D d, hn::Vec<D> pairs) {
-    constexpr size_t n = kLanes<D>;
-    if constexpr (kLayout.bytesPerPixel > 2 && n > 4)
-        return hn::TableLookupLanes(pairs, hn::SetTableIndices(d, kBlockOrder<n>.data()));
-    else
-        return pairs;
+// Samples less 128 have their top bit turned over.
+template <class D>
+HWY_INLINE hn::Vec<D> less128(D d, hn::Vec<D> groups) {
+    return hn::Xor(groups, hn::Set(d, 0x80808080));
 }
 
-// Byte kAt of each word, to the upper byte of both pixels of the word.
-template <uint8_t kAt>
-HWY_ALIGN constexpr uint8_t kToBothPixels[16] = {0x80, kAt,      0x80, kAt,     0x80, kAt + 4,
-                                                 0x80, kAt + 4,  0x80, kAt + 8, 0x80, kAt + 8,
-                                                 0x80, kAt + 12, 0x80, kAt + 12};
-
-// Chroma samples, byte kAt of each word, for chromaTerms.
-template <uint8_t kAt, class D, class D16 = hn::Repartition<int16_t, D>>
-HWY_INLINE hn::Vec<D16> chromaSamples(D d, hn::Vec<D> words) {
+// From samples less 128, a at byte kLow of each word and b at kHigh.
+template <uint8_t kLow, uint8_t kHigh, class D, class D16 = hn::Repartition<int16_t, D>>
+HWY_INLINE ChromaTerms<hn::Vec<D16>> chromaOf(D, hn::Vec<D> groups) {
     const hn::Repartition<uint8_t, D> d8;
-    const auto less128 = hn::BitCast(d8, hn::Xor(words, hn::Set(d, 0x80808080)));
-    const auto table = hn::LoadDup128(d8, kToBothPixels<kAt>);
-    return hn::BitCast(D16(), hn::TableLookupBytesOr0(less128, table));
+    const D16 d16;
+    const auto both = [&](const std::array<uint8_t, 16> &sources) HWY_ATTR {
+        return hn::BitCast(d16, hn::TableLookupBytesOr0(hn::BitCast(d8, groups),
+                                                        hn::LoadDup128(d8, sources.data())));
+    };
+    return chromaTerms(d16, both(kToBothPixels<kNone, kLow>), both(kToBothPixels<kLow, kHigh>));
 }
 
 #endif
@@ -238,69 +334,154 @@ struct ConvertGroups {
     uint8_t *dst;
     const uint8_t *src;
 
-    // Groups i and on: as many as d has words.
-    template <class D>
-    HWY_INLINE void operator()([[maybe_unused]] D d, size_t i) const {
+#if HWY_TARGET == HWY_SCALAR
+    void pair(size_t i) const {
         const uint8_t *group = src + 4 * i;
-        uint8_t *pixels = dst + kPairBytes<kLayout> * i;
-#if HWY_TARGET == HWY_SCALAR
         convertPair<kLayout>(group[kGroup.luma], group[kGroup.luma + 2], group[kGroup.chromaLow],
-                             group[kGroup.chromaHigh], pixels);
-#else
-        const hn::Repartition<int16_t, D> d16;
-        const hn::RebindToUnsigned<decltype(d16)> du16;
-        const auto groups =
-            inStoreOrder<kLayout>(d, hn::LoadU(d, reinterpret_cast<const uint32_t *>(group)));
-        const auto chroma = chromaTerms(d16, chromaSamples<kGroup.chromaLow>(d, groups),
-                                        chromaSamples<kGroup.chromaHigh>(d, groups));
-        auto luma = hn::BitCast(du16, groups);
-        if constexpr (kGroup.luma == 0)
-            luma = hn::ShiftLeft<8>(luma);
-        else
-            luma = hn::And(luma, hn::Set(du16, 0xFF00));
-        storePixels<kLayout>(du16, fieldsOf(d16, luma, chroma), pixels);
-#endif
+                             group[kGroup.chromaHigh], dst + kPairBytes<kLayout> * i);
     }
-};
+#else
+    // Groups i and on: half as many as d has bytes.
+    template <class Store, class D>
+    HWY_INLINE void block(D d, size_t i) const {
+        const auto first = sums(d, i);
+        const auto second = sums(d, i + kLanes<D> / 4);
+        storePixels<kLayout, Store>(d, first, second, dst + kPairBytes<kLayout> * i);
+    }
 
-// Two rows, which share their chroma.
-template <RasterVideoPixelLayout kLayout>
-struct ConvertRowPair {
-    uint8_t *upper, *lower;
-    const uint8_t *upperLuma, *lowerLuma;
-    const uint8_t *chromaHighRow, *chromaLowRow;
-
-    // Pairs of columns i and on: as many as d has words.
     template <class D>
-    HWY_INLINE void operator()([[maybe_unused]] D d, size_t i) const {
-        const size_t at = kPairBytes<kLayout> * i;
-#if HWY_TARGET == HWY_SCALAR
-        const auto convert = [&](const uint8_t *luma, uint8_t *pixels) {
-            convertPair<kLayout>(luma[2 * i], luma[2 * i + 1], chromaLowRow[i], chromaHighRow[i],
-                                 pixels + at);
-        };
-        convert(upperLuma, upper);
-        convert(lowerLuma, lower);
-#else
+    HWY_INLINE auto sums(D, size_t i) const {
+        const hn::Repartition<uint32_t, D> d32;
         const hn::Repartition<int16_t, D> d16;
-        const hn::RebindToUnsigned<decltype(d16)> du16;
-        const auto chromaOf = [&](const uint8_t *row) HWY_ATTR {
-            const hn::Rebind<uint8_t, D> d8;
-            const auto words = hn::PromoteTo(d, hn::LoadU(d8, row + i));
-            return chromaSamples<0>(d, inStoreOrder<kLayout>(d, words));
-        };
-        const auto lumaOf = [&](const uint8_t *row) HWY_ATTR {
-            const hn::Rebind<uint8_t, decltype(du16)> d8;
-            const auto samples = hn::PromoteTo(du16, hn::LoadU(d8, row + 2 * i));
-            const auto ordered = inStoreOrder<kLayout>(d, hn::BitCast(d, samples));
-            return hn::ShiftLeft<8>(hn::BitCast(du16, ordered));
-        };
-        const auto chroma = chromaTerms(d16, chromaOf(chromaLowRow), chromaOf(chromaHighRow));
-        storePixels<kLayout>(du16, fieldsOf(d16, lumaOf(upperLuma), chroma), upper + at);
-        storePixels<kLayout>(du16, fieldsOf(d16, lumaOf(lowerLuma), chroma), lower + at);
-#endif
+        const auto groups =
+            less128(d32, hn::LoadU(d32, reinterpret_cast<const uint32_t *>(src) + i));
+        constexpr bool isLower = kGroup.luma == 0;
+        const auto luma = weighed < isLower ? kLumaFactor : 0,
+                   isLower ? 0 : kLumaFactor > (d16, hn::BitCast(d16, groups));
+        return sumsOf(hn::Add(luma, hn::Set(d16, kLumaRest)),
+                      chromaOf<kGroup.chromaLow, kGroup.chromaHigh>(d32, groups));
     }
+#endif
 };
+
+// One row, or two which share their chroma.
+template <RasterVideoPixelLayout kLayout, size_t kRows>
+struct ConvertRows {
+    std::array<uint8_t *, kRows> dst;
+    std::array<const uint8_t *, kRows> luma;
+    const uint8_t *chromaHigh, *chromaLow;
+
+#if HWY_TARGET == HWY_SCALAR
+    void pair(size_t i) const {
+        for (size_t row = 0; row < kRows; ++row)
+            convertPair<kLayout>(luma[row][2 * i], luma[row][2 * i + 1], chromaLow[i],
+                                 chromaHigh[i], dst[row] + kPairBytes<kLayout> * i);
+    }
+#else
+    // Pairs of columns i and on: half as many as d has bytes.
+    template <class Store, class D>
+    HWY_INLINE void block(D d, size_t i) const {
+        const auto firstChroma = chroma(d, i);
+        const auto secondChroma = chroma(d, i + kLanes<D> / 4);
+        for (size_t row = 0; row < kRows; ++row)
+            storePixels<kLayout, Store>(
+                d, sumsOf(lumaTerm(d, luma[row] + 2 * i), firstChroma),
+                sumsOf(lumaTerm(d, luma[row] + 2 * i + kLanes<D> / 2), secondChroma),
+                dst[row] + kPairBytes<kLayout> * i);
+    }
+
+    template <class D>
+    HWY_INLINE static auto lumaTerm(D, const uint8_t *samples) {
+        const hn::Repartition<int16_t, D> d16;
+        const hn::Rebind<uint8_t, decltype(d16)> half;
+        const auto luma = hn::PromoteTo(d16, hn::LoadU(half, samples));
+        return hn::Add(hn::Mul(luma, hn::Set(d16, kLumaFactor)),
+                       hn::Set(d16, kLumaRest - 128 * kLumaFactor));
+    }
+
+    template <class D>
+    HWY_INLINE auto chroma(D, size_t i) const {
+        const hn::Repartition<uint32_t, D> d32;
+        const hn::Rebind<uint8_t, decltype(d32)> quarter;
+        const auto low = hn::PromoteTo(d32, hn::LoadU(quarter, chromaLow + i));
+        const auto high = hn::PromoteTo(d32, hn::LoadU(quarter, chromaHigh + i));
+        return chromaOf<0, 1>(d32, less128(d32, hn::Or(low, hn::ShiftLeft<8>(high))));
+    }
+#endif
+};
+
+#if HWY_TARGET != HWY_SCALAR
+
+// The least number of pairs there are in a block.
+constexpr size_t kLeastPairs = 8;
+
+// Every pair at least once.  Of fewer than the least number none.
+template <size_t kCap, class Body>
+HWY_INLINE void walkThroughCaches(size_t pairs, const Body &body) {
+    const hn::CappedTag<uint8_t, kCap> d;
+    constexpr size_t n = kLanes<decltype(d)> / 2;
+    if constexpr (n > kLeastPairs) {
+        if (pairs < n)
+            return walkThroughCaches<n>(pairs, body);
+    }
+    size_t i = 0;
+    for (; pairs - i >= n; i += n)
+        body.template block<ThroughCaches>(d, i);
+    if (i != pairs)
+        body.template block<ThroughCaches>(d, pairs - n);
+}
+
+// The same, for at least 64 pairs, of which head begins a cache line.
+template <class Body>
+HWY_INLINE void walkAroundCaches(size_t head, size_t pairs, const Body &body) {
+    const Widest<uint8_t> d;
+    constexpr size_t n = kLanes<decltype(d)> / 2;
+    body.template block<ThroughCaches>(d, 0);
+    size_t i = head;
+    for (; pairs - i >= n; i += n)
+        body.template block<AroundCaches>(d, i);
+    if (i != pairs)
+        body.template block<ThroughCaches>(d, pairs - n);
+}
+
+// Pairs from dst on to the next one that begins a cache line; 64 where none does.
+template <size_t kBytes>
+size_t pairsToLine(const uint8_t *dst) {
+    const size_t pixels = pixelsToLine<kBytes>(dst);
+    return pixels % 2 != 0 ? 64 : pixels == 64 ? 64 : pixels / 2;
+}
+
+template <size_t kBytes, class Body>
+void walkBlocks(size_t pairs, const Body &body, bool streams, const uint8_t *dst) {
+    const size_t head = pairsToLine<kBytes>(dst);
+    if (streams && head != 64)
+        walkAroundCaches(head, pairs, body);
+    else
+        walkThroughCaches<kLanes<Widest<uint8_t>>>(pairs, body);
+}
+
+#endif
+
+template <Group kGroup, RasterVideoPixelLayout kLayout>
+void convertRun(uint8_t *dst, const uint8_t *src, size_t pairs) {
+    using Convert = ConvertGroups<kGroup, kLayout>;
+#if HWY_TARGET == HWY_SCALAR
+    for (size_t i = 0; i < pairs; ++i)
+        Convert{dst, src}.pair(i);
+#else
+    if (pairs < kLeastPairs) {
+        uint8_t groups[4 * kLeastPairs] = {}, pixels[kPairBytes<kLayout> * kLeastPairs];
+        std::memcpy(groups, src, 4 * pairs);
+        walkThroughCaches<16>(kLeastPairs, Convert{pixels, groups});
+        std::memcpy(dst, pixels, kPairBytes<kLayout> * pairs);
+        return;
+    }
+    const bool streams = isStreamed(kPairBytes<kLayout> * pairs, 1);
+    walkBlocks<kLayout.bytesPerPixel>(pairs, Convert{dst, src}, streams, dst);
+    if (streams)
+        hwy::FlushStream();
+#endif
+}
 
 struct Run {
     uint8_t *dst;
@@ -312,9 +493,9 @@ struct Run {
 template <RasterVideoPixelLayout kLayout>
 void convertGroups(const Run &run) {
     if (run.order == VideoGroupOrder::Yuy2)
-        walkAgain<uint32_t>(run.groups, ConvertGroups<kYuy2, kLayout>{run.dst, run.src});
+        convertRun<kYuy2, kLayout>(run.dst, run.src, run.groups);
     else
-        walkAgain<uint32_t>(run.groups, ConvertGroups<kUyvy, kLayout>{run.dst, run.src});
+        convertRun<kUyvy, kLayout>(run.dst, run.src, run.groups);
 }
 
 // NOLINTNEXTLINE(readability-non-const-parameter): dst is written through run
@@ -333,14 +514,61 @@ void ConvertPacked(uint8 *dst, int32 bppdepth, const uint8 *src, VideoGroupOrder
     }
 }
 
+#if HWY_TARGET != HWY_SCALAR
+
+// Two rows too short for a block.
+template <RasterVideoPixelLayout kLayout>
+void convertFewPairs(const ConvertRows<kLayout, 2> &rows, size_t pairs) {
+    uint8_t luma[2][2 * kLeastPairs] = {}, high[kLeastPairs] = {}, low[kLeastPairs] = {};
+    uint8_t pixels[2][kPairBytes<kLayout> * kLeastPairs];
+    for (size_t row = 0; row < 2; ++row)
+        std::memcpy(luma[row], rows.luma[row], 2 * pairs);
+    std::memcpy(high, rows.chromaHigh, pairs);
+    std::memcpy(low, rows.chromaLow, pairs);
+    walkThroughCaches<16>(kLeastPairs, ConvertRows<kLayout, 2>{
+                                           {pixels[0], pixels[1]}, {luma[0], luma[1]}, high, low});
+    for (size_t row = 0; row < 2; ++row)
+        std::memcpy(rows.dst[row], pixels[row], kPairBytes<kLayout> * pairs);
+}
+
+// Two rows around the caches: together if they lie to cache lines alike.
+template <RasterVideoPixelLayout kLayout>
+void streamRows(const ConvertRows<kLayout, 2> &rows, size_t pairs) {
+    constexpr size_t kBytes = kLayout.bytesPerPixel;
+    if (pairsToLine<kBytes>(rows.dst[0]) == pairsToLine<kBytes>(rows.dst[1]))
+        return walkBlocks<kBytes>(pairs, rows, true, rows.dst[0]);
+    for (size_t row = 0; row < 2; ++row) {
+        const ConvertRows<kLayout, 1> one = {
+            {rows.dst[row]}, {rows.luma[row]}, rows.chromaHigh, rows.chromaLow};
+        walkBlocks<kBytes>(pairs, one, true, one.dst[0]);
+    }
+}
+
+#endif
+
 template <RasterVideoPixelLayout kLayout>
 void convertRowPairs(DstRows dst, const VideoPlanes &src, Size pairs) {
+    [[maybe_unused]] const bool streams =
+        isStreamed(kPairBytes<kLayout> * pairs.width, 2 * pairs.height);
     for (size_t r = 0; r < pairs.height; ++r) {
-        const ConvertRowPair<kLayout> body = {dst.row(2 * r),        dst.row(2 * r + 1),
-                                              src.luma.row(2 * r),   src.luma.row(2 * r + 1),
-                                              src.chromaHigh.row(r), src.chromaLow.row(r)};
-        walkAgain<uint32_t>(pairs.width, body);
+        const ConvertRows<kLayout, 2> rows = {{dst.row(2 * r), dst.row(2 * r + 1)},
+                                              {src.luma.row(2 * r), src.luma.row(2 * r + 1)},
+                                              src.chromaHigh.row(r),
+                                              src.chromaLow.row(r)};
+#if HWY_TARGET == HWY_SCALAR
+        for (size_t i = 0; i < pairs.width; ++i)
+            rows.pair(i);
+#else
+        if (streams)
+            streamRows(rows, pairs.width);
+        else if (pairs.width < kLeastPairs)
+            convertFewPairs(rows, pairs.width);
+        else
+            walkThroughCaches<kLanes<Widest<uint8_t>>>(pairs.width, rows);
+#endif
     }
+    if (streams)
+        hwy::FlushStream();
 }
 
 void ConvertPlanar(DstRows dst, int32 bppdepth, const VideoPlanes &src, Size pairs) {
