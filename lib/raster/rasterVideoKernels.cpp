@@ -232,18 +232,6 @@ HWY_INLINE void storeFourBytes(D d, hn::Vec<D> low, hn::Vec<D> mid, hn::Vec<D> h
              dst + 2 * kLanes<D>);
 }
 
-// For 16 bytes, the kPart-th of the 48 of a block of pixels: where they are among
-// the block's bytes of a field.
-template <size_t kPart, size_t kField>
-HWY_ALIGN constexpr auto kToPart = [] {
-    std::array<uint8_t, 16> sources{};
-    for (size_t i = 0; i < 16; ++i) {
-        const size_t byte = 16 * kPart + i;
-        sources[i] = byte % 3 == kField ? static_cast<uint8_t>(byte / 3) : 0x80;
-    }
-    return sources;
-}();
-
 template <class Store, class D>
 HWY_INLINE void storeBlocks(D d, hn::Vec<D> v, uint8_t *to, size_t apart) {
     if constexpr (kLanes<D> == 16) {
@@ -255,19 +243,80 @@ HWY_INLINE void storeBlocks(D d, hn::Vec<D> v, uint8_t *to, size_t apart) {
     }
 }
 
+// What a table has where a byte is to be 0.
+constexpr uint8_t kNone = 0x80;
+
+// Three bytes a pixel: a block of 16 pixels has three parts, of 16 bytes each.
+constexpr size_t fieldAt(size_t part, size_t byte) {
+    return (16 * part + byte) % 3;
+}
+
+// Where the bytes of one field are among the block's, for a part, or for all of
+// them: no two parts have a field at the same byte.
+constexpr size_t kAllParts = 3;
+template <size_t kField, size_t kPart>
+HWY_ALIGN constexpr auto kToPart = [] {
+    std::array<uint8_t, 16> sources{};
+    for (size_t byte = 0; byte < 16; ++byte) {
+        sources[byte] = kNone;
+        for (size_t part = 0; part < 3; ++part)
+            if (fieldAt(part, byte) == kField && (part == kPart || kPart == kAllParts))
+                sources[byte] = static_cast<uint8_t>((16 * part + byte) / 3);
+    }
+    return sources;
+}();
+
+template <size_t kField, size_t kPart, class D>
+HWY_INLINE hn::Vec<D> toPart(D d, hn::Vec<D> field) {
+    return hn::TableLookupBytesOr0(field, hn::LoadDup128(d, kToPart<kField, kPart>.data()));
+}
+
+#if HWY_TARGET == HWY_AVX3
+
+// The bytes of a part that a field has.
+template <size_t kField, size_t kPart, class D>
+HWY_INLINE hn::Mask<D> ofField(D d) {
+    constexpr uint64_t kMask = [] {
+        uint64_t mask = 0;
+        for (size_t byte = 0; byte < 64; ++byte)
+            mask |= uint64_t{fieldAt(kPart, byte % 16) == kField} << byte;
+        return mask;
+    }();
+    (void)d;
+    return hn::Mask<D>{static_cast<decltype(hn::Mask<D>::raw)>(kMask)};
+}
+
 template <class Store, class D>
 HWY_INLINE void storeThreeBytes(D d, hn::Vec<D> low, hn::Vec<D> mid, hn::Vec<D> high,
                                 uint8_t *dst) {
-    const auto table = [&](hn::Vec<D> field, const std::array<uint8_t, 16> &sources) HWY_ATTR {
-        return hn::TableLookupBytesOr0(field, hn::LoadDup128(d, sources.data()));
+    low = toPart<0, kAllParts>(d, low);
+    mid = toPart<1, kAllParts>(d, mid);
+    high = toPart<2, kAllParts>(d, high);
+    const auto part = [&](auto isLow, auto isMid) HWY_ATTR {
+        return hn::IfThenElse(isLow, low, hn::IfThenElse(isMid, mid, high));
     };
-    const auto part = [&](const auto &lowTo, const auto &midTo, const auto &highTo) HWY_ATTR {
-        return hn::Or(hn::Or(table(low, lowTo), table(mid, midTo)), table(high, highTo));
-    };
-    storeBlocks<Store>(d, part(kToPart<0, 0>, kToPart<0, 1>, kToPart<0, 2>), dst, 48);
-    storeBlocks<Store>(d, part(kToPart<1, 0>, kToPart<1, 1>, kToPart<1, 2>), dst + 16, 48);
-    storeBlocks<Store>(d, part(kToPart<2, 0>, kToPart<2, 1>, kToPart<2, 2>), dst + 32, 48);
+    storeBlocks<Store>(d, part(ofField<0, 0>(d), ofField<1, 0>(d)), dst, 48);
+    storeBlocks<Store>(d, part(ofField<0, 1>(d), ofField<1, 1>(d)), dst + 16, 48);
+    storeBlocks<Store>(d, part(ofField<0, 2>(d), ofField<1, 2>(d)), dst + 32, 48);
 }
+
+#else
+
+template <class Store, class D>
+HWY_INLINE void storeThreeBytes(D d, hn::Vec<D> low, hn::Vec<D> mid, hn::Vec<D> high,
+                                uint8_t *dst) {
+    storeBlocks<Store>(
+        d, hn::Or(hn::Or(toPart<0, 0>(d, low), toPart<1, 0>(d, mid)), toPart<2, 0>(d, high)), dst,
+        48);
+    storeBlocks<Store>(
+        d, hn::Or(hn::Or(toPart<0, 1>(d, low), toPart<1, 1>(d, mid)), toPart<2, 1>(d, high)),
+        dst + 16, 48);
+    storeBlocks<Store>(
+        d, hn::Or(hn::Or(toPart<0, 2>(d, low), toPart<1, 2>(d, mid)), toPart<2, 2>(d, high)),
+        dst + 32, 48);
+}
+
+#endif
 
 // As many pixels as d has bytes, from their sums in two vectors.
 template <RasterVideoPixelLayout kLayout, class Store, class D, class V>
@@ -293,7 +342,6 @@ HWY_INLINE void storePixels(D d, const Sums<V> &first, const Sums<V> &second, ui
 
 // For both pixels of each word of 4 bytes: the bytes kLower and kUpper of it, as
 // those of a word of 2.
-constexpr uint8_t kNone = 0x80;
 template <uint8_t kLower, uint8_t kUpper>
 HWY_ALIGN constexpr auto kToBothPixels = [] {
     std::array<uint8_t, 16> sources{};
@@ -341,6 +389,14 @@ struct ConvertGroups {
                              group[kGroup.chromaHigh], dst + kPairBytes<kLayout> * i);
     }
 #else
+    // Some pages are read for each that is written around the caches; so that
+    // nothing waits for them, ask for the groups well ahead of i.
+    HWY_INLINE void prefetch(size_t i, size_t last) const {
+        const uint8_t *ahead = src + 4 * HWY_MIN(i + 512, last);
+        for (size_t line = 0; line < kLanes<Widest<uint8_t>> * 2; line += 64)
+            hwy::Prefetch(ahead + line);
+    }
+
     // Groups i and on: half as many as d has bytes.
     template <class Store, class D>
     HWY_INLINE void block(D d, size_t i) const {
@@ -364,12 +420,18 @@ struct ConvertGroups {
 #endif
 };
 
+// How far on the samples of the next two rows are.
+struct NextRows {
+    ptrdiff_t luma, chroma;
+};
+
 // One row, or two which share their chroma.
 template <RasterVideoPixelLayout kLayout, size_t kRows>
 struct ConvertRows {
     std::array<uint8_t *, kRows> dst;
     std::array<const uint8_t *, kRows> luma;
     const uint8_t *chromaHigh, *chromaLow;
+    NextRows next = {};
 
 #if HWY_TARGET == HWY_SCALAR
     void pair(size_t i) const {
@@ -378,6 +440,14 @@ struct ConvertRows {
                                  chromaHigh[i], dst[row] + kPairBytes<kLayout> * i);
     }
 #else
+    // The same place two rows on.
+    HWY_INLINE void prefetch(size_t i, size_t /*last*/) const {
+        for (const uint8_t *samples : luma)
+            hwy::Prefetch(samples + next.luma + 2 * i);
+        hwy::Prefetch(chromaHigh + next.chroma + i);
+        hwy::Prefetch(chromaLow + next.chroma + i);
+    }
+
     // Pairs of columns i and on: half as many as d has bytes.
     template <class Store, class D>
     HWY_INLINE void block(D d, size_t i) const {
@@ -438,8 +508,10 @@ HWY_INLINE void walkAroundCaches(size_t head, size_t pairs, const Body &body) {
     constexpr size_t n = kLanes<decltype(d)> / 2;
     body.template block<ThroughCaches>(d, 0);
     size_t i = head;
-    for (; pairs - i >= n; i += n)
+    for (; pairs - i >= n; i += n) {
+        body.prefetch(i, pairs - n);
         body.template block<AroundCaches>(d, i);
+    }
     if (i != pairs)
         body.template block<ThroughCaches>(d, pairs - n);
 }
@@ -539,7 +611,7 @@ void streamRows(const ConvertRows<kLayout, 2> &rows, size_t pairs) {
         return walkBlocks<kBytes>(pairs, rows, true, rows.dst[0]);
     for (size_t row = 0; row < 2; ++row) {
         const ConvertRows<kLayout, 1> one = {
-            {rows.dst[row]}, {rows.luma[row]}, rows.chromaHigh, rows.chromaLow};
+            {rows.dst[row]}, {rows.luma[row]}, rows.chromaHigh, rows.chromaLow, rows.next};
         walkBlocks<kBytes>(pairs, one, true, one.dst[0]);
     }
 }
@@ -550,11 +622,13 @@ template <RasterVideoPixelLayout kLayout>
 void convertRowPairs(DstRows dst, const VideoPlanes &src, Size pairs) {
     [[maybe_unused]] const bool streams =
         isStreamed(kPairBytes<kLayout> * pairs.width, 2 * pairs.height);
+    const NextRows next = {2 * src.luma.step, src.chromaHigh.step};
     for (size_t r = 0; r < pairs.height; ++r) {
         const ConvertRows<kLayout, 2> rows = {{dst.row(2 * r), dst.row(2 * r + 1)},
                                               {src.luma.row(2 * r), src.luma.row(2 * r + 1)},
                                               src.chromaHigh.row(r),
-                                              src.chromaLow.row(r)};
+                                              src.chromaLow.row(r),
+                                              r + 1 < pairs.height ? next : NextRows{}};
 #if HWY_TARGET == HWY_SCALAR
         for (size_t i = 0; i < pairs.width; ++i)
             rows.pair(i);
