@@ -190,16 +190,16 @@ constexpr uint32_t placeOfQuad(size_t quad, size_t blocks) {
     return static_cast<uint32_t>(inVector / 2 * 4 + quad / (2 * blocks) * 2 + inVector % 2);
 }
 
-// The order of quads in the blocks of a vector: that of memory, for pixels of 3
-// bytes; for pixels of 4 bytes the one that makes four vectors in the order of
+// The order of quads in the blocks of a vector: for pixels of 3 bytes whole blocks,
+// as storeParts takes them; for pixels of 4 bytes the one that makes four vectors in the order of
 // memory when each block is spread to a block of each.
 template <size_t kBytes, size_t kBlocks>
 HWY_ALIGN constexpr auto kQuadOrder = [] {
     std::array<uint32_t, 4 * kBlocks> order{};
     for (size_t block = 0; block < kBlocks; ++block)
         for (size_t i = 0; i < 4; ++i)
-            order[4 * block + i] =
-                placeOfQuad(kBytes == 3 ? 4 * block + i : kBlocks * i + block, kBlocks);
+            order[4 * block + i] = placeOfQuad(
+                kBytes == 3 ? 4 * (3 * block % kBlocks) + i : kBlocks * i + block, kBlocks);
     return order;
 }();
 
@@ -232,17 +232,6 @@ HWY_INLINE void storeFourBytes(D d, hn::Vec<D> low, hn::Vec<D> mid, hn::Vec<D> h
              dst + 2 * kLanes<D>);
 }
 
-template <class Store, class D>
-HWY_INLINE void storeBlocks(D d, hn::Vec<D> v, uint8_t *to, size_t apart) {
-    if constexpr (kLanes<D> == 16) {
-        Store::store(d, v, to);
-    } else {
-        const hn::Half<D> half;
-        storeBlocks<Store>(half, hn::LowerHalf(half, v), to, apart);
-        storeBlocks<Store>(half, hn::UpperHalf(half, v), to + kLanes<D> / 32 * apart, apart);
-    }
-}
-
 // What a table has where a byte is to be 0.
 constexpr uint8_t kNone = 0x80;
 
@@ -273,6 +262,55 @@ HWY_INLINE hn::Vec<D> toPart(D d, hn::Vec<D> field) {
 
 #if HWY_TARGET == HWY_AVX3
 
+// The blocks from the part with the given number among those that a vector has
+// of the memory, the kVector-th of three.
+template <size_t kPart, size_t kVector, class D>
+HWY_INLINE hn::Mask<D> ofPart(D) {
+    constexpr uint8_t kMask = [] {
+        uint8_t mask = 0;
+        for (size_t block = 0; block < 4; ++block)
+            if ((4 * kVector + block) % 3 == kPart)
+                mask = static_cast<uint8_t>(mask | 3 << 2 * block);
+        return mask;
+    }();
+    return hn::Mask<D>{kMask};
+}
+
+#endif
+
+// The parts of the blocks to the order of memory, which has those of a block one
+// after the other.
+template <class Store, class D>
+HWY_INLINE void storeParts(D d, hn::Vec<D> part0, hn::Vec<D> part1, hn::Vec<D> part2, uint8_t *to) {
+    constexpr size_t n = kLanes<D>;
+    if constexpr (n == 16) {
+        Store::store(d, part0, to);
+        Store::store(d, part1, to + n);
+        Store::store(d, part2, to + 2 * n);
+    } else if constexpr (n == 32) {
+        Store::store(d, hn::ConcatLowerLower(d, part1, part0), to);
+        Store::store(d, hn::ConcatUpperLower(d, part0, part2), to + n);
+        Store::store(d, hn::ConcatUpperUpper(d, part2, part1), to + 2 * n);
+    } else {
+#if HWY_TARGET == HWY_AVX3
+        // The 16 bytes that come c-th in memory are of part c % 3.  The order of
+        // the blocks has them at c % 4 in part 0, to which the others are turned.
+        const hn::Repartition<uint64_t, D> d64;
+        const auto a = hn::BitCast(d64, part0);
+        const hn::Vec<decltype(d64)> b{_mm512_shuffle_i64x2(part1.raw, part1.raw, 0x93)};
+        const hn::Vec<decltype(d64)> c{_mm512_shuffle_i64x2(part2.raw, part2.raw, 0x4E)};
+        const auto merged = [&](auto isA, auto isB) HWY_ATTR {
+            return hn::IfThenElse(isA, a, hn::IfThenElse(isB, b, c));
+        };
+        Store::store(d64, merged(ofPart<0, 0>(d64), ofPart<1, 0>(d64)), to);
+        Store::store(d64, merged(ofPart<0, 1>(d64), ofPart<1, 1>(d64)), to + n);
+        Store::store(d64, merged(ofPart<0, 2>(d64), ofPart<1, 2>(d64)), to + 2 * n);
+#endif
+    }
+}
+
+#if HWY_TARGET == HWY_AVX3
+
 // The bytes of a part that a field has.
 template <size_t kField, size_t kPart, class D>
 HWY_INLINE hn::Mask<D> ofField(D d) {
@@ -295,9 +333,9 @@ HWY_INLINE void storeThreeBytes(D d, hn::Vec<D> low, hn::Vec<D> mid, hn::Vec<D> 
     const auto part = [&](auto isLow, auto isMid) HWY_ATTR {
         return hn::IfThenElse(isLow, low, hn::IfThenElse(isMid, mid, high));
     };
-    storeBlocks<Store>(d, part(ofField<0, 0>(d), ofField<1, 0>(d)), dst, 48);
-    storeBlocks<Store>(d, part(ofField<0, 1>(d), ofField<1, 1>(d)), dst + 16, 48);
-    storeBlocks<Store>(d, part(ofField<0, 2>(d), ofField<1, 2>(d)), dst + 32, 48);
+    storeParts<Store>(d, part(ofField<0, 0>(d), ofField<1, 0>(d)),
+                      part(ofField<0, 1>(d), ofField<1, 1>(d)),
+                      part(ofField<0, 2>(d), ofField<1, 2>(d)), dst);
 }
 
 #else
@@ -305,15 +343,11 @@ HWY_INLINE void storeThreeBytes(D d, hn::Vec<D> low, hn::Vec<D> mid, hn::Vec<D> 
 template <class Store, class D>
 HWY_INLINE void storeThreeBytes(D d, hn::Vec<D> low, hn::Vec<D> mid, hn::Vec<D> high,
                                 uint8_t *dst) {
-    storeBlocks<Store>(
-        d, hn::Or(hn::Or(toPart<0, 0>(d, low), toPart<1, 0>(d, mid)), toPart<2, 0>(d, high)), dst,
-        48);
-    storeBlocks<Store>(
-        d, hn::Or(hn::Or(toPart<0, 1>(d, low), toPart<1, 1>(d, mid)), toPart<2, 1>(d, high)),
-        dst + 16, 48);
-    storeBlocks<Store>(
-        d, hn::Or(hn::Or(toPart<0, 2>(d, low), toPart<1, 2>(d, mid)), toPart<2, 2>(d, high)),
-        dst + 32, 48);
+    const auto part = [&](auto lowBytes, auto midBytes, auto highBytes)
+                          HWY_ATTR { return hn::Or(hn::Or(lowBytes, midBytes), highBytes); };
+    storeParts<Store>(d, part(toPart<0, 0>(d, low), toPart<1, 0>(d, mid), toPart<2, 0>(d, high)),
+                      part(toPart<0, 1>(d, low), toPart<1, 1>(d, mid), toPart<2, 1>(d, high)),
+                      part(toPart<0, 2>(d, low), toPart<1, 2>(d, mid), toPart<2, 2>(d, high)), dst);
 }
 
 #endif
