@@ -184,39 +184,60 @@ HWY_INLINE hn::Vec<D> words(D16, const Sums<hn::Vec<D16>> &sums) {
     return hn::Xor(hn::Or(low, hn::Or(mid, high)), hn::Set(d, static_cast<uint16_t>(kTopBits)));
 }
 
-// Where narrowed() puts four pixels, the quad-th of all, by words of 4 bytes.
-constexpr uint32_t placeOfQuad(size_t quad, size_t blocks) {
-    const size_t inVector = quad % (2 * blocks);
-    return static_cast<uint32_t>(inVector / 2 * 4 + quad / (2 * blocks) * 2 + inVector % 2);
+// ---- Order --------------------------------------------------------------
+
+// Pixels are moved between vectors within blocks of 16 bytes.  So that they end up
+// in the order of memory, fours of them, quads, are first put where this is:
+// - 2 bytes a pixel: the first half of a block's words is of the first vector;
+// - 3 bytes: the block has pixels that follow each other, see storeParts;
+// - 4 bytes: each quad becomes a block, of a vector of its own.
+constexpr size_t quadAt(size_t bytes, size_t blocks, size_t block, size_t i) {
+    return bytes == 2   ? i / 2 * 2 * blocks + 2 * block + i % 2
+           : bytes == 3 ? 4 * (3 * block % blocks) + i
+                        : blocks * i + block;
 }
 
-// The order of quads in the blocks of a vector: for pixels of 3 bytes whole blocks,
-// as storeParts takes them; for pixels of 4 bytes the one that makes four vectors in the order of
-// memory when each block is spread to a block of each.
-template <size_t kBytes, size_t kBlocks>
-HWY_ALIGN constexpr auto kQuadOrder = [] {
-    std::array<uint32_t, 4 * kBlocks> order{};
+// Where narrowed() leaves a quad of pixels that come in their order.
+constexpr size_t narrowedAt(size_t quad, size_t blocks) {
+    const size_t inVector = quad % (2 * blocks);
+    return inVector / 2 * 4 + quad / (2 * blocks) * 2 + inVector % 2;
+}
+
+enum class Come { InOrder, Narrowed };
+
+template <size_t kBytes, size_t kBlocks, Come kCome>
+HWY_ALIGN constexpr auto kQuads = [] {
+    std::array<uint32_t, 4 * kBlocks> quads{};
     for (size_t block = 0; block < kBlocks; ++block)
-        for (size_t i = 0; i < 4; ++i)
-            order[4 * block + i] = placeOfQuad(
-                kBytes == 3 ? 4 * (3 * block % kBlocks) + i : kBlocks * i + block, kBlocks);
-    return order;
+        for (size_t i = 0; i < 4; ++i) {
+            const size_t quad = quadAt(kBytes, kBlocks, block, i);
+            quads[4 * block + i] =
+                static_cast<uint32_t>(kCome == Come::Narrowed ? narrowedAt(quad, kBlocks) : quad);
+        }
+    return quads;
 }();
+
+// A quad is a word of 4 bytes.
+template <size_t kBytes, Come kCome, class D>
+HWY_INLINE hn::Vec<D> ordered(D d, hn::Vec<D> v) {
+    constexpr size_t kBlocks = kLanes<D> * sizeof(hn::TFromD<D>) / 16;
+    const hn::Repartition<uint32_t, D> d32;
+    if constexpr (kBlocks == 1 || (kBlocks == 2 && kBytes == 3 && kCome == Come::InOrder))
+        return v;
+    else
+        return hn::BitCast(d, hn::TableLookupLanes(
+                                  hn::BitCast(d32, v),
+                                  hn::SetTableIndices(d32, kQuads<kBytes, kBlocks, kCome>.data())));
+}
+
+// ---- Whole bytes --------------------------------------------------------
 
 // The bytes of one field, from the sums of the first half of the pixels and of the
 // second.
-template <size_t kBytes, class D, class V>
+template <class D, class V>
 HWY_INLINE hn::Vec<D> fieldBytes(D d, V first, V second) {
-    constexpr size_t kBlocks = kLanes<D> / 16;
-    const auto bytes =
-        hn::Xor(narrowed(d, hn::ShiftRight<7>(first), hn::ShiftRight<7>(second)), hn::Set(d, 0x80));
-    const hn::Repartition<uint32_t, D> d32;
-    if constexpr (kBlocks == 1)
-        return bytes;
-    else
-        return hn::BitCast(
-            d, hn::TableLookupLanes(hn::BitCast(d32, bytes),
-                                    hn::SetTableIndices(d32, kQuadOrder<kBytes, kBlocks>.data())));
+    return hn::Xor(narrowed(d, hn::ShiftRight<7>(first), hn::ShiftRight<7>(second)),
+                   hn::Set(d, 0x80));
 }
 
 template <class Store, class D>
@@ -352,8 +373,9 @@ HWY_INLINE void storeThreeBytes(D d, hn::Vec<D> low, hn::Vec<D> mid, hn::Vec<D> 
 
 #endif
 
-// As many pixels as d has bytes, from their sums in two vectors.
-template <RasterVideoPixelLayout kLayout, class Store, class D, class V>
+// As many pixels as d has bytes, from their sums in two vectors.  Those that do
+// not come in the order of their size come as they are in memory.
+template <RasterVideoPixelLayout kLayout, class Store, bool kIsOrdered, class D, class V>
 HWY_INLINE void storePixels(D d, const Sums<V> &first, const Sums<V> &second, uint8_t *dst) {
     constexpr size_t kBytes = kLayout.bytesPerPixel;
     if constexpr (kBytes == 2) {
@@ -362,9 +384,16 @@ HWY_INLINE void storePixels(D d, const Sums<V> &first, const Sums<V> &second, ui
         Store::store(du16, words<kLayout>(d16, first), dst);
         Store::store(du16, words<kLayout>(d16, second), dst + kLanes<D>);
     } else {
-        const auto low = fieldBytes<kBytes>(d, first.low, second.low);
-        const auto mid = fieldBytes<kBytes>(d, first.mid, second.mid);
-        const auto high = fieldBytes<kBytes>(d, first.high, second.high);
+        const auto field = [&](V firstSums, V secondSums) HWY_ATTR {
+            const auto bytes = fieldBytes(d, firstSums, secondSums);
+            if constexpr (kIsOrdered)
+                return bytes;
+            else
+                return ordered<kBytes, Come::Narrowed>(d, bytes);
+        };
+        const auto low = field(first.low, second.low);
+        const auto mid = field(first.mid, second.mid);
+        const auto high = field(first.high, second.high);
         if constexpr (kBytes == 3)
             storeThreeBytes<Store>(d, low, mid, high, dst);
         else
@@ -436,7 +465,7 @@ struct ConvertGroups {
     HWY_INLINE void block(D d, size_t i) const {
         const auto first = sums(d, i);
         const auto second = sums(d, i + kLanes<D> / 4);
-        storePixels<kLayout, Store>(d, first, second, dst + kPairBytes<kLayout> * i);
+        storePixels<kLayout, Store, false>(d, first, second, dst + kPairBytes<kLayout> * i);
     }
 
     template <class D>
@@ -485,31 +514,38 @@ struct ConvertRows {
     // Pairs of columns i and on: half as many as d has bytes.
     template <class Store, class D>
     HWY_INLINE void block(D d, size_t i) const {
-        const auto firstChroma = chroma(d, i);
-        const auto secondChroma = chroma(d, i + kLanes<D> / 4);
-        for (size_t row = 0; row < kRows; ++row)
-            storePixels<kLayout, Store>(
-                d, sumsOf(lumaTerm(d, luma[row] + 2 * i), firstChroma),
-                sumsOf(lumaTerm(d, luma[row] + 2 * i + kLanes<D> / 2), secondChroma),
-                dst[row] + kPairBytes<kLayout> * i);
-    }
-
-    template <class D>
-    HWY_INLINE static auto lumaTerm(D, const uint8_t *samples) {
         const hn::Repartition<int16_t, D> d16;
-        const hn::Rebind<uint8_t, decltype(d16)> half;
-        const auto luma = hn::PromoteTo(d16, hn::LoadU(half, samples));
-        return hn::Add(hn::Mul(luma, hn::Set(d16, kLumaFactor)),
-                       hn::Set(d16, kLumaRest - 128 * kLumaFactor));
+        const auto ab = ordered<kLayout.bytesPerPixel, Come::InOrder>(d16, chroma(d16, i));
+        const auto terms = [&](auto both)
+                               HWY_ATTR { return chromaTerms(d16, hn::ShiftLeft<8>(both), both); };
+        const auto firstTerms = terms(hn::InterleaveLower(d16, ab, ab));
+        const auto secondTerms = terms(hn::InterleaveUpper(d16, ab, ab));
+        for (size_t row = 0; row < kRows; ++row) {
+            const auto samples =
+                ordered<kLayout.bytesPerPixel, Come::InOrder>(d, hn::LoadU(d, luma[row] + 2 * i));
+            const auto first = hn::InterleaveLower(d, samples, hn::Zero(d));
+            const auto second = hn::InterleaveUpper(d, samples, hn::Zero(d));
+            storePixels<kLayout, Store, true>(
+                d, sumsOf(lumaTerm(d16, hn::BitCast(d16, first)), firstTerms),
+                sumsOf(lumaTerm(d16, hn::BitCast(d16, second)), secondTerms),
+                dst[row] + kPairBytes<kLayout> * i);
+        }
     }
 
-    template <class D>
-    HWY_INLINE auto chroma(D, size_t i) const {
-        const hn::Repartition<uint32_t, D> d32;
-        const hn::Rebind<uint8_t, decltype(d32)> quarter;
-        const auto low = hn::PromoteTo(d32, hn::LoadU(quarter, chromaLow + i));
-        const auto high = hn::PromoteTo(d32, hn::LoadU(quarter, chromaHigh + i));
-        return chromaOf<0, 1>(d32, less128(d32, hn::Or(low, hn::ShiftLeft<8>(high))));
+    template <class D16>
+    HWY_INLINE static hn::Vec<D16> lumaTerm(D16 d, hn::Vec<D16> luma) {
+        return hn::Add(hn::Mul(luma, hn::Set(d, kLumaFactor)),
+                       hn::Set(d, kLumaRest - 128 * kLumaFactor));
+    }
+
+    // Less 128, a in the lower bytes and b in the upper ones.
+    template <class D16>
+    HWY_INLINE hn::Vec<D16> chroma(D16 d, size_t i) const {
+        const hn::Rebind<uint8_t, D16> half;
+        const auto low = hn::PromoteTo(d, hn::LoadU(half, chromaLow + i));
+        const auto high = hn::PromoteTo(d, hn::LoadU(half, chromaHigh + i));
+        return hn::Xor(hn::Or(low, hn::ShiftLeft<8>(high)),
+                       hn::Set(d, static_cast<int16_t>(0x8080)));
     }
 #endif
 };
