@@ -503,6 +503,10 @@ struct ConvertRows {
                                  chromaHigh[i], dst[row] + kPairBytes<kLayout> * i);
     }
 #else
+    ConvertRows<kLayout, 1> only(size_t row) const {
+        return {{dst[row]}, {luma[row]}, chromaHigh, chromaLow, next};
+    }
+
     // The same place two rows on.
     HWY_INLINE void prefetch(size_t i, size_t /*last*/) const {
         for (const uint8_t *samples : luma)
@@ -554,34 +558,28 @@ struct ConvertRows {
 
 // The least number of pairs there are in a block.
 constexpr size_t kLeastPairs = 8;
+using Least = hn::CappedTag<uint8_t, 2 * kLeastPairs>;
 
-// Every pair at least once.  Of fewer than the least number none.
-template <size_t kCap, class Body>
-HWY_INLINE void walkThroughCaches(size_t pairs, const Body &body) {
+// Calls use with the widest tag of which so many pairs fill a block; they are not
+// fewer than the least number.
+template <size_t kCap = kLanes<Widest<uint8_t>>, class Use>
+HWY_INLINE void withBlocks(size_t pairs, const Use &use) {
     const hn::CappedTag<uint8_t, kCap> d;
     constexpr size_t n = kLanes<decltype(d)> / 2;
     if constexpr (n > kLeastPairs) {
         if (pairs < n)
-            return walkThroughCaches<n>(pairs, body);
+            return withBlocks<n>(pairs, use);
     }
+    use(d);
+}
+
+// Every pair at least once, of at least a block.
+template <class D, class Body>
+HWY_INLINE void walkThroughCaches(D d, size_t pairs, const Body &body) {
+    constexpr size_t n = kLanes<D> / 2;
     size_t i = 0;
     for (; pairs - i >= n; i += n)
         body.template block<ThroughCaches>(d, i);
-    if (i != pairs)
-        body.template block<ThroughCaches>(d, pairs - n);
-}
-
-// The same, for at least 64 pairs, of which head begins a cache line.
-template <class Body>
-HWY_INLINE void walkAroundCaches(size_t head, size_t pairs, const Body &body) {
-    const Widest<uint8_t> d;
-    constexpr size_t n = kLanes<decltype(d)> / 2;
-    body.template block<ThroughCaches>(d, 0);
-    size_t i = head;
-    for (; pairs - i >= n; i += n) {
-        body.prefetch(i, pairs - n);
-        body.template block<AroundCaches>(d, i);
-    }
     if (i != pairs)
         body.template block<ThroughCaches>(d, pairs - n);
 }
@@ -590,16 +588,26 @@ HWY_INLINE void walkAroundCaches(size_t head, size_t pairs, const Body &body) {
 template <size_t kBytes>
 size_t pairsToLine(const uint8_t *dst) {
     const size_t pixels = pixelsToLine<kBytes>(dst);
-    return pixels % 2 != 0 ? 64 : pixels == 64 ? 64 : pixels / 2;
+    return pixels % 2 != 0 || pixels == 64 ? 64 : pixels / 2;
 }
 
+// The same for at least 64 pairs, and where one begins a cache line around the
+// caches.
 template <size_t kBytes, class Body>
-void walkBlocks(size_t pairs, const Body &body, bool streams, const uint8_t *dst) {
+HWY_INLINE void walkAroundCaches(const uint8_t *dst, size_t pairs, const Body &body) {
+    const Widest<uint8_t> d;
+    constexpr size_t n = kLanes<decltype(d)> / 2;
     const size_t head = pairsToLine<kBytes>(dst);
-    if (streams && head != 64)
-        walkAroundCaches(head, pairs, body);
-    else
-        walkThroughCaches<kLanes<Widest<uint8_t>>>(pairs, body);
+    if (head == 64)
+        return walkThroughCaches(d, pairs, body);
+    body.template block<ThroughCaches>(d, 0);
+    size_t i = head;
+    for (; pairs - i >= n; i += n) {
+        body.prefetch(i, pairs - n);
+        body.template block<AroundCaches>(d, i);
+    }
+    if (i != pairs)
+        body.template block<ThroughCaches>(d, pairs - n);
 }
 
 #endif
@@ -614,14 +622,17 @@ void convertRun(uint8_t *dst, const uint8_t *src, size_t pairs) {
     if (pairs < kLeastPairs) {
         uint8_t groups[4 * kLeastPairs] = {}, pixels[kPairBytes<kLayout> * kLeastPairs];
         std::memcpy(groups, src, 4 * pairs);
-        walkThroughCaches<16>(kLeastPairs, Convert{pixels, groups});
+        Convert{pixels, groups}.template block<ThroughCaches>(Least(), 0);
         std::memcpy(dst, pixels, kPairBytes<kLayout> * pairs);
         return;
     }
-    const bool streams = isStreamed(kPairBytes<kLayout> * pairs, 1);
-    walkBlocks<kLayout.bytesPerPixel>(pairs, Convert{dst, src}, streams, dst);
-    if (streams)
+    const Convert body = {dst, src};
+    if (isStreamed(kPairBytes<kLayout> * pairs, 1)) {
+        walkAroundCaches<kLayout.bytesPerPixel>(dst, pairs, body);
         hwy::FlushStream();
+    } else {
+        withBlocks(pairs, [&](auto d) HWY_ATTR { walkThroughCaches(d, pairs, body); });
+    }
 #endif
 }
 
@@ -667,8 +678,8 @@ void convertFewPairs(const ConvertRows<kLayout, 2> &rows, size_t pairs) {
         std::memcpy(luma[row], rows.luma[row], 2 * pairs);
     std::memcpy(high, rows.chromaHigh, pairs);
     std::memcpy(low, rows.chromaLow, pairs);
-    walkThroughCaches<16>(kLeastPairs, ConvertRows<kLayout, 2>{
-                                           {pixels[0], pixels[1]}, {luma[0], luma[1]}, high, low});
+    const ConvertRows<kLayout, 2> copies = {{pixels[0], pixels[1]}, {luma[0], luma[1]}, high, low};
+    copies.template block<ThroughCaches>(Least(), 0);
     for (size_t row = 0; row < 2; ++row)
         std::memcpy(rows.dst[row], pixels[row], kPairBytes<kLayout> * pairs);
 }
@@ -678,41 +689,42 @@ template <RasterVideoPixelLayout kLayout>
 void streamRows(const ConvertRows<kLayout, 2> &rows, size_t pairs) {
     constexpr size_t kBytes = kLayout.bytesPerPixel;
     if (pairsToLine<kBytes>(rows.dst[0]) == pairsToLine<kBytes>(rows.dst[1]))
-        return walkBlocks<kBytes>(pairs, rows, true, rows.dst[0]);
-    for (size_t row = 0; row < 2; ++row) {
-        const ConvertRows<kLayout, 1> one = {
-            {rows.dst[row]}, {rows.luma[row]}, rows.chromaHigh, rows.chromaLow, rows.next};
-        walkBlocks<kBytes>(pairs, one, true, one.dst[0]);
-    }
+        return walkAroundCaches<kBytes>(rows.dst[0], pairs, rows);
+    for (size_t row = 0; row < 2; ++row)
+        walkAroundCaches<kBytes>(rows.dst[row], pairs, rows.only(row));
 }
 
 #endif
 
 template <RasterVideoPixelLayout kLayout>
 void convertRowPairs(DstRows dst, const VideoPlanes &src, Size pairs) {
-    [[maybe_unused]] const bool streams =
-        isStreamed(kPairBytes<kLayout> * pairs.width, 2 * pairs.height);
     const NextRows next = {2 * src.luma.step, src.chromaHigh.step};
-    for (size_t r = 0; r < pairs.height; ++r) {
-        const ConvertRows<kLayout, 2> rows = {{dst.row(2 * r), dst.row(2 * r + 1)},
-                                              {src.luma.row(2 * r), src.luma.row(2 * r + 1)},
-                                              src.chromaHigh.row(r),
-                                              src.chromaLow.row(r),
-                                              r + 1 < pairs.height ? next : NextRows{}};
+    const auto rows = [&](size_t r) {
+        return ConvertRows<kLayout, 2>{{dst.row(2 * r), dst.row(2 * r + 1)},
+                                       {src.luma.row(2 * r), src.luma.row(2 * r + 1)},
+                                       src.chromaHigh.row(r),
+                                       src.chromaLow.row(r),
+                                       r + 1 < pairs.height ? next : NextRows{}};
+    };
 #if HWY_TARGET == HWY_SCALAR
+    for (size_t r = 0; r < pairs.height; ++r)
         for (size_t i = 0; i < pairs.width; ++i)
-            rows.pair(i);
+            rows(r).pair(i);
 #else
-        if (streams)
-            streamRows(rows, pairs.width);
-        else if (pairs.width < kLeastPairs)
-            convertFewPairs(rows, pairs.width);
-        else
-            walkThroughCaches<kLanes<Widest<uint8_t>>>(pairs.width, rows);
-#endif
-    }
-    if (streams)
+    if (isStreamed(kPairBytes<kLayout> * pairs.width, 2 * pairs.height)) {
+        for (size_t r = 0; r < pairs.height; ++r)
+            streamRows(rows(r), pairs.width);
         hwy::FlushStream();
+    } else if (pairs.width < kLeastPairs) {
+        for (size_t r = 0; r < pairs.height; ++r)
+            convertFewPairs(rows(r), pairs.width);
+    } else {
+        withBlocks(pairs.width, [&](auto d) HWY_ATTR {
+            for (size_t r = 0; r < pairs.height; ++r)
+                walkThroughCaches(d, pairs.width, rows(r));
+        });
+    }
+#endif
 }
 
 void ConvertPlanar(DstRows dst, int32 bppdepth, const VideoPlanes &src, Size pairs) {
