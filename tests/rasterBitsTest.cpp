@@ -2,6 +2,7 @@
 
 #include "raster.h"
 #include "reference/bits.h"
+#include "support/fence.h"
 #include "support/messages.h"
 #include "support/surfaces.h"
 
@@ -52,6 +53,31 @@ TEST(BitsToPixels, matchesReference) {
     clearMessages();
     holdToReference(16000, [](Random &random) { return expansion(random, random.oneIn(2)); });
     EXPECT_TRUE(warnings().empty());
+}
+
+// More than the caches nearest to a core hold, in rows of which each lies to cache
+// lines in its own way.
+TEST(BitsToPixels, largeSurfacesMatchReference) {
+    constexpr uint32 kWidth = 1013, kHeight = 1700;
+    constexpr int32 kBitsLine = (kWidth + 7) / 8;
+    forEachCase(4, [&](Random &random) {
+        const auto bytes = static_cast<int32>(1 + running.number);
+        const int32 line = kWidth * bytes;
+        const FencedBuffer bits(kBitsLine * kHeight), dst(static_cast<size_t>(line) * kHeight);
+        random.fill(bits.data(), bits.size());
+        const auto expand = [&](auto opaque, auto stencil, uint8 *to) {
+            opaque(bits.data(), kBitsLine, to, line, bytes, kWidth, kHeight, 0x12345678, 0xABCDEF);
+            stencil(bits.data() + kBitsLine, kBitsLine, to, line, bytes, kWidth, kHeight - 1, 0xA5);
+        };
+        std::vector<uint8> expected(dst.size());
+        expand(reference::bitsToPixels, reference::bitsToPixelsStencil, expected.data());
+        forEachTarget([&] {
+            std::fill(dst.data(), dst.end(), uint8{0});
+            expand(Raster_BitsToPixels, Raster_BitsToPixelsStencil, dst.data());
+            EXPECT_TRUE(dst.canariesIntact());
+            EXPECT_TRUE(std::equal(dst.data(), dst.end(), expected.begin())) << bytes;
+        });
+    });
 }
 
 // A page of which pixels under set bits are part, amid inaccessible ones where

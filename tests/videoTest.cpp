@@ -46,6 +46,20 @@ TEST(YuvToRgb, matchesReference) {
     });
 }
 
+// More than the caches nearest to a core hold, with rows that lie to cache lines
+// alike and with rows that do not.
+TEST(YuvToRgb, largeFramesMatchReference) {
+    forEachTarget([&] {
+        forEachCase(2, [&](Random &random) {
+            const uint32 width = running.number == 0 ? 1088 : 1030;
+            for (const uint32 format : kFormats)
+                for (const int32 depth : kDepths)
+                    expectConverted(random, width, 1540 / static_cast<uint32>(depth + 1) * 16 / 2,
+                                    format, depth);
+        });
+    });
+}
+
 // Every luma with every pair of chroma, as runs of one chromaLow.
 TEST(YuvToRgb, everyTriple) {
     constexpr uint32 kSide = 256; // luma, chromaHigh
@@ -177,6 +191,38 @@ TEST(ApplyColorKey, matchesReference) {
         operation.isOneCorner = true;
         return operation;
     });
+}
+
+// Large surfaces, apart from each other or written where they are read.
+TEST(ApplyColorKey, largeSurfacesMatchReference) {
+    constexpr uint32 kWidth = 701, kHeight = 600;
+    constexpr int32 kLine = 4 * kWidth + 4;
+    constexpr size_t kBytes = size_t{kLine} * kHeight - 4;
+    Random random(baseSeed());
+    const FencedBuffer dst(kBytes), background(kBytes), overlay(kBytes), keys(kBytes);
+    for (const FencedBuffer *source : {&background, &overlay, &keys})
+        random.fill(source->data(), kBytes);
+    std::transform(keys.data(), keys.end(), keys.data(), [](uint8 key) { return key & 1; });
+    std::vector<uint8> expected(kBytes);
+    for (const uint32 depth : {8u, 16u, 32u}) {
+        const auto apply = [&](auto function, uint8 *to, const uint8 *from) {
+            function(from, to, overlay.data(), keys.data(), kLine, kLine, kLine, kLine, 1, 0, 0,
+                     kWidth, kHeight, depth);
+        };
+        std::fill(expected.begin(), expected.end(), uint8{0});
+        apply(reference::applyColorKey, expected.data(), background.data());
+        forEachTarget([&] {
+            std::fill(dst.data(), dst.end(), uint8{0});
+            apply(Raster_ApplyColorKey, dst.data(), background.data());
+            EXPECT_TRUE(std::equal(dst.data(), dst.end(), expected.begin())) << depth;
+            // Over the background, but for the gaps between rows.
+            std::copy(background.data(), background.end(), dst.data());
+            for (uint32 y = 1; y < kHeight; ++y)
+                std::fill_n(dst.data() + size_t{y} * kLine - 4, 4, uint8{0});
+            apply(Raster_ApplyColorKey, dst.data(), dst.data());
+            EXPECT_TRUE(std::equal(dst.data(), dst.end(), expected.begin())) << depth;
+        });
+    }
 }
 
 TEST(ApplyColorKey, bitsThatCount) {

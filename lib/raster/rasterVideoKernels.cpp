@@ -600,7 +600,8 @@ HWY_INLINE void walkAroundCaches(const uint8_t *dst, size_t pairs, const Body &b
     const size_t head = pairsToLine<kBytes>(dst);
     if (head == 64)
         return walkThroughCaches(d, pairs, body);
-    body.template block<ThroughCaches>(d, 0);
+    for (size_t i = 0; i < head; i += n)
+        body.template block<ThroughCaches>(d, i);
     size_t i = head;
     for (; pairs - i >= n; i += n) {
         body.prefetch(i, pairs - n);
