@@ -30,6 +30,10 @@ void copyLongRows(DstRows dst, SrcRows src, Size size) {
         copyStreamedRows(dst, src, size);
         return;
     }
+    if (size.width <= kMiddlingRow) {
+        copyMiddlingRows(dst, src, size);
+        return;
+    }
     for (size_t y = 0; y < size.height; ++y)
         std::memcpy(dst.row(y), src.row(y), size.width);
 }

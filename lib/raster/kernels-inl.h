@@ -148,12 +148,25 @@ struct FirstLanes {
     }
 };
 
-// Every pixel exactly once, in rising order, and in falling order.
+// Every pixel exactly once, in rising order, and in falling order.  Rising, the
+// vectors of longer rows are aligned to dst: those that lie across two cache lines
+// cost double.
 template <class T, class Body>
-HWY_INLINE void walkParts(size_t count, const Body &body) {
+HWY_INLINE void walkParts(const uint8_t *dst, size_t count, const Body &body) {
     const Widest<T> d;
     constexpr size_t n = kLanes<decltype(d)>;
+    if (count < 4) {
+        const auto whole = [&](auto few, size_t i) HWY_ATTR { body(few, i, AllLanes()); };
+        return walkTail<T, 2>(0, count, whole);
+    }
     size_t i = 0;
+    if (HWY_UNLIKELY(count >= 4 * n)) {
+        const size_t ahead = reinterpret_cast<uintptr_t>(dst) % (n * sizeof(T));
+        if (ahead != 0 && ahead % sizeof(T) == 0) {
+            i = n - ahead / sizeof(T);
+            body(d, 0, FirstLanes{i});
+        }
+    }
     for (; count - i >= n; i += n)
         body(d, i, AllLanes());
     if (i != count)
@@ -173,8 +186,21 @@ HWY_INLINE void walkPartsBackwards(size_t count, const Body &body) {
 #else
 
 template <class T, class Body>
-HWY_INLINE void walkParts(size_t count, const Body &body) {
-    walkOnce<T>(count, [&](auto d, size_t i) HWY_ATTR { body(d, i, AllLanes()); });
+HWY_INLINE void walkParts(const uint8_t * /*dst*/, size_t count, const Body &body) {
+    const auto whole = [&](auto d, size_t i) HWY_ATTR { body(d, i, AllLanes()); };
+    const Widest<T> d;
+    constexpr size_t n = kLanes<decltype(d)>;
+    size_t i = 0;
+    for (; count - i >= 2 * n; i += 2 * n) {
+        whole(d, i);
+        whole(d, i + n);
+    }
+    if (count - i >= n) {
+        whole(d, i);
+        i += n;
+    }
+    if constexpr (n > 1)
+        walkTail<T, n / 2>(i, count, whole);
 }
 
 template <class T, class Body>

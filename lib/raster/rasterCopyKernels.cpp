@@ -76,7 +76,7 @@ HWY_INLINE void copyCapped(DstRows dst, SrcRows src, Size bytes) {
 }
 
 void CopyShort(DstRows dst, SrcRows src, Size bytes) {
-    constexpr size_t kMost = 4 * 4 * kLanes<hn::CappedTag<uint32_t, 16>>;
+    constexpr size_t kMost = size_t{16} * kLanes<hn::CappedTag<uint32_t, 16>>;
     if (bytes.width <= kMost)
         return copyCapped<64>(dst, src, bytes);
     for (size_t y = 0; y < bytes.height; ++y)
@@ -96,6 +96,26 @@ struct CopyWords {
     }
 };
 
+// Aligned stores but for the first and the last vector.
+void CopyMiddling(DstRows dst, SrcRows src, Size bytes) {
+    const Widest<uint8_t> d;
+    constexpr size_t n = kLanes<decltype(d)>;
+    for (size_t y = 0; y < bytes.height; ++y) {
+        const CopyWords<ThroughCaches> body = {dst.row(y), src.row(y)};
+        body(d, 0);
+        size_t i = n - reinterpret_cast<uintptr_t>(body.dst) % n;
+        for (; bytes.width - i >= 4 * n; i += 4 * n) {
+            body(d, i);
+            body(d, i + n);
+            body(d, i + 2 * n);
+            body(d, i + 3 * n);
+        }
+        for (; bytes.width - i >= n; i += n)
+            body(d, i);
+        body(d, bytes.width - n);
+    }
+}
+
 void CopyStreamed(DstRows dst, SrcRows src, Size bytes) {
     for (size_t y = 0; y < bytes.height; ++y) {
         uint8_t *to = dst.row(y);
@@ -114,10 +134,15 @@ HWY_AFTER_NAMESPACE();
 namespace quillon {
 
 HWY_EXPORT(CopyShort);
+HWY_EXPORT(CopyMiddling);
 HWY_EXPORT(CopyStreamed);
 
 void copyShortRows(DstRows dst, SrcRows src, Size bytes) {
     HWY_DYNAMIC_DISPATCH(CopyShort)(dst, src, bytes);
+}
+
+void copyMiddlingRows(DstRows dst, SrcRows src, Size bytes) {
+    HWY_DYNAMIC_DISPATCH(CopyMiddling)(dst, src, bytes);
 }
 
 void copyStreamedRows(DstRows dst, SrcRows src, Size bytes) {

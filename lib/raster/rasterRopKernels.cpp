@@ -18,67 +18,62 @@ namespace {
 
 // ---- Against a constant -------------------------------------------------
 
-template <size_t kBytes>
-struct RopPattern {
-    BytePattern<kBytes> keep;
-    BytePattern<kBytes> flip;
-};
+template <class D, class Lanes>
+HWY_INLINE void combineVector(D d, uint8_t *at, hn::Vec<D> keep, hn::Vec<D> flip, Lanes lanes) {
+    auto *to = reinterpret_cast<hn::TFromD<D> *>(at);
+    lanes.store(d, hn::Xor(hn::And(lanes.load(d, to), keep), flip), to);
+}
 
-// One vector from byte i of a row on; kPeriod is the number of bytes after which
-// the pattern repeats, and 1 where it is the same in all vectors.
-template <size_t kPeriod, size_t kBytes>
-struct RopFillBody {
+// A row of whole vectors.
+template <class D>
+HWY_INLINE void combineVectors(D d, uint8_t *row, size_t bytes, const PatternVectors<D> &keep,
+                               const PatternVectors<D> &flip) {
+    constexpr size_t n = PatternVectors<D>::kBytes;
+    const AllLanes all;
+    size_t i = 0;
+    for (; bytes - i >= 3 * n; i += 3 * n) {
+        combineVector(d, row + i, keep.first, flip.first, all);
+        combineVector(d, row + i + n, keep.second, flip.second, all);
+        combineVector(d, row + i + 2 * n, keep.third, flip.third, all);
+    }
+    if (bytes - i >= n)
+        combineVector(d, row + i, keep.first, flip.first, all);
+    if (bytes - i >= 2 * n)
+        combineVector(d, row + i + n, keep.second, flip.second, all);
+}
+
+// The rest of a row, behind its whole vectors; the pattern from there on.
+struct RopFillRest {
     uint8_t *dst;
-    const RopPattern<kBytes> &pattern;
+    const uint8_t *keep;
+    const uint8_t *flip;
 
     template <class D, class Lanes>
     HWY_INLINE void operator()(D d, size_t i, Lanes lanes) const {
-        const size_t phase = i % kPeriod;
-        const auto keep = hn::LoadU(d, pattern.keep.bytes + phase);
-        const auto flip = hn::LoadU(d, pattern.flip.bytes + phase);
-        lanes.store(d, hn::Xor(hn::And(lanes.load(d, dst + i), keep), flip), dst + i);
+        combineVector(d, dst + i, hn::LoadU(d, keep + i), hn::LoadU(d, flip + i), lanes);
     }
 };
 
-// Vectors by threes, which hold whole pixels of every size: the pattern stays in
-// registers.  Returns how far that went.
-template <class D, size_t kBytes>
-HWY_INLINE size_t ropFillThrees(D d, uint8_t *row, size_t bytes,
-                                const RopPattern<kBytes> &pattern) {
-    constexpr size_t n = kBytes;
-    const auto at = [&](const BytePattern<kBytes> &part, size_t vector)
-                        HWY_ATTR { return hn::LoadU(d, part.from(vector * n)); };
-    const auto keep0 = at(pattern.keep, 0), flip0 = at(pattern.flip, 0);
-    const auto keep1 = at(pattern.keep, 1), flip1 = at(pattern.flip, 1);
-    const auto keep2 = at(pattern.keep, 2), flip2 = at(pattern.flip, 2);
-    const auto combined = [&](uint8_t *to, hn::Vec<D> keep, hn::Vec<D> flip)
-                              HWY_ATTR { return hn::Xor(hn::And(hn::LoadU(d, to), keep), flip); };
-    size_t i = 0;
-    for (; bytes - i >= 3 * n; i += 3 * n) {
-        uint8_t *to = row + i;
-        hn::StoreU(combined(to, keep0, flip0), d, to);
-        hn::StoreU(combined(to + n, keep1, flip1), d, to + n);
-        hn::StoreU(combined(to + 2 * n, keep2, flip2), d, to + 2 * n);
-    }
-    return i;
-}
-
 void RopFill(DstRows dst, Size bytes, int32 bytesPerPixel, uint32 keep, uint32 flip) {
-    const Widest<uint8_t> d;
-    constexpr size_t n = kLanes<decltype(d)>;
-    const RopPattern<n> pattern = {BytePattern<n>(keep, bytesPerPixel),
-                                   BytePattern<n>(flip, bytesPerPixel)};
+    const Widest<uint32_t> d;
+    using Vectors = PatternVectors<Widest<uint32_t>>;
+    const PixelPattern keepPattern(keep, bytesPerPixel), flipPattern(flip, bytesPerPixel);
+    const Vectors keepVectors(d, keepPattern, 0), flipVectors(d, flipPattern, 0);
+
     bytes = joinedRows(bytes, bytes.width, dst.step);
+    const size_t whole = bytes.width - bytes.width % Vectors::kBytes;
+    HWY_ALIGN uint32_t keepRest[kLanes<decltype(d)>];
+    HWY_ALIGN uint32_t flipRest[kLanes<decltype(d)>];
+    hn::Store(keepPattern.from(d, whole), d, keepRest);
+    hn::Store(flipPattern.from(d, whole), d, flipRest);
+
     for (size_t y = 0; y < bytes.height; ++y) {
         uint8_t *row = dst.row(y);
-        // Vectors of a single byte, on the scalar target, see a byte of the pixel each.
-        if constexpr (n < 4) {
-            walkParts<uint8_t>(bytes.width, RopFillBody<12, n>{row, pattern});
-        } else {
-            const size_t done = ropFillThrees(d, row, bytes.width, pattern);
-            const RopFillBody<3, n> rest = {row + done, pattern};
-            walkParts<uint8_t>(bytes.width - done, rest);
-        }
+        combineVectors(d, row, whole, keepVectors, flipVectors);
+        const RopFillRest rest = {row + whole, reinterpret_cast<const uint8_t *>(keepRest),
+                                  reinterpret_cast<const uint8_t *>(flipRest)};
+        if (whole != bytes.width)
+            walkParts<uint8_t>(rest.dst, bytes.width - whole, rest);
     }
 }
 
@@ -150,7 +145,7 @@ void ropRows(DstRows dst, SrcRows src, Size bytes, int32 bytesPerPixel, bool bac
             if (backwards)
                 walkPartsBackwards<uint8_t>(bytes.width, body);
             else
-                walkParts<uint8_t>(bytes.width, body);
+                walkParts<uint8_t>(to, bytes.width, body);
         } else if (bytesPerPixel == 2) {
             ropPixels<kRop, uint16_t>(to, from, bytes.width, backwards);
         } else if (bytesPerPixel == 4) {

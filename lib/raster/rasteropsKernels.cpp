@@ -16,80 +16,84 @@ namespace {
 // ---- Fill ---------------------------------------------------------------
 
 // Rows too short for the smallest vector, of 1 to 3 bytes.
-void fillFewBytes(DstRows dst, Size bytes, const uint8_t *pattern) {
+void fillFewBytes(DstRows dst, Size bytes, const PixelPattern &pattern) {
+    const uint32_t word = hn::GetLane(pattern.from(hn::CappedTag<uint32_t, 1>(), 0));
+    const size_t middle = bytes.width / 2, last = bytes.width - 1;
     for (size_t y = 0; y < bytes.height; ++y) {
         uint8_t *row = dst.row(y);
-        for (size_t i = 0; i < bytes.width; ++i)
-            row[i] = pattern[i];
+        row[0] = static_cast<uint8_t>(word);
+        row[middle] = static_cast<uint8_t>(word >> (8 * middle));
+        row[last] = static_cast<uint8_t>(word >> (8 * last));
     }
 }
 
-// The bytes of a row from where vectors are aligned on, three vectors in turn so
-// that each holds its part of the pattern.
-template <class Stores, size_t kCap, class D>
-HWY_INLINE void fillAligned(D d, uint8_t *row, size_t i, size_t end,
-                            const BytePattern<kCap> &pattern) {
-    constexpr size_t n = kCap;
-    const auto from = [&](size_t offset) HWY_ATTR {
-        return hn::LoadU(d, reinterpret_cast<const uint32_t *>(pattern.from(offset)));
+// The vectors from byte i on, but for the last one of the row.
+template <class Stores, class D>
+HWY_INLINE void fillFrom(D d, uint8_t *row, size_t i, size_t end, const PatternVectors<D> &v) {
+    constexpr size_t n = PatternVectors<D>::kBytes;
+    const auto storeThree = [&](size_t at) HWY_ATTR {
+        Stores::store(d, v.first, row + at);
+        Stores::store(d, v.second, row + at + n);
+        Stores::store(d, v.third, row + at + 2 * n);
     };
-    const auto first = from(i);
-    const auto second = from(i + n);
-    const auto third = from(i + 2 * n);
-    for (; end - i >= 3 * n; i += 3 * n) {
-        Stores::store(d, first, row + i);
-        Stores::store(d, second, row + i + n);
-        Stores::store(d, third, row + i + 2 * n);
+    for (; end - i > 6 * n; i += 6 * n) {
+        storeThree(i);
+        storeThree(i + 3 * n);
     }
-    if (end - i >= n)
-        Stores::store(d, first, row + i);
-    if (end - i >= 2 * n)
-        Stores::store(d, second, row + i + n);
+    if (end - i > 3 * n) {
+        storeThree(i);
+        i += 3 * n;
+    }
+    if (end - i > n)
+        Stores::store(d, v.first, row + i);
+    if (end - i > 2 * n)
+        Stores::store(d, v.second, row + i + n);
 }
 
 // Rows of at least one vector.  The first and the last vector are stored as they
 // come and may overlap what is between them, which is aligned where it is long
 // enough to be worth that.
-template <class Stores, size_t kCap>
-void fillVectors(DstRows dst, Size bytes, const BytePattern<kCap> &pattern) {
-    // In words: the fallback has no other lanes of 4 bytes.
-    const hn::CappedTag<uint32_t, kCap / 4> d;
-    constexpr size_t n = kCap;
-    const auto from = [&](size_t offset) HWY_ATTR {
-        return hn::LoadU(d, reinterpret_cast<const uint32_t *>(pattern.from(offset)));
-    };
-    const auto first = from(0);
-    const auto last = from(bytes.width - n);
-    const bool isLong = bytes.width >= 8 * n;
+template <class Stores, class D>
+void fillVectors(D d, DstRows dst, Size bytes, const PixelPattern &pattern) {
+    constexpr size_t n = PatternVectors<D>::kBytes;
+    const auto first = pattern.from(d, 0);
+    const auto last = pattern.from(d, bytes.width - n);
+    const bool isLong = bytes.width >= 4 * n;
+    size_t begin = n;
+    PatternVectors<D> between(d, pattern, begin);
     for (size_t y = 0; y < bytes.height; ++y) {
         uint8_t *row = dst.row(y);
+        const size_t toAligned = n - reinterpret_cast<uintptr_t>(row) % n;
+        if (isLong && begin != toAligned) {
+            begin = toAligned;
+            between = PatternVectors<D>(d, pattern, begin);
+        }
         ThroughCaches::store(d, first, row);
-        const size_t begin = isLong ? n - reinterpret_cast<uintptr_t>(row) % n : n;
-        fillAligned<Stores, kCap>(d, row, begin, bytes.width, pattern);
+        fillFrom<Stores>(d, row, begin, bytes.width, between);
         ThroughCaches::store(d, last, row + bytes.width - n);
     }
 }
 
-// The widest vectors that fit a row.
-template <size_t kCap>
-void fillCapped(DstRows dst, Size bytes, uint32_t pixel, int32_t bytesPerPixel) {
-    if (bytes.width >= kCap)
-        fillVectors<ThroughCaches>(dst, bytes, BytePattern<kCap>(pixel, bytesPerPixel));
-    else if constexpr (kCap > 4)
-        fillCapped<kCap / 2>(dst, bytes, pixel, bytesPerPixel);
+// The widest vectors that fit a row, in words: the fallback has no others of 4 bytes.
+template <size_t kBytes>
+void fillCapped(DstRows dst, Size bytes, const PixelPattern &pattern) {
+    if (bytes.width >= kBytes)
+        fillVectors<ThroughCaches>(hn::CappedTag<uint32_t, kBytes / 4>(), dst, bytes, pattern);
+    else if constexpr (kBytes > 4)
+        fillCapped<kBytes / 2>(dst, bytes, pattern);
     else
-        fillFewBytes(dst, bytes, BytePattern<4>(pixel, bytesPerPixel).bytes);
+        fillFewBytes(dst, bytes, pattern);
 }
 
 void Fill(DstRows dst, Size size, int32 bytesPerPixel, uint32 pixel) {
     const size_t rowBytes = size.width * static_cast<size_t>(bytesPerPixel);
     const Size bytes = joinedRows({rowBytes, size.height}, rowBytes, dst.step);
-    constexpr size_t n = 4 * kLanes<Widest<uint32_t>>;
+    const PixelPattern pattern(pixel, bytesPerPixel);
     if (isStreamed(bytes.width, bytes.height)) {
-        fillVectors<AroundCaches>(dst, bytes, BytePattern<n>(pixel, bytesPerPixel));
+        fillVectors<AroundCaches>(Widest<uint32_t>(), dst, bytes, pattern);
         hwy::FlushStream();
     } else {
-        fillCapped<n>(dst, bytes, pixel, bytesPerPixel);
+        fillCapped<4 * kLanes<Widest<uint32_t>>>(dst, bytes, pattern);
     }
 }
 
@@ -99,18 +103,30 @@ struct SetAlpha {
     uint8_t *dst;
     uint32_t alpha; // in the top byte
 
-    template <class D>
-    HWY_INLINE void operator()(D d, size_t i) const {
+    template <class D, class Lanes>
+    HWY_INLINE void operator()(D d, size_t i, Lanes lanes) const {
         auto *pixels = reinterpret_cast<uint32_t *>(dst + 4 * i);
-        const auto colour = hn::And(hn::LoadU(d, pixels), hn::Set(d, 0x00FFFFFF));
-        hn::StoreU(hn::Or(colour, hn::Set(d, alpha)), d, pixels);
+        const auto colour = hn::And(lanes.load(d, pixels), hn::Set(d, 0x00FFFFFF));
+        lanes.store(d, hn::Or(colour, hn::Set(d, alpha)), pixels);
     }
 };
 
+// Rows too short for vectors, of 1 to 3 pixels: only the bytes that change.
+void fillFewAlphas(DstRows dst, Size size, uint8 alpha) {
+    for (size_t y = 0; y < size.height; ++y) {
+        uint8_t *row = dst.row(y);
+        row[3] = row[4 * (size.width / 2) + 3] = row[4 * size.width - 1] = alpha;
+    }
+}
+
 void FillAlpha(DstRows dst, Size size, uint8 alpha) {
     size = joinedRows(size, 4 * size.width, dst.step);
-    for (size_t y = 0; y < size.height; ++y)
-        walkAgain<uint32_t>(size.width, SetAlpha{dst.row(y), uint32_t{alpha} << 24});
+    if (size.width < 4)
+        return fillFewAlphas(dst, size, alpha);
+    for (size_t y = 0; y < size.height; ++y) {
+        uint8_t *row = dst.row(y);
+        walkParts<uint32_t>(row, size.width, SetAlpha{row, uint32_t{alpha} << 24});
+    }
 }
 
 // ---- Blend --------------------------------------------------------------
@@ -149,39 +165,64 @@ HWY_INLINE V blendOver(D d, V src, V dst) {
     const auto green = hn::MulHigh(hn::AndNot(low, dst16), factor);
     const auto under = hn::OrAnd(blueRed, green, hn::Set(d16, 0xFF00));
 
-    const auto colour = hn::Set(d, 0x00FFFFFF);
-    const auto covered = hn::Ne(hn::BitCast(d, factor), hn::Zero(d));
-    const auto kept =
-        hn::IfVecThenElse(hn::IfThenElseZero(covered, colour), hn::BitCast(d, under), dst);
-    return hn::BitCast(
-        d, hn::SaturatedAdd(hn::BitCast(d8, hn::And(src, colour)), hn::BitCast(d8, kept)));
+    const auto uncovered = hn::Eq(hn::BitCast(d, factor), hn::Zero(d));
+    const auto kept = hn::IfThenElse(uncovered, dst, hn::BitCast(d, under));
+    const auto sum = hn::SaturatedAdd(hn::BitCast(d8, src), hn::BitCast(d8, kept));
+    return hn::IfVecThenElse(hn::Set(d, 0x00FFFFFF), hn::BitCast(d, sum), dst);
 }
 
 #endif
 
+// In surfaces that no cache holds the arithmetic leaves memory waiting, unless it
+// is told ahead.
+constexpr size_t kAhead = 2048;
+
+template <bool kIsLarge>
 struct BlendOver {
     uint8_t *dst;
     const uint8_t *src;
 
     template <class D, class Lanes = AllLanes>
     HWY_INLINE void operator()(D d, size_t i, Lanes lanes = {}) const {
-        auto *pixels = reinterpret_cast<uint32_t *>(dst + 4 * i);
-        const auto over = lanes.load(d, reinterpret_cast<const uint32_t *>(src + 4 * i));
-        // Much of what lies over a picture is clear, in long runs, and changes nothing.
-        if (!hn::AllTrue(d, hn::Eq(over, hn::Zero(d))))
-            lanes.store(d, blendOver(d, over, lanes.load(d, pixels)), pixels);
+        uint8_t *at = dst + 4 * i;
+        const uint8_t *from = src + 4 * i;
+        if constexpr (kIsLarge) {
+            hwy::Prefetch(at + kAhead);
+            hwy::Prefetch(from + kAhead);
+        }
+        auto *pixels = reinterpret_cast<uint32_t *>(at);
+        const auto over = lanes.load(d, reinterpret_cast<const uint32_t *>(from));
+        // Much of what lies over a picture is clear, in long runs, and changes
+        // nothing.  A look at one pixel is cheaper than one at a vector.
+        if (isClear(from) && hn::AllTrue(d, hn::Eq(over, hn::Zero(d))))
+            return;
+        lanes.store(d, blendOver(d, over, lanes.load(d, pixels)), pixels);
+    }
+
+    HWY_INLINE static bool isClear(const uint8_t *from) {
+        uint32_t pixel;
+        hwy::CopyBytes<4>(from, &pixel);
+        return pixel == 0;
     }
 };
 
-void Blend(DstRows dst, SrcRows src, Size size) {
-    size = joinedRows(size, 4 * size.width, dst.step, 4 * size.width, src.step);
+template <bool kIsLarge>
+void blendRows(DstRows dst, SrcRows src, Size size) {
     for (size_t y = 0; y < size.height; ++y) {
-        const BlendOver body = {dst.row(y), src.row(y)};
+        const BlendOver<kIsLarge> body = {dst.row(y), src.row(y)};
         if (runsIntoItself(body.dst, body.src, 4 * kLanes<Widest<uint32_t>>))
             walkSingly<uint32_t>(size.width, body);
         else
-            walkParts<uint32_t>(size.width, body);
+            walkParts<uint32_t>(body.dst, size.width, body);
     }
+}
+
+void Blend(DstRows dst, SrcRows src, Size size) {
+    size = joinedRows(size, 4 * size.width, dst.step, 4 * size.width, src.step);
+    if (isStreamed(4 * size.width, size.height))
+        blendRows<true>(dst, src, size);
+    else
+        blendRows<false>(dst, src, size);
 }
 
 } // namespace
