@@ -2,6 +2,7 @@
 
 #include <array>
 #include <bit>
+#include <type_traits>
 
 #undef HWY_TARGET_INCLUDE
 #define HWY_TARGET_INCLUDE "raster/rasterBitsKernels.cpp"
@@ -115,7 +116,11 @@ HWY_ALIGN constexpr auto kBit = [] {
 
 // The widest vectors of which there is a whole number in so many pixels.
 template <size_t kBytes, size_t kPixels>
-using BlockTag = hn::CappedTag<uint8_t, kPixels *(kBytes == 3 ? 1 : kBytes)>;
+using BlockTag = std::conditional_t<kBytes == 4, hn::CappedTag<uint32_t, kPixels>,
+                                    hn::CappedTag<uint8_t, kPixels *(kBytes == 3 ? 1 : kBytes)>>;
+
+template <class D>
+constexpr size_t kVectorBytes = kLanes<D> * sizeof(hn::TFromD<D>);
 
 // Vector k of a colour: there are three that differ where pixels have 3 bytes.
 template <size_t kBytes, class D>
@@ -124,9 +129,10 @@ struct Colour {
     hn::Vec<D> vectors[kVectors];
 
     HWY_INLINE Colour(D d, uint32_t pixel) {
-        const BytePattern<kLanes<D>> pattern(pixel, kBytes);
+        const BytePattern<kVectorBytes<D>> pattern(pixel, kBytes);
         for (size_t k = 0; k < kVectors; ++k)
-            vectors[k] = hn::LoadU(d, pattern.from(k * kLanes<D>));
+            vectors[k] = hn::LoadU(
+                d, reinterpret_cast<const hn::TFromD<D> *>(pattern.from(k * kVectorBytes<D>)));
     }
     HWY_INLINE hn::Vec<D> operator[](size_t k) const { return vectors[k % kVectors]; }
 };
@@ -141,20 +147,41 @@ HWY_INLINE hn::Mask<D> setBytes(D d, uint64_t number, size_t k) {
     return hn::TestBit(spread, hn::Load(d, kBit<kBytes>.data() + at));
 }
 
+// Where words are pixels, half a number has the bits of 32 in each.
+HWY_ALIGN constexpr auto kWordBit = [] {
+    std::array<uint32_t, 32> bits = {};
+    for (size_t i = 0; i < bits.size(); ++i)
+        bits[i] = uint32_t{1} << (i ^ 7);
+    return bits;
+}();
+
+// Vector k's lanes whose bit is set.
+template <size_t kBytes, class D>
+HWY_INLINE hn::Mask<D> setLanes(D d, uint64_t number, size_t k) {
+    if constexpr (kBytes == 4) {
+        const size_t pixel = k * kLanes<D>;
+        const auto half = static_cast<uint32_t>(number >> pixel / 32 * 32);
+        return hn::TestBit(hn::Set(d, half), hn::Load(d, kWordBit.data() + pixel % 32));
+    } else {
+        return setBytes<kBytes>(d, number, k);
+    }
+}
+
 // ---- Opaque -------------------------------------------------------------
 
 template <size_t kBytes, size_t kPixels>
 struct Expansion {
     using D = BlockTag<kBytes, kPixels>;
+    static constexpr size_t kVector = kVectorBytes<D>;
 
     Colour<kBytes, D> background, change;
 
     template <class Store>
     HWY_INLINE void block(uint64_t number, uint8_t *dst) const {
         const D d;
-        for (size_t k = 0; k < kPixels * kBytes / kLanes<D>; ++k) {
-            const auto changed = hn::IfThenElseZero(setBytes<kBytes>(d, number, k), change[k]);
-            Store::store(d, hn::Xor(background[k], changed), dst + k * kLanes<D>);
+        for (size_t k = 0; k < kPixels * kBytes / kVector; ++k) {
+            const auto changed = hn::IfThenElseZero(setLanes<kBytes>(d, number, k), change[k]);
+            Store::store(d, hn::Xor(background[k], changed), dst + k * kVector);
         }
     }
 
@@ -184,7 +211,9 @@ void opaqueRows(DstRows dst, SrcRows bits, Size size, uint32 foreground, uint32 
     for (size_t y = 0; y < size.height; ++y) {
         uint8_t *row = dst.row(y);
         size_t head = kPixels;
-        if (kPixels == kBlock && size.width >= 2 * kBlock)
+        // On short rows what the first and the last block write twice costs more
+        // than lines that are crossed.
+        if (kPixels == kBlock && size.width * kBytes > 16 * E::kVector)
             head = pixelsToLine<kBytes>(row);
         if (streams && head != kBlock)
             expansion.template row<AroundCaches>(row, bits.row(y), size.width, head);
@@ -280,11 +309,14 @@ public:
         if (kBytes > 1 && number == 0)
             return;
         const D d;
-        for (size_t k = 0; k * kLanes<D> < pixels * kBytes; ++k) {
-            const auto set = setBytes<kBytes>(d, number, k);
-            uint8_t *to = dst + k * kLanes<D>;
+        for (size_t k = 0; k * kVectorBytes<D> < pixels * kBytes; ++k) {
+            const auto set = setLanes<kBytes>(d, number, k);
+            uint8_t *to = dst + k * kVectorBytes<D>;
 #if HWY_TARGET == HWY_AVX3
-            _mm512_mask_storeu_epi8(to, set.raw, colour_[k].raw);
+            if constexpr (kBytes == 4)
+                _mm512_mask_storeu_epi32(to, set.raw, colour_[k].raw);
+            else
+                _mm512_mask_storeu_epi8(to, set.raw, colour_[k].raw);
 #else
             _mm256_maskstore_epi32(reinterpret_cast<int *>(to), set.raw, colour_[k].raw);
 #endif
