@@ -1,11 +1,9 @@
-// The plain statements of the operations: one pixel at a time.
+// Plain loops over the pixels; for frames, the tests' own.
 #include "../operations/names.h"
 #include "../operations/operations.h"
 #include "peers.h"
+#include "plainLoops.h"
 
-#include "reference/bits.h"
-#include "reference/raster.h"
-#include "reference/rop.h"
 #include "reference/video.h"
 
 #include "raster.h"
@@ -23,16 +21,15 @@ void offer(Offers &offers, const std::string &operation, const Call &call) {
 void offerBitLoops(Offers &offers, int32 bytes) {
     const std::string depth = std::to_string(8 * bytes);
     offer(offers, "bits noise to " + depth, [=](const Job &, const Buffer &dst, const Buffer &src) {
-        reference::bitsToPixels(src.data, src.line(), dst.data, dst.line(), bytes,
-                                static_cast<int32>(dst.width), dst.height, kForeground,
-                                kBackground);
+        plain::bitsToPixels(src.data, src.line(), dst.data, dst.line(), bytes,
+                            static_cast<int32>(dst.width), dst.height, kForeground, kBackground);
     });
     for (const char *content : {"text", "noise", "sparse"}) {
         offer(offers, "stencil " + std::string(content) + " to " + depth,
               [=](const Job &, const Buffer &dst, const Buffer &src) {
-                  reference::bitsToPixelsStencil(src.data, src.line(), dst.data, dst.line(), bytes,
-                                                 static_cast<int32>(dst.width), dst.height,
-                                                 kForeground);
+                  plain::bitsToPixelsStencil(src.data, src.line(), dst.data, dst.line(), bytes,
+                                             static_cast<int32>(dst.width), dst.height,
+                                             kForeground);
               });
     }
 }
@@ -41,14 +38,14 @@ void offerRopLoops(Offers &offers, int32 bytes) {
     for (uint32 rop = 0; rop < 16; ++rop) {
         const std::string name = ropName(rop) + " " + std::to_string(8 * bytes);
         offer(offers, "raster fill " + name, [=](const Job &, const Buffer &dst, const Buffer &) {
-            reference::rectRopFill(dst.data, dst.line(), bytes, kPixel, rop, 0, 0, dst.width,
-                                   dst.height);
+            plain::rectRopFill(dst.data, dst.line(), bytes, kPixel, rop, 0, 0, dst.width,
+                               dst.height);
         });
         offer(offers, "raster copy " + name,
               [=](const Job &job, const Buffer &dst, const Buffer &src) {
                   const Buffer &from = job.sourceCount > 0 ? src : dst;
-                  reference::rectRopCopy(dst.data, dst.line(), from.data, from.line(), bytes, 0, 0,
-                                         rop, 0, 0, dst.width, dst.height);
+                  plain::rectRopCopy(dst.data, dst.line(), from.data, from.line(), bytes, 0, 0, rop,
+                                     0, 0, dst.width, dst.height);
               });
     }
 }
@@ -58,10 +55,10 @@ void offerConversionLoops(Offers &offers) {
         for (const int32 to : {3, 6, 8, 15, 16, 24, 32}) {
             offer(offers, conversionName(from, to),
                   [=](const Job &, const Buffer &dst, const Buffer &src) {
-                      reference::convertPixels(dst.data, static_cast<uint32>(dst.step), to,
-                                               src.data, static_cast<uint32>(src.step),
-                                               from == kIndex ? 8 : from, from == kIndex,
-                                               palette().data(), 0, 0, 0, 0, dst.width, dst.height);
+                      plain::convertPixels(dst.data, static_cast<uint32>(dst.step), to, src.data,
+                                           static_cast<uint32>(src.step), from == kIndex ? 8 : from,
+                                           from == kIndex, palette().data(), 0, 0, 0, 0, dst.width,
+                                           dst.height);
                   });
         }
     }
@@ -85,9 +82,9 @@ void offerVideoLoops(Offers &offers) {
         offer(offers, "key " + std::to_string(depth),
               [=](const Job &job, const Buffer &dst, const Buffer &back) {
                   const Buffer &over = job.sources[1], &keys = job.sources[2];
-                  reference::applyColorKey(back.data, dst.data, over.data, keys.data, back.line(),
-                                           dst.line(), over.line(), keys.line(), kPixel, 0, 0,
-                                           dst.width, dst.height, depth);
+                  plain::applyColorKey(back.data, dst.data, over.data, keys.data, back.line(),
+                                       dst.line(), over.line(), keys.line(), kPixel, 0, 0,
+                                       dst.width, dst.height, depth);
               });
     }
 }
@@ -98,23 +95,23 @@ void offerPlainLoops(Offers &offers) {
     for (const int32 bytes : {1, 2, 3, 4}) {
         const std::string depth = std::to_string(8 * bytes);
         offer(offers, "fill " + depth, [=](const Job &, const Buffer &dst, const Buffer &) {
-            reference::rectFill(dst.data, dst.line(), bytes, kPixel, 0, 0, dst.width, dst.height);
+            plain::rectFill(dst.data, dst.line(), bytes, kPixel, 0, 0, dst.width, dst.height);
         });
         offer(offers, "copy " + depth, [=](const Job &, const Buffer &dst, const Buffer &src) {
-            reference::rectCopy(dst.data, dst.line(), src.data, src.line(), bytes, 0, 0, 0, 0,
-                                dst.width, dst.height);
+            plain::rectCopy(dst.data, dst.line(), src.data, src.line(), bytes, 0, 0, 0, 0,
+                            dst.width, dst.height);
         });
         offerBitLoops(offers, bytes);
         offerRopLoops(offers, bytes);
     }
     offer(offers, "alpha fill", [](const Job &, const Buffer &dst, const Buffer &) {
-        reference::rectFillAlpha(dst.data, dst.line(), kAlpha, 0, 0, dst.width, dst.height);
+        plain::rectFillAlpha(dst.data, dst.line(), kAlpha, 0, 0, dst.width, dst.height);
     });
     for (const char *content : {"noise", "interface"}) {
         offer(offers, "blend " + std::string(content),
               [](const Job &, const Buffer &dst, const Buffer &src) {
-                  reference::alphaBlendOver(dst.data, 0, 0, dst.line(), src.data, 0, 0, src.line(),
-                                            dst.width, dst.height);
+                  plain::alphaBlendOver(dst.data, 0, 0, dst.line(), src.data, 0, 0, src.line(),
+                                        dst.width, dst.height);
               });
     }
     offerConversionLoops(offers);
