@@ -45,6 +45,21 @@ TEST(YuvToRgb, matchesReference) {
     });
 }
 
+// More than the caches nearest to a core hold, with rows that lie to cache lines
+// alike and with rows that do not.
+TEST(YuvToRgb, largeFramesMatchReference) {
+    forEachTarget([&] {
+        forEachCase(2, [&](Random &random) {
+            const uint32 width = running.number == 0 ? 1088 : 1030;
+            for (const int32 depth : kDepths) {
+                const uint32 rowBytes = width * (static_cast<uint32>(depth + 1) / 8);
+                for (const uint32 format : kFormats)
+                    expectConverted(random, width, 1600000 / rowBytes & ~1u, format, depth);
+            }
+        });
+    });
+}
+
 // Every luma with every pair of chroma, as runs of one chromaLow.
 TEST(YuvToRgb, everyTriple) {
     constexpr uint32 kSide = 256; // luma, chromaHigh

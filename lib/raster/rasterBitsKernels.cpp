@@ -2,6 +2,7 @@
 
 #include <array>
 #include <bit>
+#include <type_traits>
 
 #undef HWY_TARGET_INCLUDE
 #define HWY_TARGET_INCLUDE "raster/rasterBitsKernels.cpp"
@@ -10,142 +11,69 @@
 
 #include "raster/bytePattern-inl.h"
 #include "raster/kernels-inl.h"
-#include "raster/packed24-inl.h"
+#include "raster/streaming-inl.h"
 
 HWY_BEFORE_NAMESPACE();
 namespace quillon::HWY_NAMESPACE {
 namespace {
 
-// ---- Opaque -------------------------------------------------------------
+// ---- Bits ---------------------------------------------------------------
 
-// Per lane, one bit of a number: the leftmost pixel is the highest of count bits.
-template <class T, size_t kCount>
-constexpr std::array<T, kCount> laneBits(size_t bitsPerNumber) {
-    std::array<T, kCount> bits = {};
-    for (size_t lane = 0; lane < kCount; ++lane)
-        bits[lane] = static_cast<T>(uint64_t{1} << (bitsPerNumber - 1 - lane % bitsPerNumber));
-    return bits;
+// The bits of a block of up to 64 pixels are a number as it stands in memory: its
+// lowest byte has the leftmost pixels, in each byte the highest bit is leftmost.
+constexpr size_t kBlock = 64;
+
+// The other way round: the highest bit of all is the leftmost pixel.
+HWY_INLINE uint64_t leftmostHighest(uint64_t number) {
+    return __builtin_bswap64(number);
 }
 
-// Per byte of a vector, which byte of eight holds its lane's bit; in the upper
-// bytes of a lane none does.
-template <class T, size_t kCount>
-constexpr std::array<uint8_t, kCount * sizeof(T)> laneSources() {
-    std::array<uint8_t, kCount * sizeof(T)> sources = {};
-    for (size_t i = 0; i < sources.size(); ++i)
-        sources[i] = i % sizeof(T) == 0 ? static_cast<uint8_t>(i / sizeof(T) / 8) : 0x80;
-    return sources;
+// A row of 1 to 8 bytes, some of them read twice.
+HWY_INLINE uint64_t fewBytes(const uint8_t *bits, size_t bytes) {
+    const size_t middle = bytes / 2, last = bytes - 1;
+    if (bytes < 4)
+        return bits[0] | uint64_t{bits[middle]} << 8 * middle | uint64_t{bits[last]} << 8 * last;
+    uint32_t first4 = 0, last4 = 0;
+    hwy::CopyBytes<4>(bits, &first4);
+    hwy::CopyBytes<4>(bits + bytes - 4, &last4);
+    return first4 | uint64_t{last4} << 8 * (bytes - 4);
 }
 
-// The lanes whose bit is set, for the pixels from i on.  i is a multiple of the
-// number of lanes, so that no byte is read for less than a whole share of it.
-template <class D>
-HWY_INLINE hn::Mask<D> setBits(D d, const uint8_t *bits, size_t i) {
-    using T = hn::TFromD<D>;
-    constexpr size_t n = kLanes<D>;
-    if constexpr (n < 8) {
-        const uint32_t shifted = uint32_t{bits[i / 8]} << (i % 8) & 0xFF;
-        HWY_ALIGN static constexpr auto kBit = laneBits<T, n>(8);
-        return hn::TestBit(hn::Set(d, static_cast<T>(shifted)), hn::Load(d, kBit.data()));
-    } else if constexpr (n <= 8 * sizeof(T)) {
+// The bits of a row, from a byte on.
+struct WholeBytes {
+    const uint8_t *first;
+
+    // Of the pixels from i on, a multiple of 8.
+    template <size_t kPixels>
+    HWY_INLINE uint64_t block(size_t i) const {
         uint64_t number = 0;
-        for (size_t byte = 0; byte < n / 8; ++byte)
-            number = number << 8 | bits[i / 8 + byte];
-        HWY_ALIGN static constexpr auto kBit = laneBits<T, n>(n);
-        return hn::TestBit(hn::Set(d, static_cast<T>(number)), hn::Load(d, kBit.data()));
-    } else {
-        const hn::Repartition<uint64_t, D> d64;
-        const hn::Repartition<uint8_t, D> d8;
-        uint64_t eight = 0;
-        hwy::CopyBytes<n / 8>(bits + i / 8, &eight);
-        HWY_ALIGN static constexpr auto kSource = laneSources<T, n>();
-        HWY_ALIGN static constexpr auto kBit = laneBits<T, n>(8);
-        const auto spread = hn::TableLookupBytesOr0(hn::BitCast(d8, hn::Set(d64, eight)),
-                                                    hn::Load(d8, kSource.data()));
-        return hn::TestBit(hn::BitCast(d, spread), hn::Load(d, kBit.data()));
-    }
-}
-
-template <class T>
-struct OpaqueBody {
-    static constexpr size_t kBytes = sizeof(T);
-    using Lane = T;
-
-    uint8_t *dst;
-    const uint8_t *bits;
-    uint32_t foreground;
-    uint32_t background;
-
-    template <class D>
-    HWY_INLINE void operator()(D d, size_t i) const {
-        const auto v = hn::IfThenElse(setBits(d, bits, i), hn::Set(d, static_cast<T>(foreground)),
-                                      hn::Set(d, static_cast<T>(background)));
-        hn::StoreU(v, d, reinterpret_cast<T *>(dst) + i);
+        hwy::CopyBytes<kPixels / 8>(first + i / 8, &number);
+        return number;
     }
 };
 
-struct OpaqueBody24 {
-    static constexpr size_t kBytes = 3;
-    using Lane = uint32_t;
+// The bits of a row from within a byte on.
+struct ShiftedBytes {
+    WholeBytes bytes;
+    size_t shift; // 1 to 7
 
-    uint8_t *dst;
-    const uint8_t *bits;
-    uint32_t foreground;
-    uint32_t background;
-
-    template <class D>
-    HWY_INLINE void operator()(D d, size_t i) const {
-        const auto v =
-            hn::IfThenElse(setBits(d, bits, i), hn::Set(d, foreground), hn::Set(d, background));
-        store24(d, v, dst + 3 * i);
+    template <size_t kPixels>
+    HWY_INLINE uint64_t block(size_t i) const {
+        const uint64_t next = bytes.first[(i + kPixels) / 8];
+        const uint64_t number = leftmostHighest(bytes.block<kPixels>(i)) << shift |
+                                next >> (8 - shift) << (kBlock - kPixels);
+        return leftmostHighest(number);
     }
 };
 
-// Rows of whole bytes that lie end to end are one long row.
-Size joinedBitRows(Size size, size_t bytesPerPixel, ptrdiff_t dstStep, ptrdiff_t bitsStep) {
-    if (size.width % 8 != 0)
-        return size;
-    return joinedRows(size, size.width * bytesPerPixel, dstStep, size.width / 8, bitsStep);
-}
-
-template <class Body>
-void opaqueRows(DstRows dst, SrcRows bits, Size size, uint32 foreground, uint32 background) {
-    size = joinedBitRows(size, Body::kBytes, dst.step, bits.step);
-    for (size_t y = 0; y < size.height; ++y)
-        walkOnce<typename Body::Lane>(size.width,
-                                      Body{dst.row(y), bits.row(y), foreground, background});
-}
-
-void BitsToPixels(DstRows dst, SrcRows bits, Size size, int32 bytesPerPixel, uint32 foreground,
-                  uint32 background) {
-    switch (bytesPerPixel) {
-    case 1:
-        return opaqueRows<OpaqueBody<uint8_t>>(dst, bits, size, foreground, background);
-    case 2:
-        return opaqueRows<OpaqueBody<uint16_t>>(dst, bits, size, foreground, background);
-    case 3:
-        return opaqueRows<OpaqueBody24>(dst, bits, size, foreground, background);
-    default:
-        return opaqueRows<OpaqueBody<uint32_t>>(dst, bits, size, foreground, background);
-    }
-}
-
-// ---- Stencil ------------------------------------------------------------
-
-// Up to 64 bits of a row from byte-aligned pixel i on, the leftmost in bit 0.
-HWY_INLINE uint64_t stencilBits(const uint8_t *bits, size_t i, size_t count) {
-    uint64_t eight = 0;
-    const size_t rest = HWY_MIN(count - i, size_t{64});
-    if (rest > 56)
-        hwy::CopyBytes<8>(bits + i / 8, &eight);
+// What reads the bits from pixel i on.
+template <class Use>
+HWY_INLINE void withBits(const uint8_t *bits, size_t i, const Use &use) {
+    const WholeBytes bytes = {bits + i / 8};
+    if (i % 8 == 0)
+        use(bytes);
     else
-        for (size_t byte = 0; byte < (rest + 7) / 8; ++byte)
-            eight |= uint64_t{bits[i / 8 + byte]} << (8 * byte);
-    // Reverse the bits of each byte.
-    eight = (eight >> 4 & 0x0F0F0F0F0F0F0F0F) | (eight & 0x0F0F0F0F0F0F0F0F) << 4;
-    eight = (eight >> 2 & 0x3333333333333333) | (eight & 0x3333333333333333) << 2;
-    eight = (eight >> 1 & 0x5555555555555555) | (eight & 0x5555555555555555) << 1;
-    return eight & (~uint64_t{0} >> (64 - rest));
+        use(ShiftedBytes{bytes, i % 8});
 }
 
 template <size_t kBytes>
@@ -158,63 +86,302 @@ HWY_INLINE void storePixel(uint8_t *dst, uint32_t pixel) {
     }
 }
 
-#if HWY_TARGET == HWY_AVX3
+// Rows of whole bytes that lie end to end are one long row.
+Size joinedBitRows(Size size, size_t bytesPerPixel, ptrdiff_t dstStep, ptrdiff_t bitsStep) {
+    if (size.width % 8 != 0)
+        return size;
+    return joinedRows(size, size.width * bytesPerPixel, dstStep, size.width / 8, bitsStep);
+}
 
-// Only AVX-512 has stores that leave bytes alone at every pixel size.
+#if HWY_TARGET != HWY_SCALAR
+
+// ---- Blocks -------------------------------------------------------------
+
+// The pixels of a block are vectors of bytes, whatever their size.  For each byte
+// of them: which byte of the number has its bit, and which bit that is.
 template <size_t kBytes>
-HWY_INLINE void stencil64(uint8_t *dst, uint64_t set, const BytePattern<64> &pattern) {
-    const __m512i v = _mm512_loadu_si512(pattern.bytes);
-    if constexpr (kBytes == 1) {
-        _mm512_mask_storeu_epi8(dst, set, v);
-    } else if constexpr (kBytes == 2) {
-        for (; set != 0; set >>= 32, dst += 64)
-            _mm512_mask_storeu_epi16(dst, static_cast<__mmask32>(set), v);
-    } else if constexpr (kBytes == 3) {
-        for (; set != 0; set >>= 16, dst += 48)
-            _mm512_mask_storeu_epi8(dst, 7 * _pdep_u64(set, 0x249249249249), v);
+HWY_ALIGN constexpr auto kSource = [] {
+    std::array<uint8_t, kBlock *kBytes> sources = {};
+    for (size_t i = 0; i < sources.size(); ++i)
+        sources[i] = static_cast<uint8_t>(i / kBytes / 8);
+    return sources;
+}();
+template <size_t kBytes>
+HWY_ALIGN constexpr auto kBit = [] {
+    std::array<uint8_t, kBlock *kBytes> bits = {};
+    for (size_t i = 0; i < bits.size(); ++i)
+        bits[i] = static_cast<uint8_t>(0x80 >> i / kBytes % 8);
+    return bits;
+}();
+
+// The widest vectors of which there is a whole number in so many pixels.
+template <size_t kBytes, size_t kPixels>
+using BlockTag = std::conditional_t<kBytes == 4, hn::CappedTag<uint32_t, kPixels>,
+                                    hn::CappedTag<uint8_t, kPixels *(kBytes == 3 ? 1 : kBytes)>>;
+
+template <class D>
+constexpr size_t kVectorBytes = kLanes<D> * sizeof(hn::TFromD<D>);
+
+// Vector k of a colour: there are three that differ where pixels have 3 bytes.
+template <size_t kBytes, class D>
+struct Colour {
+    static constexpr size_t kVectors = kBytes == 3 ? 3 : 1;
+    hn::Vec<D> vectors[kVectors];
+
+    HWY_INLINE Colour(D d, uint32_t pixel) {
+        const BytePattern<kVectorBytes<D>> pattern(pixel, kBytes);
+        for (size_t k = 0; k < kVectors; ++k)
+            vectors[k] = hn::LoadU(
+                d, reinterpret_cast<const hn::TFromD<D> *>(pattern.from(k * kVectorBytes<D>)));
+    }
+    HWY_INLINE hn::Vec<D> operator[](size_t k) const { return vectors[k % kVectors]; }
+};
+
+// Vector k's bytes whose bit is set.
+template <size_t kBytes, class D>
+HWY_INLINE hn::Mask<D> setBytes(D d, uint64_t number, size_t k) {
+    const hn::Repartition<uint64_t, D> d64;
+    const size_t at = k * kLanes<D>;
+    const auto spread = hn::TableLookupBytes(hn::BitCast(d, hn::Set(d64, number)),
+                                             hn::Load(d, kSource<kBytes>.data() + at));
+    return hn::TestBit(spread, hn::Load(d, kBit<kBytes>.data() + at));
+}
+
+// Where words are pixels, half a number has the bits of 32 in each.
+HWY_ALIGN constexpr auto kWordBit = [] {
+    std::array<uint32_t, 32> bits = {};
+    for (size_t i = 0; i < bits.size(); ++i)
+        bits[i] = uint32_t{1} << (i ^ 7);
+    return bits;
+}();
+
+// Vector k's lanes whose bit is set.
+template <size_t kBytes, class D>
+HWY_INLINE hn::Mask<D> setLanes(D d, uint64_t number, size_t k) {
+    if constexpr (kBytes == 4) {
+        const size_t pixel = k * kLanes<D>;
+        const auto half = static_cast<uint32_t>(number >> pixel / 32 * 32);
+        return hn::TestBit(hn::Set(d, half), hn::Load(d, kWordBit.data() + pixel % 32));
     } else {
-        for (; set != 0; set >>= 16, dst += 64)
-            _mm512_mask_storeu_epi32(dst, static_cast<__mmask16>(set), v);
+        return setBytes<kBytes>(d, number, k);
     }
 }
 
-template <size_t kBytes>
-void stencil(DstRows dst, SrcRows bits, Size size, uint32 pixel) {
-    const BytePattern<64> pattern(pixel, kBytes);
-    for (size_t y = 0; y < size.height; ++y) {
-        for (size_t i = 0; i < size.width; i += 64)
-            stencil64<kBytes>(dst.row(y) + i * kBytes, stencilBits(bits.row(y), i, size.width),
-                              pattern);
+// ---- Opaque -------------------------------------------------------------
+
+template <size_t kBytes, size_t kPixels>
+struct Expansion {
+    using D = BlockTag<kBytes, kPixels>;
+    static constexpr size_t kVector = kVectorBytes<D>;
+
+    Colour<kBytes, D> background, change;
+
+    template <class Store>
+    HWY_INLINE void block(uint64_t number, uint8_t *dst) const {
+        const D d;
+        for (size_t k = 0; k < kPixels * kBytes / kVector; ++k) {
+            const auto changed = hn::IfThenElseZero(setLanes<kBytes>(d, number, k), change[k]);
+            Store::store(d, hn::Xor(background[k], changed), dst + k * kVector);
+        }
     }
+
+    // At least kPixels of them.  The first block and the last one may overlap
+    // those between, which begin at head.
+    template <class Store>
+    HWY_INLINE void row(uint8_t *dst, const uint8_t *bits, size_t count, size_t head) const {
+        block<ThroughCaches>(WholeBytes{bits}.block<kPixels>(0), dst);
+        const size_t last = count - kPixels;
+        withBits(bits, head, [&](const auto &from) HWY_ATTR {
+            for (size_t i = head; i <= last; i += kPixels)
+                block<Store>(from.template block<kPixels>(i - head), dst + i * kBytes);
+        });
+        if ((count - head) % kPixels != 0)
+            withBits(bits, last, [&](const auto &from) HWY_ATTR {
+                block<ThroughCaches>(from.template block<kPixels>(0), dst + last * kBytes);
+            });
+    }
+};
+
+template <size_t kBytes, size_t kPixels>
+void opaqueRows(DstRows dst, SrcRows bits, Size size, uint32 foreground, uint32 background) {
+    using E = Expansion<kBytes, kPixels>;
+    const typename E::D d;
+    const E expansion = {{d, background}, {d, foreground ^ background}};
+    const bool streams = isStreamed(size.width * kBytes, size.height);
+    for (size_t y = 0; y < size.height; ++y) {
+        uint8_t *row = dst.row(y);
+        size_t head = kPixels;
+        // On short rows what the first and the last block write twice costs more
+        // than lines that are crossed.
+        if (kPixels == kBlock && size.width * kBytes > 16 * E::kVector)
+            head = pixelsToLine<kBytes>(row);
+        if (streams && head != kBlock)
+            expansion.template row<AroundCaches>(row, bits.row(y), size.width, head);
+        else
+            expansion.template row<ThroughCaches>(row, bits.row(y), size.width, head);
+    }
+    if (streams)
+        hwy::FlushStream();
+}
+
+// Rows shorter than the smallest block.
+template <size_t kBytes>
+void fewPixels(DstRows dst, SrcRows bits, Size size, uint32 foreground, uint32 background) {
+    for (size_t y = 0; y < size.height; ++y)
+        for (size_t i = 0; i < size.width; ++i)
+            storePixel<kBytes>(dst.row(y) + i * kBytes,
+                               bits.row(y)[0] << i & 0x80 ? foreground : background);
+}
+
+template <size_t kBytes>
+void opaque(DstRows dst, SrcRows bits, Size size, uint32 foreground, uint32 background) {
+    size = joinedBitRows(size, kBytes, dst.step, bits.step);
+    if (size.width >= 64)
+        opaqueRows<kBytes, 64>(dst, bits, size, foreground, background);
+    else if (size.width >= 32)
+        opaqueRows<kBytes, 32>(dst, bits, size, foreground, background);
+    else if (size.width >= 16)
+        opaqueRows<kBytes, 16>(dst, bits, size, foreground, background);
+    else if (size.width >= 8)
+        opaqueRows<kBytes, 8>(dst, bits, size, foreground, background);
+    else
+        fewPixels<kBytes>(dst, bits, size, foreground, background);
 }
 
 #else
 
 template <size_t kBytes>
-void stencil(DstRows dst, SrcRows bits, Size size, uint32 pixel) {
-    for (size_t y = 0; y < size.height; ++y) {
-        for (size_t i = 0; i < size.width; i += 64) {
-            uint8_t *at = dst.row(y) + i * kBytes;
-            uint64_t set = stencilBits(bits.row(y), i, size.width);
-            for (; set != 0; set &= set - 1)
-                storePixel<kBytes>(at + static_cast<size_t>(std::countr_zero(set)) * kBytes, pixel);
-        }
-    }
+void opaque(DstRows dst, SrcRows bits, Size size, uint32 foreground, uint32 background) {
+    for (size_t y = 0; y < size.height; ++y)
+        for (size_t i = 0; i < size.width; ++i)
+            storePixel<kBytes>(dst.row(y) + i * kBytes,
+                               bits.row(y)[i / 8] << i % 8 & 0x80 ? foreground : background);
 }
 
 #endif
 
-void Stencil(DstRows dst, SrcRows bits, Size size, int32 bytesPerPixel, uint32 pixel) {
-    size = joinedBitRows(size, static_cast<size_t>(bytesPerPixel), dst.step, bits.step);
+void BitsToPixels(DstRows dst, SrcRows bits, Size size, int32 bytesPerPixel, uint32 foreground,
+                  uint32 background) {
     switch (bytesPerPixel) {
     case 1:
-        return stencil<1>(dst, bits, size, pixel);
+        return opaque<1>(dst, bits, size, foreground, background);
     case 2:
-        return stencil<2>(dst, bits, size, pixel);
+        return opaque<2>(dst, bits, size, foreground, background);
     case 3:
-        return stencil<3>(dst, bits, size, pixel);
+        return opaque<3>(dst, bits, size, foreground, background);
     default:
-        return stencil<4>(dst, bits, size, pixel);
+        return opaque<4>(dst, bits, size, foreground, background);
+    }
+}
+
+// ---- Stencil ------------------------------------------------------------
+
+// Stores that leave bytes alone: AVX-512 has them for any, AVX2 for words.
+template <size_t kBytes>
+constexpr bool kMasked = HWY_TARGET == HWY_AVX3 || (HWY_TARGET == HWY_AVX2 && kBytes == 4);
+
+template <size_t kBytes>
+class Stencil {
+public:
+    explicit Stencil(uint32_t pixel) : pixel_(pixel) {}
+
+    // Of a row that ends no sooner than after so many pixels.
+    HWY_INLINE void block(uint64_t number, uint8_t *dst, size_t /*pixels*/ = kBlock) const {
+        for (; number != 0; number &= number - 1)
+            storePixel<kBytes>(dst + static_cast<size_t>(std::countr_zero(number) ^ 7) * kBytes,
+                               pixel_);
+    }
+
+private:
+    uint32_t pixel_;
+};
+
+#if HWY_TARGET == HWY_AVX3 || HWY_TARGET == HWY_AVX2
+
+template <size_t kBytes>
+requires kMasked<kBytes>
+class Stencil<kBytes> {
+public:
+    explicit Stencil(uint32_t pixel) : colour_(D(), pixel) {}
+
+    HWY_INLINE void block(uint64_t number, uint8_t *dst, size_t pixels = kBlock) const {
+        // One store takes no longer than it does to find that it is not needed.
+        if (kBytes > 1 && number == 0)
+            return;
+        const D d;
+        for (size_t k = 0; k * kVectorBytes<D> < pixels * kBytes; ++k) {
+            const auto set = setLanes<kBytes>(d, number, k);
+            uint8_t *to = dst + k * kVectorBytes<D>;
+#if HWY_TARGET == HWY_AVX3
+            if constexpr (kBytes == 4)
+                _mm512_mask_storeu_epi32(to, set.raw, colour_[k].raw);
+            else
+                _mm512_mask_storeu_epi8(to, set.raw, colour_[k].raw);
+#else
+            _mm256_maskstore_epi32(reinterpret_cast<int *>(to), set.raw, colour_[k].raw);
+#endif
+        }
+    }
+
+private:
+    using D = BlockTag<kBytes, kBlock>;
+    Colour<kBytes, D> colour_;
+};
+
+#endif
+
+// With masked stores the blocks between the first and the last begin with a cache
+// line where a pixel does.
+template <size_t kBytes>
+HWY_INLINE void stencilRow(const Stencil<kBytes> &stencil, uint8_t *dst, const uint8_t *bits,
+                           size_t count, bool isLarge) {
+    // The leftmost pixels of a block, all of them but so many.
+    const auto without = [](size_t rest) { return leftmostHighest(~uint64_t{0} << rest); };
+    if (count < kBlock)
+        return stencil.block(fewBytes(bits, (count + 7) / 8) & without(kBlock - count), dst, count);
+    const size_t head = kMasked<kBytes> ? pixelsToLine<kBytes>(dst) % kBlock : 0;
+    if (head != 0)
+        stencil.block(WholeBytes{bits}.block<kBlock>(0) & without(kBlock - head), dst);
+    const size_t last = count - kBlock;
+    // Stores that leave bytes alone wait for the lines that hold them.
+    constexpr size_t kAhead = 2048 / kBytes;
+    const size_t fetched = isLarge && last > kAhead ? last - kAhead : 0;
+    withBits(bits, head, [&](const auto &from) HWY_ATTR {
+        for (size_t i = head; i <= last; i += kBlock) {
+            if (i < fetched)
+                for (size_t line = 0; line < kBytes; ++line)
+                    hwy::Prefetch(dst + (i + kAhead) * kBytes + 64 * line);
+            stencil.block(from.template block<kBlock>(i - head), dst + i * kBytes);
+        }
+    });
+    // Pixels of the last block that the one before had: all but the rightmost.
+    const size_t had = (kBlock - (count - head) % kBlock) % kBlock;
+    if (had != 0)
+        withBits(bits, last, [&](const auto &from) HWY_ATTR {
+            stencil.block(from.template block<kBlock>(0) & ~without(kBlock - had),
+                          dst + last * kBytes);
+        });
+}
+
+template <size_t kBytes>
+void stencilRows(DstRows dst, SrcRows bits, Size size, uint32 pixel) {
+    const Stencil<kBytes> stencil(pixel);
+    size = joinedBitRows(size, kBytes, dst.step, bits.step);
+    const bool isLarge = size.width * kBytes * size.height >= kStreamedBytes;
+    for (size_t y = 0; y < size.height; ++y)
+        stencilRow(stencil, dst.row(y), bits.row(y), size.width, isLarge);
+}
+
+void StencilRows(DstRows dst, SrcRows bits, Size size, int32 bytesPerPixel, uint32 pixel) {
+    switch (bytesPerPixel) {
+    case 1:
+        return stencilRows<1>(dst, bits, size, pixel);
+    case 2:
+        return stencilRows<2>(dst, bits, size, pixel);
+    case 3:
+        return stencilRows<3>(dst, bits, size, pixel);
+    default:
+        return stencilRows<4>(dst, bits, size, pixel);
     }
 }
 
@@ -226,7 +393,7 @@ HWY_AFTER_NAMESPACE();
 namespace quillon {
 
 HWY_EXPORT(BitsToPixels);
-HWY_EXPORT(Stencil);
+HWY_EXPORT(StencilRows);
 
 void bitsToPixelRows(DstRows dst, SrcRows bits, Size size, int32 bytesPerPixel, uint32 foreground,
                      uint32 background) {
@@ -234,7 +401,7 @@ void bitsToPixelRows(DstRows dst, SrcRows bits, Size size, int32 bytesPerPixel, 
 }
 
 void stencilRows(DstRows dst, SrcRows bits, Size size, int32 bytesPerPixel, uint32 pixel) {
-    HWY_DYNAMIC_DISPATCH(Stencil)(dst, bits, size, bytesPerPixel, pixel);
+    HWY_DYNAMIC_DISPATCH(StencilRows)(dst, bits, size, bytesPerPixel, pixel);
 }
 
 } // namespace quillon

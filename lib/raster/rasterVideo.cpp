@@ -5,6 +5,7 @@
 #include "core/latch.h"
 #include "core/surface.h"
 #include "hearth.h"
+#include "raster/rasterKeyKernels.h"
 #include "raster/rasterVideoKernels.h"
 #include "raster/videoAttributes.h"
 

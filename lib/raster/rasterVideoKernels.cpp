@@ -6,10 +6,11 @@
 #include "hwy/highway.h"
 
 #include "raster/kernels-inl.h"
-#include "raster/packed24-inl.h"
+#include "raster/streaming-inl.h"
+#include "raster/videoPixels-inl.h"
 
-#include <algorithm>
 #include <array>
+#include <cstring>
 
 HWY_BEFORE_NAMESPACE();
 namespace quillon::HWY_NAMESPACE {
@@ -23,210 +24,6 @@ struct Group {
 constexpr Group kYuy2 = {0, 1, 3};
 constexpr Group kUyvy = {1, 0, 2};
 
-#if HWY_TARGET == HWY_SCALAR
-
-// ---- A pair of pixels ---------------------------------------------------
-
-// Vectors of one lane have no room for a pair of pixels, so there are none here.
-
-constexpr uint32_t clamped(int32_t value) {
-    return static_cast<uint32_t>(std::min(std::max(value, 0), 255));
-}
-
-template <RasterVideoPixelLayout kLayout>
-HWY_INLINE void convertPair(uint8_t luma0, uint8_t luma1, uint8_t chromaLow, uint8_t chromaHigh,
-                            uint8_t *dst) {
-    const int32_t a = chromaLow - 128, b = chromaHigh - 128;
-    for (const uint8_t luma : {luma0, luma1}) {
-        const int32_t t = (luma - 16) * 298 + 128;
-        const uint32_t low = clamped((t + 409 * a) >> 8);
-        const uint32_t mid = clamped((t - 208 * a - 100 * b) >> 8);
-        const uint32_t high = clamped((t + 516 * b) >> 8);
-        const uint32_t top =
-            high >> kLayout.fieldShift << kLayout.midBits | mid >> kLayout.midShift;
-        const uint32_t pixel = (top << kLayout.lowBits | low >> kLayout.fieldShift)
-                               << kLayout.finalShift;
-        hwy::CopyBytes<kLayout.bytesPerPixel>(&pixel, dst);
-        dst += kLayout.bytesPerPixel;
-    }
-}
-
-#else
-
-// ---- Colours ------------------------------------------------------------
-
-// With c = luma - 16, a = chromaLow - 128, b = chromaHigh - 128 the fields are
-//
-//     low  = (298 c + 409 a + 128) >> 8           = (149 c + 64 + ((-103 a) >> 1) + 256 a) >> 7
-//     mid  = (298 c - 208 a - 100 b + 128) >> 8   = (149 c + 64 + (-104 a - 50 b)) >> 7
-//     high = (298 c + 516 b + 128) >> 8           = (149 c + 64 + 2 b + 256 b) >> 7
-//
-// exactly: all terms but 409 a are even, and an odd bit alone never carries.
-//
-// Fields of 0 to 255 come from sums (on the right, ahead of the shift) of 0 to
-// 32767, which is half of what 16 bits hold.  Less 16384, these are the middle
-// half: a saturating addition at the end of the sum keeps it in 16 bits, another
-// one that doubles it holds it to this half.  The upper byte is then the field,
-// less 128.
-//
-// No addition but the last one of a sum saturates, because what comes before
-// fits: 149 c + 64 - 16384 is -18704 to 19291, to which -6541 to 6592 is added
-// for low and -256 to 254 for high; -104 a - 50 b is -19558 to 19712.
-constexpr int kLumaFactor = 149;
-constexpr int kLumaRest = 64 - kLumaFactor * 16 - 16384;
-
-// Samples come in the upper byte of their lanes, and factors too: the upper half
-// of such a product is the product itself.
-constexpr uint16_t upper(int value) {
-    return static_cast<uint16_t>(value * 256);
-}
-
-// What a pair of chroma samples has to do with its pixels.
-template <class V>
-struct ChromaTerms {
-    V low, a256, mid, high, b256;
-};
-
-// Samples less 128.
-template <class D>
-HWY_INLINE ChromaTerms<hn::Vec<D>> chromaTerms(D d, hn::Vec<D> a256, hn::Vec<D> b256) {
-    const auto times = [d](hn::Vec<D> v, int16_t factor256)
-                           HWY_ATTR { return hn::MulHigh(v, hn::Set(d, factor256)); };
-    return {times(a256, -103 * 256 / 2), a256,
-            hn::Add(times(a256, -104 * 256), times(b256, -50 * 256)), hn::ShiftRight<7>(b256),
-            b256};
-}
-
-// Fields of pixels, in the upper byte of their lanes, less 128; the lower bytes
-// are of no meaning.
-template <class V>
-struct Fields {
-    V low, mid, high;
-};
-
-template <class D, class DU = hn::RebindToUnsigned<D>>
-HWY_INLINE Fields<hn::Vec<DU>> fieldsOf(D d, hn::Vec<DU> luma,
-                                        const ChromaTerms<hn::Vec<D>> &chroma) {
-    const DU du;
-    const auto product = hn::MulHigh(luma, hn::Set(du, upper(kLumaFactor)));
-    const auto base =
-        hn::BitCast(d, hn::Add(product, hn::Set(du, static_cast<uint16_t>(kLumaRest))));
-    const auto field = [&](hn::Vec<D> sum, hn::Vec<D> last) HWY_ATTR {
-        const auto held = hn::SaturatedAdd(sum, last);
-        return hn::BitCast(du, hn::SaturatedAdd(held, held));
-    };
-    return {field(hn::Add(base, chroma.low), chroma.a256), field(base, chroma.mid),
-            field(hn::Add(base, chroma.high), chroma.b256)};
-}
-
-// ---- Destinations -------------------------------------------------------
-
-// The top kBits of fields, moved to begin at bit kAt.
-template <int kBits, int kAt, class D>
-HWY_INLINE hn::Vec<D> placed(D d, hn::Vec<D> field) {
-    constexpr int kDistance = 16 - kBits - kAt;
-    if constexpr (kDistance > 0)
-        field = hn::ShiftRight<kDistance>(field);
-    if constexpr (kAt > 0)
-        field = hn::And(field, hn::Set(d, static_cast<uint16_t>(((1 << kBits) - 1) << kAt)));
-    return field;
-}
-
-// To take 128 off a byte turns its top bit over.  This turns it back, given
-// where the bit stands now.
-template <class D>
-HWY_INLINE hn::Vec<D> turned(D d, hn::Vec<D> v, int topBits) {
-    return hn::Xor(v, hn::Set(d, static_cast<uint16_t>(topBits)));
-}
-
-template <RasterVideoPixelLayout kLayout, class D>
-HWY_INLINE void storeNarrow(D d, const Fields<hn::Vec<D>> &fields, uint8_t *dst) {
-    constexpr int kLowAt = kLayout.finalShift;
-    constexpr int kMidAt = kLowAt + kLayout.lowBits;
-    constexpr int kHighAt = kMidAt + kLayout.midBits;
-    static_assert(kLayout.lowBits == 8 - kLayout.fieldShift);
-    static_assert(kLayout.midBits == 8 - kLayout.midShift);
-    static_assert(kHighAt + kLayout.lowBits == 16);
-    const auto low = placed<kLayout.lowBits, kLowAt>(d, fields.low);
-    const auto mid = placed<kLayout.midBits, kMidAt>(d, fields.mid);
-    const auto high = placed<kLayout.lowBits, kHighAt>(d, fields.high);
-    const auto pixels =
-        turned(d, hn::Or(low, hn::Or(mid, high)), 1 << 15 | 1 << (kHighAt - 1) | 1 << (kMidAt - 1));
-    hn::StoreU(pixels, d, reinterpret_cast<uint16_t *>(dst));
-}
-
-template <size_t kBytes, class D>
-HWY_INLINE void storeWords(D d, hn::Vec<D> words, uint8_t *dst) {
-    if constexpr (kBytes == 3)
-        store24(d, words, dst);
-    else
-        hn::StoreU(words, d, reinterpret_cast<uint32_t *>(dst));
-}
-
-// Whole bytes a field.  d counts the pixels; wider pixels come in two vectors.
-template <size_t kBytes, class D>
-HWY_INLINE void storeWide(D d, const Fields<hn::Vec<D>> &fields, uint8_t *dst) {
-    const auto lowMid =
-        turned(d, hn::Or(placed<8, 0>(d, fields.low), placed<8, 8>(d, fields.mid)), 0x8080);
-    const auto high = turned(d, placed<8, 0>(d, fields.high), 0x80);
-    const hn::Repartition<uint32_t, D> d32;
-    const auto first = hn::InterleaveLower(d, lowMid, high);
-    const auto second = hn::InterleaveUpper(d, lowMid, high);
-    storeWords<kBytes>(d32, hn::BitCast(d32, first), dst);
-    storeWords<kBytes>(d32, hn::BitCast(d32, second), dst + kBytes * kLanes<decltype(d32)>);
-}
-
-template <RasterVideoPixelLayout kLayout, class D>
-HWY_INLINE void storePixels(D d, const Fields<hn::Vec<D>> &fields, uint8_t *dst) {
-    if constexpr (kLayout.bytesPerPixel == 2)
-        storeNarrow<kLayout>(d, fields, dst);
-    else
-        storeWide<kLayout.bytesPerPixel>(d, fields, dst);
-}
-
-// ---- Sources ------------------------------------------------------------
-
-// Interleaving works within blocks of 16 bytes.  So that it gives pixels in
-// their order, the pairs of words that are to be interleaved with each other's
-// neighbours are first put into one block: the first half of the vector into the
-// lower halves of the blocks, the second half into the upper ones.
-template <size_t kWords>
-HWY_ALIGN [[maybe_unused]] constexpr auto kBlockOrder = [] {
-    std::array<uint32_t, kWords> order{};
-    for (uint32_t i = 0; i < kWords; ++i) {
-        const uint32_t pair = i / 2;
-        order[i] = 2 * (pair / 2 + pair % 2 * (kWords / 4)) + i % 2;
-    }
-    return order;
-}();
-
-// Pixels in 32-bit lanes of two, in the order that storePixels has to get them.
-template <RasterVideoPixelLayout kLayout, class D>
-HWY_INLINE hn::Vec<D> inStoreOrder(D d, hn::Vec<D> pairs) {
-    constexpr size_t n = kLanes<D>;
-    if constexpr (kLayout.bytesPerPixel > 2 && n > 4)
-        return hn::TableLookupLanes(pairs, hn::SetTableIndices(d, kBlockOrder<n>.data()));
-    else
-        return pairs;
-}
-
-// Byte kAt of each word, to the upper byte of both pixels of the word.
-template <uint8_t kAt>
-HWY_ALIGN constexpr uint8_t kToBothPixels[16] = {0x80, kAt,      0x80, kAt,     0x80, kAt + 4,
-                                                 0x80, kAt + 4,  0x80, kAt + 8, 0x80, kAt + 8,
-                                                 0x80, kAt + 12, 0x80, kAt + 12};
-
-// Chroma samples, byte kAt of each word, for chromaTerms.
-template <uint8_t kAt, class D, class D16 = hn::Repartition<int16_t, D>>
-HWY_INLINE hn::Vec<D16> chromaSamples(D d, hn::Vec<D> words) {
-    const hn::Repartition<uint8_t, D> d8;
-    const auto less128 = hn::BitCast(d8, hn::Xor(words, hn::Set(d, 0x80808080)));
-    const auto table = hn::LoadDup128(d8, kToBothPixels<kAt>);
-    return hn::BitCast(D16(), hn::TableLookupBytesOr0(less128, table));
-}
-
-#endif
-
 // ---- Frames -------------------------------------------------------------
 
 template <RasterVideoPixelLayout kLayout>
@@ -237,69 +34,197 @@ struct ConvertGroups {
     uint8_t *dst;
     const uint8_t *src;
 
-    // Groups i and on: as many as d has words.
-    template <class D>
-    HWY_INLINE void operator()([[maybe_unused]] D d, size_t i) const {
+#if HWY_TARGET == HWY_SCALAR
+    void pair(size_t i) const {
         const uint8_t *group = src + 4 * i;
-        uint8_t *pixels = dst + kPairBytes<kLayout> * i;
-#if HWY_TARGET == HWY_SCALAR
         convertPair<kLayout>(group[kGroup.luma], group[kGroup.luma + 2], group[kGroup.chromaLow],
-                             group[kGroup.chromaHigh], pixels);
-#else
-        const hn::Repartition<int16_t, D> d16;
-        const hn::RebindToUnsigned<decltype(d16)> du16;
-        const auto groups =
-            inStoreOrder<kLayout>(d, hn::LoadU(d, reinterpret_cast<const uint32_t *>(group)));
-        const auto chroma = chromaTerms(d16, chromaSamples<kGroup.chromaLow>(d, groups),
-                                        chromaSamples<kGroup.chromaHigh>(d, groups));
-        auto luma = hn::BitCast(du16, groups);
-        if constexpr (kGroup.luma == 0)
-            luma = hn::ShiftLeft<8>(luma);
-        else
-            luma = hn::And(luma, hn::Set(du16, 0xFF00));
-        storePixels<kLayout>(du16, fieldsOf(d16, luma, chroma), pixels);
-#endif
+                             group[kGroup.chromaHigh], dst + kPairBytes<kLayout> * i);
     }
-};
+#else
+    // Some pages are read for each that is written around the caches; so that
+    // nothing waits for them, ask for the groups well ahead of i.
+    HWY_INLINE void prefetch(size_t i, size_t last) const {
+        const uint8_t *ahead = src + 4 * HWY_MIN(i + 512, last);
+        for (size_t line = 0; line < kLanes<Widest<uint8_t>> * 2; line += 64)
+            hwy::Prefetch(ahead + line);
+    }
 
-// Two rows, which share their chroma.
-template <RasterVideoPixelLayout kLayout>
-struct ConvertRowPair {
-    uint8_t *upper, *lower;
-    const uint8_t *upperLuma, *lowerLuma;
-    const uint8_t *chromaHighRow, *chromaLowRow;
+    // Groups i and on: half as many as d has bytes.
+    template <class Store, class D>
+    HWY_INLINE void block(D d, size_t i) const {
+        const auto first = sums(d, i);
+        const auto second = sums(d, i + kLanes<D> / 4);
+        storePixels<kLayout, Store, false>(d, first, second, dst + kPairBytes<kLayout> * i);
+    }
 
-    // Pairs of columns i and on: as many as d has words.
     template <class D>
-    HWY_INLINE void operator()([[maybe_unused]] D d, size_t i) const {
-        const size_t at = kPairBytes<kLayout> * i;
-#if HWY_TARGET == HWY_SCALAR
-        const auto convert = [&](const uint8_t *luma, uint8_t *pixels) {
-            convertPair<kLayout>(luma[2 * i], luma[2 * i + 1], chromaLowRow[i], chromaHighRow[i],
-                                 pixels + at);
-        };
-        convert(upperLuma, upper);
-        convert(lowerLuma, lower);
-#else
+    HWY_INLINE auto sums(D, size_t i) const {
+        const hn::Repartition<uint32_t, D> d32;
         const hn::Repartition<int16_t, D> d16;
-        const hn::RebindToUnsigned<decltype(d16)> du16;
-        const auto chromaOf = [&](const uint8_t *row) HWY_ATTR {
-            const hn::Rebind<uint8_t, D> d8;
-            const auto words = hn::PromoteTo(d, hn::LoadU(d8, row + i));
-            return chromaSamples<0>(d, inStoreOrder<kLayout>(d, words));
-        };
-        const auto lumaOf = [&](const uint8_t *row) HWY_ATTR {
-            const hn::Rebind<uint8_t, decltype(du16)> d8;
-            const auto samples = hn::PromoteTo(du16, hn::LoadU(d8, row + 2 * i));
-            const auto ordered = inStoreOrder<kLayout>(d, hn::BitCast(d, samples));
-            return hn::ShiftLeft<8>(hn::BitCast(du16, ordered));
-        };
-        const auto chroma = chromaTerms(d16, chromaOf(chromaLowRow), chromaOf(chromaHighRow));
-        storePixels<kLayout>(du16, fieldsOf(d16, lumaOf(upperLuma), chroma), upper + at);
-        storePixels<kLayout>(du16, fieldsOf(d16, lumaOf(lowerLuma), chroma), lower + at);
-#endif
+        const auto groups =
+            less128(d32, hn::LoadU(d32, reinterpret_cast<const uint32_t *>(src) + i));
+        constexpr bool isLower = kGroup.luma == 0;
+        const auto luma = weighed < isLower ? kLumaFactor : 0,
+                   isLower ? 0 : kLumaFactor > (d16, hn::BitCast(d16, groups));
+        return sumsOf(hn::Add(luma, hn::Set(d16, kLumaRest)),
+                      chromaOf<kGroup.chromaLow, kGroup.chromaHigh>(d32, groups));
     }
+#endif
 };
+
+// How far on the samples of the next two rows are.
+struct NextRows {
+    ptrdiff_t luma, chroma;
+};
+
+// One row, or two which share their chroma.
+template <RasterVideoPixelLayout kLayout, size_t kRows>
+struct ConvertRows {
+    std::array<uint8_t *, kRows> dst;
+    std::array<const uint8_t *, kRows> luma;
+    const uint8_t *chromaHigh, *chromaLow;
+    NextRows next = {};
+
+#if HWY_TARGET == HWY_SCALAR
+    void pair(size_t i) const {
+        for (size_t row = 0; row < kRows; ++row)
+            convertPair<kLayout>(luma[row][2 * i], luma[row][2 * i + 1], chromaLow[i],
+                                 chromaHigh[i], dst[row] + kPairBytes<kLayout> * i);
+    }
+#else
+    ConvertRows<kLayout, 1> only(size_t row) const {
+        return {{dst[row]}, {luma[row]}, chromaHigh, chromaLow, next};
+    }
+
+    // The same place two rows on.
+    HWY_INLINE void prefetch(size_t i, size_t /*last*/) const {
+        for (const uint8_t *samples : luma)
+            hwy::Prefetch(samples + next.luma + 2 * i);
+        hwy::Prefetch(chromaHigh + next.chroma + i);
+        hwy::Prefetch(chromaLow + next.chroma + i);
+    }
+
+    // Pairs of columns i and on: half as many as d has bytes.
+    template <class Store, class D>
+    HWY_INLINE void block(D d, size_t i) const {
+        const hn::Repartition<int16_t, D> d16;
+        const auto ab = ordered<kLayout.bytesPerPixel, Come::InOrder>(d16, chroma(d16, i));
+        const auto terms = [&](auto both)
+                               HWY_ATTR { return chromaTerms(d16, hn::ShiftLeft<8>(both), both); };
+        const auto firstTerms = terms(hn::InterleaveLower(d16, ab, ab));
+        const auto secondTerms = terms(hn::InterleaveUpper(d16, ab, ab));
+        for (size_t row = 0; row < kRows; ++row) {
+            const auto samples =
+                ordered<kLayout.bytesPerPixel, Come::InOrder>(d, hn::LoadU(d, luma[row] + 2 * i));
+            const auto first = hn::InterleaveLower(d, samples, hn::Zero(d));
+            const auto second = hn::InterleaveUpper(d, samples, hn::Zero(d));
+            storePixels<kLayout, Store, true>(
+                d, sumsOf(lumaTerm(d16, hn::BitCast(d16, first)), firstTerms),
+                sumsOf(lumaTerm(d16, hn::BitCast(d16, second)), secondTerms),
+                dst[row] + kPairBytes<kLayout> * i);
+        }
+    }
+
+    template <class D16>
+    HWY_INLINE static hn::Vec<D16> lumaTerm(D16 d, hn::Vec<D16> luma) {
+        return hn::Add(hn::Mul(luma, hn::Set(d, kLumaFactor)),
+                       hn::Set(d, kLumaRest - 128 * kLumaFactor));
+    }
+
+    // Less 128, a in the lower bytes and b in the upper ones.
+    template <class D16>
+    HWY_INLINE hn::Vec<D16> chroma(D16 d, size_t i) const {
+        const hn::Rebind<uint8_t, D16> half;
+        const auto low = hn::PromoteTo(d, hn::LoadU(half, chromaLow + i));
+        const auto high = hn::PromoteTo(d, hn::LoadU(half, chromaHigh + i));
+        return hn::Xor(hn::Or(low, hn::ShiftLeft<8>(high)),
+                       hn::Set(d, static_cast<int16_t>(0x8080)));
+    }
+#endif
+};
+
+#if HWY_TARGET != HWY_SCALAR
+
+// The least number of pairs there are in a block.
+constexpr size_t kLeastPairs = 8;
+using Least = hn::CappedTag<uint8_t, 2 * kLeastPairs>;
+
+// Calls use with the widest tag of which so many pairs fill a block; they are not
+// fewer than the least number.
+template <size_t kCap = kLanes<Widest<uint8_t>>, class Use>
+HWY_INLINE void withBlocks(size_t pairs, const Use &use) {
+    const hn::CappedTag<uint8_t, kCap> d;
+    constexpr size_t n = kLanes<decltype(d)> / 2;
+    if constexpr (n > kLeastPairs) {
+        if (pairs < n)
+            return withBlocks<n>(pairs, use);
+    }
+    use(d);
+}
+
+// Every pair at least once, of at least a block.
+template <class D, class Body>
+HWY_INLINE void walkThroughCaches(D d, size_t pairs, const Body &body) {
+    constexpr size_t n = kLanes<D> / 2;
+    size_t i = 0;
+    for (; pairs - i >= n; i += n)
+        body.template block<ThroughCaches>(d, i);
+    if (i != pairs)
+        body.template block<ThroughCaches>(d, pairs - n);
+}
+
+// Pairs from dst on to the next one that begins a cache line; 64 where none does.
+template <size_t kBytes>
+size_t pairsToLine(const uint8_t *dst) {
+    const size_t pixels = pixelsToLine<kBytes>(dst);
+    return pixels % 2 != 0 || pixels == 64 ? 64 : pixels / 2;
+}
+
+// The same for at least 64 pairs, and where one begins a cache line around the
+// caches.
+template <size_t kBytes, class Body>
+HWY_INLINE void walkAroundCaches(const uint8_t *dst, size_t pairs, const Body &body) {
+    const Widest<uint8_t> d;
+    constexpr size_t n = kLanes<decltype(d)> / 2;
+    const size_t head = pairsToLine<kBytes>(dst);
+    if (head == 64)
+        return walkThroughCaches(d, pairs, body);
+    for (size_t i = 0; i < head; i += n)
+        body.template block<ThroughCaches>(d, i);
+    size_t i = head;
+    for (; pairs - i >= n; i += n) {
+        body.prefetch(i, pairs - n);
+        body.template block<AroundCaches>(d, i);
+    }
+    if (i != pairs)
+        body.template block<ThroughCaches>(d, pairs - n);
+}
+
+#endif
+
+template <Group kGroup, RasterVideoPixelLayout kLayout>
+void convertRun(uint8_t *dst, const uint8_t *src, size_t pairs) {
+    using Convert = ConvertGroups<kGroup, kLayout>;
+#if HWY_TARGET == HWY_SCALAR
+    for (size_t i = 0; i < pairs; ++i)
+        Convert{dst, src}.pair(i);
+#else
+    if (pairs < kLeastPairs) {
+        uint8_t groups[4 * kLeastPairs] = {}, pixels[kPairBytes<kLayout> * kLeastPairs];
+        std::memcpy(groups, src, 4 * pairs);
+        Convert{pixels, groups}.template block<ThroughCaches>(Least(), 0);
+        std::memcpy(dst, pixels, kPairBytes<kLayout> * pairs);
+        return;
+    }
+    const Convert body = {dst, src};
+    if (isStreamed(kPairBytes<kLayout> * pairs, 1)) {
+        walkAroundCaches<kLayout.bytesPerPixel>(dst, pairs, body);
+        hwy::FlushStream();
+    } else {
+        withBlocks(pairs, [&](auto d) HWY_ATTR { walkThroughCaches(d, pairs, body); });
+    }
+#endif
+}
 
 struct Run {
     uint8_t *dst;
@@ -311,9 +236,9 @@ struct Run {
 template <RasterVideoPixelLayout kLayout>
 void convertGroups(const Run &run) {
     if (run.order == VideoGroupOrder::Yuy2)
-        walkAgain<uint32_t>(run.groups, ConvertGroups<kYuy2, kLayout>{run.dst, run.src});
+        convertRun<kYuy2, kLayout>(run.dst, run.src, run.groups);
     else
-        walkAgain<uint32_t>(run.groups, ConvertGroups<kUyvy, kLayout>{run.dst, run.src});
+        convertRun<kUyvy, kLayout>(run.dst, run.src, run.groups);
 }
 
 // NOLINTNEXTLINE(readability-non-const-parameter): dst is written through run
@@ -332,14 +257,64 @@ void ConvertPacked(uint8 *dst, int32 bppdepth, const uint8 *src, VideoGroupOrder
     }
 }
 
+#if HWY_TARGET != HWY_SCALAR
+
+// Two rows too short for a block.
+template <RasterVideoPixelLayout kLayout>
+void convertFewPairs(const ConvertRows<kLayout, 2> &rows, size_t pairs) {
+    uint8_t luma[2][2 * kLeastPairs] = {}, high[kLeastPairs] = {}, low[kLeastPairs] = {};
+    uint8_t pixels[2][kPairBytes<kLayout> * kLeastPairs];
+    for (size_t row = 0; row < 2; ++row)
+        std::memcpy(luma[row], rows.luma[row], 2 * pairs);
+    std::memcpy(high, rows.chromaHigh, pairs);
+    std::memcpy(low, rows.chromaLow, pairs);
+    const ConvertRows<kLayout, 2> copies = {{pixels[0], pixels[1]}, {luma[0], luma[1]}, high, low};
+    copies.template block<ThroughCaches>(Least(), 0);
+    for (size_t row = 0; row < 2; ++row)
+        std::memcpy(rows.dst[row], pixels[row], kPairBytes<kLayout> * pairs);
+}
+
+// Two rows around the caches: together if they lie to cache lines alike.
+template <RasterVideoPixelLayout kLayout>
+void streamRows(const ConvertRows<kLayout, 2> &rows, size_t pairs) {
+    constexpr size_t kBytes = kLayout.bytesPerPixel;
+    if (pairsToLine<kBytes>(rows.dst[0]) == pairsToLine<kBytes>(rows.dst[1]))
+        return walkAroundCaches<kBytes>(rows.dst[0], pairs, rows);
+    for (size_t row = 0; row < 2; ++row)
+        walkAroundCaches<kBytes>(rows.dst[row], pairs, rows.only(row));
+}
+
+#endif
+
 template <RasterVideoPixelLayout kLayout>
 void convertRowPairs(DstRows dst, const VideoPlanes &src, Size pairs) {
-    for (size_t r = 0; r < pairs.height; ++r) {
-        const ConvertRowPair<kLayout> body = {dst.row(2 * r),        dst.row(2 * r + 1),
-                                              src.luma.row(2 * r),   src.luma.row(2 * r + 1),
-                                              src.chromaHigh.row(r), src.chromaLow.row(r)};
-        walkAgain<uint32_t>(pairs.width, body);
+    const NextRows next = {2 * src.luma.step, src.chromaHigh.step};
+    const auto rows = [&](size_t r) {
+        return ConvertRows<kLayout, 2>{{dst.row(2 * r), dst.row(2 * r + 1)},
+                                       {src.luma.row(2 * r), src.luma.row(2 * r + 1)},
+                                       src.chromaHigh.row(r),
+                                       src.chromaLow.row(r),
+                                       r + 1 < pairs.height ? next : NextRows{}};
+    };
+#if HWY_TARGET == HWY_SCALAR
+    for (size_t r = 0; r < pairs.height; ++r)
+        for (size_t i = 0; i < pairs.width; ++i)
+            rows(r).pair(i);
+#else
+    if (isStreamed(kPairBytes<kLayout> * pairs.width, 2 * pairs.height)) {
+        for (size_t r = 0; r < pairs.height; ++r)
+            streamRows(rows(r), pairs.width);
+        hwy::FlushStream();
+    } else if (pairs.width < kLeastPairs) {
+        for (size_t r = 0; r < pairs.height; ++r)
+            convertFewPairs(rows(r), pairs.width);
+    } else {
+        withBlocks(pairs.width, [&](auto d) HWY_ATTR {
+            for (size_t r = 0; r < pairs.height; ++r)
+                walkThroughCaches(d, pairs.width, rows(r));
+        });
     }
+#endif
 }
 
 void ConvertPlanar(DstRows dst, int32 bppdepth, const VideoPlanes &src, Size pairs) {
@@ -355,82 +330,6 @@ void ConvertPlanar(DstRows dst, int32 bppdepth, const VideoPlanes &src, Size pai
     }
 }
 
-// ---- Colour key ---------------------------------------------------------
-
-// Key pixels as words that equal the key where they match.  Of 32-bit pixels the
-// top byte is shifted out.
-template <class D>
-HWY_INLINE hn::Vec<D> loadKeys(D d, const uint32_t *keys) {
-    return hn::ShiftLeft<8>(hn::LoadU(d, keys));
-}
-
-template <class D, class Pixel>
-HWY_INLINE hn::Vec<D> loadKeys(D d, const Pixel *keys) {
-    const hn::Rebind<Pixel, D> narrow;
-    return hn::PromoteTo(d, hn::LoadU(narrow, keys));
-}
-
-template <class Pixel>
-struct ApplyKey {
-    uint8_t *dst;
-    const uint8_t *background, *overlay, *keys;
-    uint32_t key;
-
-    template <class D>
-    HWY_INLINE void operator()(D d, size_t i) const {
-        const auto words = [&](const uint8_t *row) HWY_ATTR {
-            return hn::LoadU(d, reinterpret_cast<const uint32_t *>(row) + i);
-        };
-        const auto matches =
-            hn::Eq(loadKeys(d, reinterpret_cast<const Pixel *>(keys) + i), hn::Set(d, key));
-        hn::StoreU(hn::IfThenElse(matches, words(overlay), words(background)), d,
-                   reinterpret_cast<uint32_t *>(dst) + i);
-    }
-
-    // Whether the pixels of a row have to be gone through one by one.  Writing
-    // goes on faster than the reading of narrow key pixels and may catch up with
-    // it anywhere, so there any overlap counts.
-    bool overlaps(size_t width) const {
-        constexpr size_t kVector = 4 * kLanes<Widest<uint32_t>>;
-        if (runsIntoItself(dst, background, kVector) || runsIntoItself(dst, overlay, kVector))
-            return true;
-        if constexpr (sizeof(Pixel) == 4)
-            return runsIntoItself(dst, keys, kVector);
-        return reinterpret_cast<uintptr_t>(keys) < reinterpret_cast<uintptr_t>(dst) + 4 * width &&
-               reinterpret_cast<uintptr_t>(dst) <
-                   reinterpret_cast<uintptr_t>(keys) + sizeof(Pixel) * width;
-    }
-};
-
-template <class Pixel>
-void applyKey(const KeyedRows &rows, Size size, uint32 key) {
-    const size_t rowBytes = 4 * size.width;
-    const auto fits = [](const SrcRows &src, size_t bytes) {
-        return src.step == static_cast<ptrdiff_t>(bytes);
-    };
-    if (fits(rows.background, rowBytes) && fits(rows.overlay, rowBytes))
-        size = joinedRows(size, rowBytes, rows.dst.step, sizeof(Pixel) * size.width, rows.key.step);
-    for (size_t y = 0; y < size.height; ++y) {
-        const ApplyKey<Pixel> body = {rows.dst.row(y), rows.background.row(y), rows.overlay.row(y),
-                                      rows.key.row(y), key};
-        if (body.overlaps(size.width))
-            walkSingly<uint32_t>(size.width, body);
-        else
-            walkOnce<uint32_t>(size.width, body);
-    }
-}
-
-void Key(const KeyedRows &rows, Size size, KeyPixel keyPixel, uint32 key) {
-    switch (keyPixel) {
-    case KeyPixel::Bytes1:
-        return applyKey<uint8_t>(rows, size, key);
-    case KeyPixel::Bytes2:
-        return applyKey<uint16_t>(rows, size, key);
-    case KeyPixel::Bytes4:
-        return applyKey<uint32_t>(rows, size, key << 8);
-    }
-}
-
 } // namespace
 } // namespace quillon::HWY_NAMESPACE
 HWY_AFTER_NAMESPACE();
@@ -440,7 +339,6 @@ namespace quillon {
 
 HWY_EXPORT(ConvertPacked);
 HWY_EXPORT(ConvertPlanar);
-HWY_EXPORT(Key);
 
 void convertPackedFrame(uint8 *dst, int32 bppdepth, const uint8 *src, VideoGroupOrder order,
                         size_t groups) {
@@ -449,10 +347,6 @@ void convertPackedFrame(uint8 *dst, int32 bppdepth, const uint8 *src, VideoGroup
 
 void convertPlanarFrame(DstRows dst, int32 bppdepth, const VideoPlanes &src, Size pairs) {
     HWY_DYNAMIC_DISPATCH(ConvertPlanar)(dst, bppdepth, src, pairs);
-}
-
-void applyKeyRows(const KeyedRows &rows, Size size, KeyPixel keyPixel, uint32 key) {
-    HWY_DYNAMIC_DISPATCH(Key)(rows, size, keyPixel, key);
 }
 
 } // namespace quillon

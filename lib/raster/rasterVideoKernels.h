@@ -1,4 +1,4 @@
-// The lower floor of the video routines.
+// The lower floor of video frames.
 #pragma once
 
 #include "core/surface.h"
@@ -37,19 +37,5 @@ struct VideoPlanes {
 // Converts blocks of two by two pixels that share their chroma; neither of
 // pairs' sizes is 0.
 void convertPlanarFrame(DstRows dst, int32 bppdepth, const VideoPlanes &src, Size pairs);
-
-// A pixel of a key surface, by its bytes.
-enum class KeyPixel { Bytes1 = 1, Bytes2 = 2, Bytes4 = 4 };
-
-struct KeyedRows {
-    DstRows dst;
-    SrcRows background;
-    SrcRows overlay;
-    SrcRows key;
-};
-
-// Takes each pixel from the overlay where the key surface matches and from the
-// background elsewhere, from the top left, row by row; no size is 0.
-void applyKeyRows(const KeyedRows &rows, Size size, KeyPixel keyPixel, uint32 key);
 
 } // namespace quillon
