@@ -9,7 +9,7 @@
 #include "hwy/foreach_target.h"
 #include "hwy/highway.h"
 
-#include "raster/bytePattern-inl.h"
+#include "raster/pixelPattern-inl.h"
 #include "raster/kernels-inl.h"
 #include "raster/streaming-inl.h"
 
@@ -129,10 +129,10 @@ struct Colour {
     hn::Vec<D> vectors[kVectors];
 
     HWY_INLINE Colour(D d, uint32_t pixel) {
-        const BytePattern<kVectorBytes<D>> pattern(pixel, kBytes);
+        const hn::Repartition<uint32_t, D> d32;
+        const PixelPattern pattern(pixel, kBytes);
         for (size_t k = 0; k < kVectors; ++k)
-            vectors[k] = hn::LoadU(
-                d, reinterpret_cast<const hn::TFromD<D> *>(pattern.from(k * kVectorBytes<D>)));
+            vectors[k] = hn::BitCast(d, pattern.from(d32, k * kVectorBytes<D>));
     }
     HWY_INLINE hn::Vec<D> operator[](size_t k) const { return vectors[k % kVectors]; }
 };

@@ -8,7 +8,7 @@
 #include "raster.h"
 #include "raster/copyRows.h"
 
-#include "raster/bytePattern-inl.h"
+#include "raster/pixelPattern-inl.h"
 #include "raster/kernels-inl.h"
 #include "raster/streaming-inl.h"
 

@@ -5,7 +5,7 @@
 #include "hwy/foreach_target.h"
 #include "hwy/highway.h"
 
-#include "raster/bytePattern-inl.h"
+#include "raster/pixelPattern-inl.h"
 #include "raster/kernels-inl.h"
 #include "raster/streaming-inl.h"
 
