@@ -16,7 +16,10 @@
 
 #include "hwy/highway.h"
 #include "raster/kernels-inl.h"
+#include "raster/rasterScaleBox-inl.h"
 #include "raster/rasterScaleRows-inl.h"
+#include "raster/rasterScaleVectors-inl.h"
+#include "raster/streaming-inl.h"
 
 HWY_BEFORE_NAMESPACE();
 namespace quillon::HWY_NAMESPACE {
@@ -26,6 +29,10 @@ namespace {
 HWY_INLINE uint32 rowOf(const ScaleAxis &axis, uint32 position) {
     const bool isAbove = position >> 31 != 0;
     return isAbove ? 0 : std::min(position >> 16, axis.srcSize - 1);
+}
+
+HWY_INLINE bool isStreamed(const ScaleJob &job) {
+    return quillon::isStreamed(size_t{job.x.dstSize} * kPixelBytes, job.y.dstSize);
 }
 
 // The source rows that neighbouring destination rows share, already scaled.
@@ -61,15 +68,15 @@ private:
 };
 
 // Each destination row is one scaled source row.  No cache: a row that comes
-// again is copied from the destination row before.
-template <class Row>
+// again is copied from the destination row before, unless that is far away by now.
+template <bool kRereads, class Row>
 HWY_INLINE void walkDirect(const ScaleJob &job, const Row &row) {
     uint8 *dst = job.dst.first;
     uint32 y = job.y.start;
     uint32 previous = kScaleNoRow;
     for (uint32 i = 0; i < job.y.dstSize; ++i, y += job.y.step) {
         const uint32 index = rowOf(job.y, y);
-        if (index == previous)
+        if (kRereads && index == previous)
             std::memmove(dst, dst - job.dst.step, size_t{job.x.dstSize} * kPixelBytes);
         else
             row(dst, job.src.row(index));
@@ -78,6 +85,17 @@ HWY_INLINE void walkDirect(const ScaleJob &job, const Row &row) {
     }
 }
 
+// Mixes a row by one of two bodies, through the caches or around them.
+template <class Through, class Around>
+HWY_INLINE void mixRow(bool streams, const uint8 *dst, size_t count, const Through &throughCaches,
+                       const Around &aroundCaches) {
+    if (streams)
+        walkStreaming<uint32, kPixelBytes>(dst, count, throughCaches, aroundCaches);
+    else
+        walkAgain<uint32>(count, throughCaches);
+}
+
+template <class Store>
 struct BlendBody {
     uint8 *dst;
     const uint8 *upper, *lower;
@@ -87,10 +105,10 @@ struct BlendBody {
     HWY_INLINE void operator()(D d, size_t i) const {
         using Channels = ChannelPairs<D>;
         const size_t offset = i * kPixelBytes;
-        storePixels(Channels::blend(loadPixels(d, upper + offset),
-                                    Channels::weight(255 - lowerWeight),
-                                    loadPixels(d, lower + offset), Channels::weight(lowerWeight)),
-                    d, dst + offset);
+        storePixelsBy<Store>(
+            Channels::blend(loadPixels(d, upper + offset), Channels::weight(255 - lowerWeight),
+                            loadPixels(d, lower + offset), Channels::weight(lowerWeight)),
+            d, dst + offset);
     }
 };
 
@@ -99,12 +117,15 @@ struct BlendBody {
 template <class Row>
 HWY_INLINE void walkLinear(const ScaleJob &job, const Row &row, void *block) {
     const RowCache<Row> cache(job, row, block);
+    const bool streams = isStreamed(job);
     uint8 *dst = job.dst.first;
     uint32 y = job.y.start;
     for (uint32 i = 0; i < job.y.dstSize; ++i, y += job.y.step) {
         const uint8 *upper = cache.fetch(y);
         const uint8 *lower = cache.fetch(y + kScaleOne);
-        walkAgain<uint32>(job.x.dstSize, BlendBody{dst, upper, lower, (y & 0xFFFF) >> 8});
+        const uint32 weight = (y & 0xFFFF) >> 8;
+        mixRow(streams, dst, job.x.dstSize, BlendBody<ThroughCaches>{dst, upper, lower, weight},
+               BlendBody<AroundCaches>{dst, upper, lower, weight});
         dst += job.dst.step;
     }
 }
@@ -115,6 +136,7 @@ struct Tap {
     uint32 weight;
 };
 
+template <class Store>
 struct AverageBody {
     uint8 *dst;
     const Tap *taps;
@@ -127,7 +149,7 @@ struct AverageBody {
         ChannelSums<D> sums;
         for (const Tap *tap = taps; tap != taps + count; ++tap)
             sums.add(loadPixels(d, tap->row + offset), ChannelPairs<D>::weight(tap->weight));
-        storePixels(sums.average(normaliser), d, dst + offset);
+        storePixelsBy<Store>(sums.average(normaliser), d, dst + offset);
     }
 };
 
@@ -136,6 +158,7 @@ struct AverageBody {
 template <class Row>
 HWY_INLINE void walkBox(const ScaleJob &job, const Row &row, void *block) {
     const RowCache<Row> cache(job, row, block);
+    const bool streams = isStreamed(job);
     uint8 *dst = job.dst.first;
     uint32 y = job.y.start;
     for (uint32 i = 0; i < job.y.dstSize; ++i, y += job.y.step) {
@@ -151,7 +174,10 @@ HWY_INLINE void walkBox(const ScaleJob &job, const Row &row, void *block) {
             position += covered;
             remaining -= covered;
         }
-        walkAgain<uint32>(job.x.dstSize, AverageBody{dst, taps, count, job.y.normaliser});
+        const uint32 normaliser = job.y.normaliser;
+        mixRow(streams, dst, job.x.dstSize,
+               AverageBody<ThroughCaches>{dst, taps, count, normaliser},
+               AverageBody<AroundCaches>{dst, taps, count, normaliser});
         dst += job.dst.step;
     }
 }
@@ -160,7 +186,7 @@ template <class Row>
 void walkRows(const ScaleJob &job, const Row &row, void *block) {
     switch (job.y.method) {
     case ScaleMethod::kNearest:
-        return walkDirect(job, row);
+        return walkDirect<true>(job, row);
     case ScaleMethod::kLinear:
         return walkLinear(job, row, block);
     case ScaleMethod::kBox:
@@ -168,10 +194,32 @@ void walkRows(const ScaleJob &job, const Row &row, void *block) {
     }
 }
 
-void scaleRect(const ScaleJob &job, void *block) {
+void walkNearest(const ScaleJob &job, void *block) {
+    const RasterScaleRowNearest row(job.x);
+    if (job.y.method != ScaleMethod::kNearest || !isStreamed(job))
+        return walkRows(job, row, block);
+    walkDirect<false>(job, [&](uint8 *dst, const uint8 *src)
+                               HWY_ATTR { row.write<AroundCaches>(dst, src); });
+}
+
+template <class Store>
+void walkQuarters(const ScaleJob &job) {
+    const RasterScaleRowQuarter row(job.x);
+    uint8 *dst = job.dst.first;
+    uint32 y = job.y.start;
+    for (uint32 i = 0; i < job.y.dstSize; ++i, y += job.y.step) {
+        row.write<Store>(dst, job.src.row(rowOf(job.y, y)),
+                         job.src.row(rowOf(job.y, y + kScaleOne)));
+        dst += job.dst.step;
+    }
+}
+
+void walkAll(const ScaleJob &job, void *block) {
+    if (job.isQuarter())
+        return isStreamed(job) ? walkQuarters<AroundCaches>(job) : walkQuarters<ThroughCaches>(job);
     switch (job.x.method) {
     case ScaleMethod::kNearest:
-        return walkRows(job, RasterScaleRowNearest(job.x), block);
+        return walkNearest(job, block);
     case ScaleMethod::kLinear:
         return walkRows(job, RasterScaleRowLinear(job.x), block);
     case ScaleMethod::kBox:
@@ -179,6 +227,12 @@ void scaleRect(const ScaleJob &job, void *block) {
                    ? walkRows(job, RasterScaleRowBox<uint16>(job.x), block)
                    : walkRows(job, RasterScaleRowBox<uint32>(job.x), block);
     }
+}
+
+void scaleRect(const ScaleJob &job, void *block) {
+    walkAll(job, block);
+    if (isStreamed(job))
+        hwy::FlushStream();
 }
 
 } // namespace
