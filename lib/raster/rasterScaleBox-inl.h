@@ -77,62 +77,79 @@ struct QuarterMix {
     }
 };
 
-template <class Store>
+// With kToEnd, also the pixel behind the whole ones, which counts for its left
+// half alone.
+template <class Store, bool kToEnd>
 struct QuarterBody {
     uint8 *dst;
     const uint8 *upper, *lower;
+    uint32 whole;
 
     template <class D>
     HWY_INLINE void operator()(D d, size_t i) const {
         const size_t offset = 2 * i * kPixelBytes;
-        storePixelsBy<Store>(
-            QuarterMix::of(d, Neighbours<D>(d, upper + offset), Neighbours<D>(d, lower + offset)),
-            d, dst + i * kPixelBytes);
+        Neighbours<D> above(d, upper + offset), below(d, lower + offset);
+        if constexpr (kToEnd) {
+            const auto isWhole = hn::Lt(hn::Iota(d, 0), hn::Set(d, whole - static_cast<uint32>(i)));
+            above.right = hn::IfThenElseZero(isWhole, above.right);
+            below.right = hn::IfThenElseZero(isWhole, below.right);
+        }
+        storePixelsBy<Store>(QuarterMix::of(d, above, below), d, dst + i * kPixelBytes);
     }
 };
 
-// Two source rows made one of half their length.
+// Two source rows made one of half their length.  The last pixel enters no
+// average; behind them there are copies of it.
 class RasterScaleRowQuarter {
 public:
     explicit RasterScaleRowQuarter(const ScaleAxis &axis)
-        : axis_(axis), first_(axis.start >> 16), last_(axis.srcSize - 1),
-          whole_(first_ < last_ ? std::min((last_ - first_) / 2, axis.dstSize) : 0) {}
+        : first_(axis.start >> 16), last_(axis.srcSize - 1), count_(axis.dstSize) {
+        const uint32 before = first_ < last_ ? last_ - first_ : 0;
+        whole_ = std::min(before / 2, count_);
+        averaged_ = std::min((before + 1) / 2, count_);
+    }
 
     template <class Store>
-    HWY_NOINLINE void write(uint8 *dst, const uint8 *upper, const uint8 *lower) const {
+    HWY_INLINE void write(uint8 *dst, const uint8 *upper, const uint8 *lower) const {
         const size_t offset = size_t{first_} * kPixelBytes;
-        const QuarterBody<ThroughCaches> body = {dst, upper + offset, lower + offset};
-        if constexpr (std::is_same_v<Store, ThroughCaches>)
-            walkAgain<uint32>(whole_, body);
+        const QuarterBody<ThroughCaches, true> toEnd = {dst, upper + offset, lower + offset,
+                                                        whole_};
+        if constexpr (!std::is_same_v<Store, ThroughCaches>)
+            walkStreaming<uint32, kPixelBytes>(
+                dst, averaged_, toEnd,
+                QuarterBody<Store, true>{dst, toEnd.upper, toEnd.lower, whole_});
         else
-            walkStreaming<uint32, kPixelBytes>(dst, whole_, body,
-                                               QuarterBody<Store>{dst, body.upper, body.lower});
-        writeEnd(dst, upper, lower);
+            writeInside(toEnd);
+        if (averaged_ != count_)
+            copyLast(dst, upper, lower);
     }
 
 private:
-    // The pixel in front of the last one counts for itself alone; behind it
-    // there are copies of the last one.
-    HWY_INLINE void writeEnd(uint8 *dst, const uint8 *upper, const uint8 *lower) const {
-        const hn::CappedTag<uint32, 1> d;
-        const auto none = hn::Zero(d);
-        uint32 i = whole_;
-        if (i < axis_.dstSize && first_ + 2 * i < last_) {
-            const size_t offset = size_t{last_ - 1} * kPixelBytes;
-            storePixels(QuarterMix::of(d, {d, loadPixels(d, upper + offset), none},
-                                       {d, loadPixels(d, lower + offset), none}),
-                        d, dst + i++ * kPixelBytes);
-        }
-        if (i == axis_.dstSize)
-            return;
-        const size_t offset = size_t{last_} * kPixelBytes;
-        const auto above = loadPixels(d, upper + offset), below = loadPixels(d, lower + offset);
-        const auto end = QuarterMix::of(d, {d, above, above}, {d, below, below});
-        walkAgain<uint32>(axis_.dstSize - i, FillBody{dst + i * kPixelBytes, hn::GetLane(end)});
+    HWY_INLINE void writeInside(const QuarterBody<ThroughCaches, true> &toEnd) const {
+        const Widest<uint32> d;
+        constexpr uint32 n = kPixels<decltype(d)>;
+        if (averaged_ < n)
+            return walkAgain<uint32>(averaged_, toEnd);
+        const QuarterBody<ThroughCaches, false> inside = {toEnd.dst, toEnd.upper, toEnd.lower, 0};
+        uint32 i = 0;
+        for (; whole_ - i >= n; i += n)
+            inside(d, i);
+        if (i != averaged_)
+            toEnd(d, averaged_ - n);
     }
 
-    const ScaleAxis &axis_;
-    uint32 first_, last_, whole_;
+    HWY_NOINLINE void copyLast(uint8 *dst, const uint8 *upper, const uint8 *lower) const {
+        const hn::CappedTag<uint32, 1> d;
+        const size_t offset = size_t{last_} * kPixelBytes;
+        const auto above = loadPixels(d, upper + offset), below = loadPixels(d, lower + offset);
+        const auto mixed = QuarterMix::of(d, {d, above, above}, {d, below, below});
+        walkAgain<uint32>(count_ - averaged_,
+                          FillBody{dst + size_t{averaged_} * kPixelBytes, hn::GetLane(mixed)});
+    }
+
+    uint32 first_, last_, count_;
+    uint32 whole_;    // pixels that are averages of four
+    uint32 averaged_; // the same, and the one of two
 };
 
 // Averages of 2^kDoublings whole pixels.

@@ -42,7 +42,7 @@ public:
     RowCache(const ScaleJob &job, const Row &row, void *block)
         : job_(job), row_(row), slots_(static_cast<RasterScaleRowSlot *>(block)) {
         const ScaleCacheShape shape(job);
-        period_ = static_cast<uint32>(shape.slots - 1);
+        mask_ = static_cast<uint32>(shape.slots - 2);
         const auto behindSlots = reinterpret_cast<uintptr_t>(slots_ + shape.slots);
         auto *pixels = reinterpret_cast<uint8 *>((behindSlots + ScaleCacheShape::kAlignment - 1) &
                                                  -ScaleCacheShape::kAlignment);
@@ -52,7 +52,7 @@ public:
 
     HWY_INLINE const uint8 *fetch(uint32 position) const {
         const uint32 index = rowOf(job_.y, position);
-        RasterScaleRowSlot &slot = slots_[index == 0 ? 0 : 1 + index % period_];
+        RasterScaleRowSlot &slot = slots_[index == 0 ? 0 : 1 + (index & mask_)];
         if (slot.rowIndex != index) {
             slot.rowIndex = index;
             row_(slot.pixels, job_.src.row(index));
@@ -64,7 +64,7 @@ private:
     const ScaleJob &job_;
     const Row &row_;
     RasterScaleRowSlot *slots_;
-    uint32 period_;
+    uint32 mask_; // slots - 2
 };
 
 // Each destination row is one scaled source row.  No cache: a row that comes
@@ -194,12 +194,30 @@ void walkRows(const ScaleJob &job, const Row &row, void *block) {
     }
 }
 
+template <uint32 kWindows>
+void walkClose(const ScaleJob &job) {
+    if (isStreamed(job))
+        walkDirect<false>(job, RasterScaleRowClose<kWindows, AroundCaches>(job.x));
+    else
+        walkDirect<true>(job, RasterScaleRowClose<kWindows, ThroughCaches>(job.x));
+}
+
+// Columns are nearest pixels; where rows are not, too, the columns' step is one.
 void walkNearest(const ScaleJob &job, void *block) {
-    const RasterScaleRowNearest row(job.x);
-    if (job.y.method != ScaleMethod::kNearest || !isStreamed(job))
-        return walkRows(job, row, block);
-    walkDirect<false>(job, [&](uint8 *dst, const uint8 *src)
-                               HWY_ATTR { row.write<AroundCaches>(dst, src); });
+    if ((uint64_t{job.x.step} * (job.x.dstSize - 1) + job.x.start) >> 32 != 0)
+        walkRows(job, RasterScaleRowWrapping(job.x), block);
+    else if (job.x.step == kScaleOne)
+        walkRows(job, RasterScaleRowCopy(job.x), block);
+    else if (job.x.step < kScaleOne)
+        walkClose<1>(job);
+    else if (kVectorsAreWide && job.x.step <= 2 * kScaleOne && job.x.srcSize >= 2)
+        walkClose<2>(job);
+    else if (kVectorsAreWide && job.x.step <= 4 * kScaleOne && job.x.srcSize >= 4)
+        walkClose<4>(job);
+    else if (isStreamed(job))
+        walkDirect<false>(job, RasterScaleRowSparse<AroundCaches>(job.x));
+    else
+        walkDirect<true>(job, RasterScaleRowSparse<ThroughCaches>(job.x));
 }
 
 template <class Store>

@@ -8,6 +8,7 @@
 #include "core/surface.h"
 
 #include <algorithm>
+#include <bit>
 #include <cstddef>
 #include <cstdint>
 
@@ -64,16 +65,17 @@ struct RasterScaleRowSlot {
 constexpr uint32 kScaleNoRow = 0xFFFFFFFF;
 
 // The row cache: a slot for every source row that one destination row can need,
-// so that none is made twice.  Row r goes to slot 1 + r % (slots - 1), row 0
-// to slot 0: a position that wraps comes back to row 0 in the midst of a span,
-// and must not take the place of a row of that span.
+// so that none is made twice.  Row r goes to slot 1 + r % (slots - 1), the divisor
+// being a power of two, row 0 to slot 0: a position that wraps comes back to row 0
+// in the midst of a span, and must not take the place of a row of that span.
 struct ScaleCacheShape {
     static constexpr size_t kAlignment = 64;
 
     explicit ScaleCacheShape(const ScaleJob &job)
         : slots(job.y.method == ScaleMethod::kNearest || job.isQuarter()
                     ? 0
-                    : 1 + std::min<size_t>(((job.y.step + 0xFFFF) >> 16) + 1, kScaleMaxTaps)),
+                    : 1 + std::bit_ceil(
+                              std::min<size_t>(((job.y.step + 0xFFFF) >> 16) + 1, kScaleMaxTaps))),
           rowBytes((size_t{job.x.dstSize} * 4 + kAlignment - 1) / kAlignment * kAlignment) {}
 
     // The slots and then, aligned, their rows.

@@ -44,99 +44,141 @@ struct NearestBody {
     }
 };
 
-// Each pixel is the source pixel of its position, or the last one.
-class RasterScaleRowNearest {
+// The rows of nearest pixels come in kinds, which differ in how positions advance
+// and are chosen once for all rows.  Each pixel is the source pixel of its
+// position, or the last one.
+class NearestRow {
 public:
-    explicit RasterScaleRowNearest(const ScaleAxis &axis)
-        : axis_(axis), wraps_((uint64_t{axis.step} * (axis.dstSize - 1) + axis.start) >> 32 != 0),
+    explicit NearestRow(const ScaleAxis &axis)
+        : start_(axis.start), step_(axis.step), srcSize_(axis.srcSize), count_(axis.dstSize),
           inner_(std::min(stepsBefore(axis.start, axis.lastPosition(), axis.step), axis.dstSize)) {}
 
+protected:
+    // What follows the pixels in front of the last one.
+    HWY_INLINE void fillBehindInner(uint8 *dst, const uint8 *src) const {
+        fillPixels(dst + size_t{inner_} * kPixelBytes, src, srcSize_ - 1, count_ - inner_);
+    }
+
+    uint32 start_, step_, srcSize_, count_, inner_;
+};
+
+// Positions that wrap come back into the source.
+struct RasterScaleRowWrapping : NearestRow {
+    using NearestRow::NearestRow;
+
     HWY_INLINE void operator()(uint8 *dst, const uint8 *src) const {
-        write<ThroughCaches>(dst, src);
-    }
-
-    template <class Store>
-    HWY_NOINLINE void write(uint8 *dst, const uint8 *src) const {
-        if (wraps_)
-            pickAnywhere(dst, src);
-        else if (axis_.step == kScaleOne)
-            copy(dst, src);
-        else if (axis_.step < kScaleOne)
-            pickWindows<1, Store>(dst, src);
-        else if (kVectorsAreWide && axis_.step <= 2 * kScaleOne && axis_.srcSize >= 2)
-            pickWindows<2, Store>(dst, src);
-        else if (kVectorsAreWide && axis_.step <= 4 * kScaleOne && axis_.srcSize >= 4)
-            pickWindows<4, Store>(dst, src);
-        else
-            pickSingly(dst, src);
-    }
-
-private:
-    template <uint32 kWindows, class Store>
-    HWY_INLINE NearestBody<kWindows, Store, true> toEnd(uint8 *dst, const uint8 *src) const {
-        return {dst, src, axis_.start, axis_.step, axis_.srcSize};
-    }
-
-    template <uint32 kWindows, class Store>
-    HWY_INLINE void pickWindows(uint8 *dst, const uint8 *src) const {
-        const Widest<uint32> d;
-        constexpr uint32 n = kPixels<decltype(d)>;
-        const auto body = toEnd<kWindows, ThroughCaches>(dst, src);
-        const uint32 count = axis_.dstSize;
-        if (axis_.srcSize < kWindows * n || count < n)
-            return walkWindows(count, axis_.srcSize / kWindows, body);
-        if constexpr (!std::is_same_v<Store, ThroughCaches>)
-            return walkStreaming<uint32, kPixelBytes>(dst, count, body,
-                                                      toEnd<kWindows, Store>(dst, src));
-        const NearestBody<kWindows, Store, false> inside = {dst, src, axis_.start, axis_.step,
-                                                            axis_.srcSize};
-        uint32 i = 0;
-        for (; inner_ - i >= n; i += n)
-            inside(d, i);
-        for (; count - i >= n; i += n)
-            body(d, i);
-        if (i != count)
-            body(d, count - n);
-    }
-
-    HWY_INLINE void copy(uint8 *dst, const uint8 *src) const {
-        std::memcpy(dst, src + size_t{axis_.start >> 16} * kPixelBytes,
-                    size_t{inner_} * kPixelBytes);
-        fillPixels(dst + size_t{inner_} * kPixelBytes, src, axis_.srcSize - 1,
-                   axis_.dstSize - inner_);
-    }
-
-    // Four a turn, read before they are written: the compiler cannot know that
-    // the rows do not overlap.
-    HWY_INLINE void pickSingly(uint8 *dst, const uint8 *src) const {
-        const uint32 step = axis_.step;
-        uint32 x = axis_.start;
-        size_t i = 0;
-        for (; inner_ - i >= 4; i += 4, x += 4 * step) {
-            uint32 pixels[4];
-            for (uint32 k = 0; k < 4; ++k)
-                std::memcpy(&pixels[k], src + size_t{(x + k * step) >> 16} * kPixelBytes,
-                            kPixelBytes);
-            std::memcpy(dst + i * kPixelBytes, pixels, sizeof(pixels));
-        }
-        for (; i < inner_; ++i, x += step)
-            std::memcpy(dst + i * kPixelBytes, src + size_t{x >> 16} * kPixelBytes, kPixelBytes);
-        fillPixels(dst + size_t{inner_} * kPixelBytes, src, axis_.srcSize - 1,
-                   axis_.dstSize - inner_);
-    }
-
-    // Positions that wrap come back into the source.
-    HWY_INLINE void pickAnywhere(uint8 *dst, const uint8 *src) const {
-        uint32 x = axis_.start;
-        for (size_t i = 0; i < axis_.dstSize; ++i, x += axis_.step) {
-            const size_t index = std::min(x >> 16, axis_.srcSize - 1);
+        uint32 x = start_;
+        for (size_t i = 0; i < count_; ++i, x += step_) {
+            const size_t index = std::min(x >> 16, srcSize_ - 1);
             std::memcpy(dst + i * kPixelBytes, src + index * kPixelBytes, kPixelBytes);
         }
     }
+};
 
-    const ScaleAxis &axis_;
-    bool wraps_;
-    uint32 inner_;
+// Steps of one pixel.
+struct RasterScaleRowCopy : NearestRow {
+    using NearestRow::NearestRow;
+
+    HWY_INLINE void operator()(uint8 *dst, const uint8 *src) const {
+        std::memcpy(dst, src + size_t{start_ >> 16} * kPixelBytes, size_t{inner_} * kPixelBytes);
+        fillBehindInner(dst, src);
+    }
+};
+
+// Steps of up to kWindows pixels.
+template <uint32 kWindows, class Store>
+struct RasterScaleRowClose : NearestRow {
+    using NearestRow::NearestRow;
+
+    HWY_INLINE void operator()(uint8 *dst, const uint8 *src) const {
+        const Widest<uint32> d;
+        constexpr uint32 n = kPixels<decltype(d)>;
+        const auto toEnd = body<ThroughCaches, true>(dst, src);
+        if (srcSize_ < kWindows * n || count_ < n)
+            return walkWindows(count_, srcSize_ / kWindows, toEnd);
+        if constexpr (!std::is_same_v<Store, ThroughCaches>)
+            return walkStreaming<uint32, kPixelBytes>(dst, count_, toEnd,
+                                                      body<Store, true>(dst, src));
+        const auto inside = body<ThroughCaches, false>(dst, src);
+        uint32 i = 0;
+        for (; inner_ - i >= n; i += n)
+            inside(d, i);
+        for (; count_ - i >= n; i += n)
+            toEnd(d, i);
+        if (i != count_)
+            toEnd(d, count_ - n);
+    }
+
+private:
+    template <class By, bool kToEnd>
+    HWY_INLINE NearestBody<kWindows, By, kToEnd> body(uint8 *dst, const uint8 *src) const {
+        return {dst, src, start_, step_, srcSize_};
+    }
+};
+
+#if HWY_TARGET <= HWY_AVX3
+// Elsewhere gathering a vector is slower than reading its pixels one by one.
+template <class Store>
+struct GatherBody {
+    uint8 *dst;
+    const uint8 *src;
+    uint32 start, step;
+
+    template <class D>
+    HWY_INLINE void operator()(D d, size_t i) const {
+        const auto x = positionsFrom(d, start + static_cast<uint32>(i) * step, step);
+        const auto index = hn::BitCast(hn::RebindToSigned<D>(), hn::ShiftRight<16>(x));
+        storePixelsBy<Store>(hn::GatherIndex(d, reinterpret_cast<const uint32 *>(src), index), d,
+                             dst + i * kPixelBytes);
+    }
+};
+#endif
+
+// Any steps.
+template <class Store>
+struct RasterScaleRowSparse : NearestRow {
+    using NearestRow::NearestRow;
+
+    HWY_INLINE void operator()(uint8 *dst, const uint8 *src) const {
+#if HWY_TARGET <= HWY_AVX3
+        const GatherBody<ThroughCaches> body = {dst, src, start_, step_};
+        if constexpr (std::is_same_v<Store, ThroughCaches>)
+            walkAgain<uint32>(inner_, body);
+        else
+            walkStreaming<uint32, kPixelBytes>(dst, inner_, body,
+                                               GatherBody<Store>{dst, src, start_, step_});
+#else
+        pickSingly(dst, src);
+#endif
+        fillBehindInner(dst, src);
+    }
+
+private:
+    // Four a turn, read before they are written: the compiler cannot know that
+    // the rows do not overlap.
+    HWY_INLINE void pickSingly(uint8 *dst, const uint8 *src) const {
+        uint32 x = start_;
+        uint32 i = 0;
+        for (; inner_ - i >= 4; i += 4, x += 4 * step_) {
+            const uint32 a = pixelAt(src, x), b = pixelAt(src, x + step_);
+            const uint32 c = pixelAt(src, x + 2 * step_), d = pixelAt(src, x + 3 * step_);
+            putPixel(dst, i, a);
+            putPixel(dst, i + 1, b);
+            putPixel(dst, i + 2, c);
+            putPixel(dst, i + 3, d);
+        }
+        for (; i < inner_; ++i, x += step_)
+            putPixel(dst, i, pixelAt(src, x));
+    }
+
+    static HWY_INLINE uint32 pixelAt(const uint8 *src, uint32 x) {
+        uint32 pixel = 0;
+        std::memcpy(&pixel, src + size_t{x >> 16} * kPixelBytes, kPixelBytes);
+        return pixel;
+    }
+    static HWY_INLINE void putPixel(uint8 *dst, size_t i, uint32 pixel) {
+        std::memcpy(dst + i * kPixelBytes, &pixel, kPixelBytes);
+    }
 };
 
 struct LinearBody {
