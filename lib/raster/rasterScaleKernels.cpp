@@ -194,30 +194,51 @@ void walkRows(const ScaleJob &job, const Row &row, void *block) {
     }
 }
 
-template <uint32 kWindows>
-void walkClose(const ScaleJob &job) {
+template <template <class Store> class Row>
+void walkNearestBy(const ScaleJob &job) {
     if (isStreamed(job))
-        walkDirect<false>(job, RasterScaleRowClose<kWindows, AroundCaches>(job.x));
+        walkDirect<false>(job, Row<AroundCaches>(job.x));
     else
-        walkDirect<true>(job, RasterScaleRowClose<kWindows, ThroughCaches>(job.x));
+        walkDirect<true>(job, Row<ThroughCaches>(job.x));
 }
+
+template <class Store>
+using RowCloseBy1 = RasterScaleRowClose<1, Store>;
+template <class Store>
+using RowCloseBy2 = RasterScaleRowClose<2, Store>;
+template <class Store>
+using RowCloseBy4 = RasterScaleRowClose<4, Store>;
+template <class Store>
+using RowWholeBy2 = RasterScaleRowWhole<1, Store>;
+template <class Store>
+using RowWholeBy4 = RasterScaleRowWhole<2, Store>;
+template <class Store>
+using RowWholeBy8 = RasterScaleRowWhole<3, Store>;
+
+// From here on reading a row in whole vectors to keep an eighth of it pays.
+constexpr uint32 kLongRow = 128;
 
 // Columns are nearest pixels; where rows are not, too, the columns' step is one.
 void walkNearest(const ScaleJob &job, void *block) {
-    if ((uint64_t{job.x.step} * (job.x.dstSize - 1) + job.x.start) >> 32 != 0)
+    const uint32 step = job.x.step, srcSize = job.x.srcSize;
+    if ((uint64_t{step} * (job.x.dstSize - 1) + job.x.start) >> 32 != 0)
         walkRows(job, RasterScaleRowWrapping(job.x), block);
-    else if (job.x.step == kScaleOne)
+    else if (step == kScaleOne)
         walkRows(job, RasterScaleRowCopy(job.x), block);
-    else if (job.x.step < kScaleOne)
-        walkClose<1>(job);
-    else if (kVectorsAreWide && job.x.step <= 2 * kScaleOne && job.x.srcSize >= 2)
-        walkClose<2>(job);
-    else if (kVectorsAreWide && job.x.step <= 4 * kScaleOne && job.x.srcSize >= 4)
-        walkClose<4>(job);
-    else if (isStreamed(job))
-        walkDirect<false>(job, RasterScaleRowSparse<AroundCaches>(job.x));
+    else if (step < kScaleOne)
+        walkNearestBy<RowCloseBy1>(job);
+    else if (step == 2 * kScaleOne)
+        walkNearestBy<RowWholeBy2>(job);
+    else if (step == 4 * kScaleOne)
+        walkNearestBy<RowWholeBy4>(job);
+    else if (step == 8 * kScaleOne && job.x.dstSize >= kLongRow)
+        walkNearestBy<RowWholeBy8>(job);
+    else if (kVectorsAreWide && step <= 2 * kScaleOne && srcSize >= 2)
+        walkNearestBy<RowCloseBy2>(job);
+    else if (kVectorsAreWide && step <= 4 * kScaleOne && srcSize >= 4)
+        walkNearestBy<RowCloseBy4>(job);
     else
-        walkDirect<true>(job, RasterScaleRowSparse<ThroughCaches>(job.x));
+        walkNearestBy<RasterScaleRowSparse>(job);
 }
 
 template <class Store>

@@ -116,6 +116,62 @@ private:
     }
 };
 
+// Of 2^kDoublings pixels the first.
+template <uint32 kDoublings, class Store>
+struct FirstOfEachBody {
+    uint8 *dst;
+    const uint8 *src;
+
+    template <class D>
+    HWY_INLINE void operator()(D d, size_t i) const {
+        storePixelsBy<Store>(firstOfEach<kDoublings>(d, src + (i << kDoublings) * kPixelBytes), d,
+                             dst + i * kPixelBytes);
+    }
+
+private:
+    template <uint32 k, class D>
+    static HWY_INLINE hn::Vec<D> firstOfEach(D d, const uint8 *from) {
+        if constexpr (k == 0) {
+            return loadPixels(d, from);
+        } else {
+            const size_t half = (kLanes<D> << (k - 1)) * kPixelBytes;
+            return Neighbours<D>(d, firstOfEach<k - 1>(d, from), firstOfEach<k - 1>(d, from + half))
+                .left;
+        }
+    }
+};
+
+// Steps of 2^kDoublings pixels.
+template <uint32 kDoublings, class Store>
+struct RasterScaleRowWhole : NearestRow {
+    explicit RasterScaleRowWhole(const ScaleAxis &axis)
+        : NearestRow(axis), first_(axis.start >> 16),
+          whole_(std::min((axis.srcSize - std::min(first_, axis.srcSize)) >> kDoublings,
+                          axis.dstSize)) {}
+
+    HWY_INLINE void operator()(uint8 *dst, const uint8 *src) const {
+        const uint8 *from = src + size_t{first_} * kPixelBytes;
+        const FirstOfEachBody<kDoublings, ThroughCaches> body = {dst, from};
+        if constexpr (std::is_same_v<Store, ThroughCaches>)
+            walkAgain<uint32>(whole_, body);
+        else
+            walkStreaming<uint32, kPixelBytes>(dst, whole_, body,
+                                               FirstOfEachBody<kDoublings, Store>{dst, from});
+        if (whole_ != count_)
+            writeEnd(dst, src);
+    }
+
+private:
+    // The pixel whose step reaches behind the row, and copies of the last one.
+    HWY_NOINLINE void writeEnd(uint8 *dst, const uint8 *src) const {
+        const size_t index = size_t{first_} + (size_t{whole_} << kDoublings);
+        fillPixels(dst + size_t{whole_} * kPixelBytes, src, index, inner_ - whole_);
+        fillBehindInner(dst, src);
+    }
+
+    uint32 first_, whole_; // whole: pixels whose steps lie in the row
+};
+
 #if HWY_TARGET <= HWY_AVX3
 // Elsewhere gathering a vector is slower than reading its pixels one by one.
 template <class Store>
