@@ -111,9 +111,15 @@ bool isEmptyList(const RasterRectList &list) {
 }
 
 bool isZeroFrom(const RasterRectList &list, int slot) {
-    static constexpr RasterRectListEntry kNone[kSlots] = {};
-    return std::memcmp(list.entries + slot, kNone,
-                       static_cast<size_t>(kSlots - slot) * sizeof(kNone[0])) == 0;
+    // Field by field, so that one instruction takes an entry.
+    RasterRectListEntry bits = {};
+    for (; slot < kSlots; ++slot) {
+        bits.x |= list.entries[slot].x;
+        bits.y |= list.entries[slot].y;
+        bits.width |= list.entries[slot].width;
+        bits.height |= list.entries[slot].height;
+    }
+    return (bits.x | bits.y | bits.width | bits.height) == 0;
 }
 
 // Whether a list that is not empty has one entry and is in normal form.
@@ -363,17 +369,20 @@ Rect *appendJoinedRows(const Survey &survey, const Rect &rect, Pieces &pieces) {
     for (int32 y = rect.top; y < rect.bottom;) {
         while (alive != wide.end() && alive->bottom <= y)
             ++alive;
-        Rect band = {.left = rect.left, .top = y, .right = rect.right, .bottom = rect.bottom};
+        // Edges by themselves: a box changed field by field, and then copied
+        // whole, would keep the processor waiting.
+        int32 left = rect.left, right = rect.right, bottom = rect.bottom;
         const Rect *box = alive;
         for (; box != wide.end() && box->top <= y; ++box) {
             if (box->bottom <= y)
                 continue;
-            band.bottom = std::min(band.bottom, box->bottom);
-            band.left = std::min(band.left, box->left);
-            band.right = std::max(band.right, box->right);
+            bottom = std::min(bottom, box->bottom);
+            left = std::min(left, box->left);
+            right = std::max(right, box->right);
         }
         if (box != wide.end())
-            band.bottom = std::min(band.bottom, box->top);
+            bottom = std::min(bottom, box->top);
+        const Rect band = {.left = left, .top = y, .right = right, .bottom = bottom};
         // The first band may continue any piece above, the others only the band
         // before.
         if (piece == nullptr)
@@ -390,21 +399,20 @@ Rect *appendJoinedRows(const Survey &survey, const Rect &rect, Pieces &pieces) {
 
 void makeAddedPieces(const Survey &survey, const Rect &rect, Pieces &pieces) {
     for (int i = 0; i < survey.nearCount; ++i) {
-        Rect box = survey.nearBox(i);
-        box.bottom = std::min(box.bottom, rect.top);
-        if (box.top < box.bottom)
-            pieces.append(box);
+        const Rect &box = survey.nearBox(i);
+        if (box.top < rect.top)
+            pieces.append({box.left, box.top, box.right, std::min(box.bottom, rect.top)});
     }
     Rect *const last = appendJoinedRows(survey, rect, pieces);
     for (int i = 0; i < survey.nearCount; ++i) {
-        Rect box = survey.nearBox(i);
-        box.top = std::max(box.top, rect.bottom);
-        if (box.top >= box.bottom)
+        const Rect &box = survey.nearBox(i);
+        if (box.bottom <= rect.bottom)
             continue;
         if (haveSameColumns(*last, box))
             last->bottom = box.bottom;
         else
-            insertInOrder(pieces, box);
+            insertInOrder(pieces,
+                          {box.left, std::max(box.top, rect.bottom), box.right, box.bottom});
     }
 }
 
