@@ -49,8 +49,16 @@ struct HalfBody {
 };
 
 // Averages of two by two pixels, by halves in both directions: a row counts 255
-// of 256, which takes one off a channel that is not 0.
+// of 256, which takes one off a channel that is not 0.  All pixels are handed
+// over as their complements, of which the average that is rounded up is the one
+// rounded down.
 struct QuarterMix {
+    template <class D>
+    static HWY_INLINE Neighbours<D> complementsAt(D d, const uint8 *from) {
+        return {d, hn::Not(loadPixels(d, from)),
+                hn::Not(loadPixels(d, from + kLanes<D> * kPixelBytes))};
+    }
+
     template <class D>
     static HWY_INLINE hn::Vec<D> of([[maybe_unused]] D d, const Neighbours<D> &upper,
                                     const Neighbours<D> &lower) {
@@ -58,19 +66,17 @@ struct QuarterMix {
         ChannelSums<D> sums;
         for (const Neighbours<D> &row : {upper, lower}) {
             ChannelSums<D> pair;
-            pair.add(row.left);
-            pair.add(row.right);
+            pair.add(hn::Not(row.left));
+            pair.add(hn::Not(row.right));
             sums.add(pair.average(kScaleOne / 2), ChannelPairs<D>::weight(255));
         }
         return sums.average(kScaleOne / 2);
 #else
-        // Of complements the average that is rounded up is the one rounded down.
         const hn::Repartition<uint8, D> d8;
         const auto one = hn::Set(d8, uint8{1});
         const auto row = [&](const Neighbours<D> &pixels) HWY_ATTR {
-            const auto left = hn::Not(hn::BitCast(d8, pixels.left));
-            const auto right = hn::Not(hn::BitCast(d8, pixels.right));
-            return hn::SaturatedAdd(hn::AverageRound(left, right), one);
+            return hn::SaturatedAdd(
+                hn::AverageRound(hn::BitCast(d8, pixels.left), hn::BitCast(d8, pixels.right)), one);
         };
         return hn::BitCast(d, hn::Not(hn::AverageRound(row(upper), row(lower))));
 #endif
@@ -88,11 +94,13 @@ struct QuarterBody {
     template <class D>
     HWY_INLINE void operator()(D d, size_t i) const {
         const size_t offset = 2 * i * kPixelBytes;
-        Neighbours<D> above(d, upper + offset), below(d, lower + offset);
+        auto above = QuarterMix::complementsAt(d, upper + offset);
+        auto below = QuarterMix::complementsAt(d, lower + offset);
         if constexpr (kToEnd) {
             const auto isWhole = hn::Lt(hn::Iota(d, 0), hn::Set(d, whole - static_cast<uint32>(i)));
-            above.right = hn::IfThenElseZero(isWhole, above.right);
-            below.right = hn::IfThenElseZero(isWhole, below.right);
+            const auto black = hn::Set(d, 0xFFFFFFFFu); // its complement
+            above.right = hn::IfThenElse(isWhole, above.right, black);
+            below.right = hn::IfThenElse(isWhole, below.right, black);
         }
         storePixelsBy<Store>(QuarterMix::of(d, above, below), d, dst + i * kPixelBytes);
     }
@@ -141,7 +149,8 @@ private:
     HWY_NOINLINE void copyLast(uint8 *dst, const uint8 *upper, const uint8 *lower) const {
         const hn::CappedTag<uint32, 1> d;
         const size_t offset = size_t{last_} * kPixelBytes;
-        const auto above = loadPixels(d, upper + offset), below = loadPixels(d, lower + offset);
+        const auto above = hn::Not(loadPixels(d, upper + offset));
+        const auto below = hn::Not(loadPixels(d, lower + offset));
         const auto mixed = QuarterMix::of(d, {d, above, above}, {d, below, below});
         walkAgain<uint32>(count_ - averaged_,
                           FillBody{dst + size_t{averaged_} * kPixelBytes, hn::GetLane(mixed)});
