@@ -53,10 +53,11 @@ struct HalfBody {
 // over as their complements, of which the average that is rounded up is the one
 // rounded down.
 struct QuarterMix {
-    template <class D>
+    template <bool kInOrder, class D>
     static HWY_INLINE Neighbours<D> complementsAt(D d, const uint8 *from) {
-        return {d, hn::Not(loadPixels(d, from)),
-                hn::Not(loadPixels(d, from + kLanes<D> * kPixelBytes))};
+        const auto low = hn::Not(loadPixels(d, from));
+        const auto high = hn::Not(loadPixels(d, from + kLanes<D> * kPixelBytes));
+        return kInOrder ? Neighbours<D>(d, low, high) : Neighbours<D>::unordered(d, low, high);
     }
 
     template <class D>
@@ -94,15 +95,18 @@ struct QuarterBody {
     template <class D>
     HWY_INLINE void operator()(D d, size_t i) const {
         const size_t offset = 2 * i * kPixelBytes;
-        auto above = QuarterMix::complementsAt(d, upper + offset);
-        auto below = QuarterMix::complementsAt(d, lower + offset);
+        auto above = QuarterMix::complementsAt<kToEnd>(d, upper + offset);
+        auto below = QuarterMix::complementsAt<kToEnd>(d, lower + offset);
         if constexpr (kToEnd) {
             const auto isWhole = hn::Lt(hn::Iota(d, 0), hn::Set(d, whole - static_cast<uint32>(i)));
             const auto black = hn::Set(d, 0xFFFFFFFFu); // its complement
             above.right = hn::IfThenElse(isWhole, above.right, black);
             below.right = hn::IfThenElse(isWhole, below.right, black);
         }
-        storePixelsBy<Store>(QuarterMix::of(d, above, below), d, dst + i * kPixelBytes);
+        auto mixed = QuarterMix::of(d, above, below);
+        if constexpr (!kToEnd)
+            mixed = Neighbours<D>::inOrder(mixed);
+        storePixelsBy<Store>(mixed, d, dst + i * kPixelBytes);
     }
 };
 

@@ -166,6 +166,28 @@ struct Neighbours {
             right = ConcatOdd(d, high, low);
         }
     }
+
+    // In any order that is the same for all; inOrder brings it back.
+    static HWY_INLINE Neighbours unordered(D d, hn::Vec<D> low, hn::Vec<D> high) {
+        Neighbours pixels(d, low, high);
+#if HWY_TARGET == HWY_AVX2
+        // What crosses the middle of a vector takes longer.
+        if constexpr (kLanes<D> == 8) {
+            const auto a = _mm256_castsi256_ps(low.raw), b = _mm256_castsi256_ps(high.raw);
+            pixels.left.raw = _mm256_castps_si256(_mm256_shuffle_ps(a, b, 0x88));
+            pixels.right.raw = _mm256_castps_si256(_mm256_shuffle_ps(a, b, 0xDD));
+        }
+#endif
+        return pixels;
+    }
+
+    static HWY_INLINE hn::Vec<D> inOrder(hn::Vec<D> pixels) {
+#if HWY_TARGET == HWY_AVX2
+        if constexpr (kLanes<D> == 8)
+            return hn::Vec<D>{_mm256_permute4x64_epi64(pixels.raw, 0xD8)};
+#endif
+        return pixels;
+    }
 };
 
 // Weighted sums of pixels, every product truncated by itself.
