@@ -10,14 +10,16 @@
 
 namespace quillon::bench {
 
-// The sizes that everything is measured at.
 struct Area {
     const char *name;
     uint32 width, height;
-    uint32 surfaceWidth; // pixels from one row to the next; 0: the rows lie end to end
-    bool uncached;       // each call works on memory that has left every cache
+    uint32 surfaceWidth;  // pixels from one row to the next; 0: the rows lie end to end
+    bool uncached;        // each call works on memory that has left every cache
+    uint32 offset = 0;    // bytes by which every buffer starts later
+    uint32 extraStep = 0; // bytes that rows lie further apart
 };
 
+// The sizes that everything is measured at.
 inline constexpr Area kAreas[] = {
     {"32x32", 32, 32, 1920, false},
     {"256x128", 256, 128, 0, false},
@@ -34,10 +36,12 @@ struct Plane {
     uint32 bitsPerPixel;
     uint32 surfaceWidth;
     Content content;
+    uint32 offset, extraStep; // as in Area
 
     size_t rowBytes() const { return (size_t{width} * bitsPerPixel + 7) / 8; }
     size_t step() const {
-        return surfaceWidth == 0 ? rowBytes() : (size_t{surfaceWidth} * bitsPerPixel + 7) / 8;
+        const size_t width8 = size_t{surfaceWidth} * bitsPerPixel + 7;
+        return (surfaceWidth == 0 ? rowBytes() : width8 / 8) + extraStep;
     }
     size_t bytes() const { return step() * (height - 1) + rowBytes(); }
 };

@@ -2,7 +2,9 @@
 #include "operations/operations.h"
 #include "peers/peers.h"
 #include "report.h"
+#include "shapes.h"
 
+#include <hwy/targets.h>
 #include <sched.h>
 #include <unistd.h>
 
@@ -25,11 +27,47 @@ void pinToOneCore() {
 
 Plan makePlan() {
     Plan plan;
-    for (const auto add : {addFills, addCopies, addBlends, addBits, addConversions, addScaling,
-                           addVideo, addRectLists, addImages})
-        add(plan);
+    for (const Area &area : kAreas)
+        addPixelOperations(plan, area);
+    addRectLists(plan);
+    addImages(plan);
     addPeers(plan);
     return plan;
+}
+
+// Whether there is an instruction set of that name; if so, no other one is used.
+bool useTarget(const std::string &name) {
+    for (const int64_t target : hwy::SupportedAndGeneratedTargets()) {
+        if (name == hwy::TargetName(target)) {
+            hwy::SetSupportedTargetsForTest(target);
+            return true;
+        }
+    }
+    return false;
+}
+
+struct Arguments {
+    std::string reportFolder;
+    bool sweep = false, growth = false;
+};
+
+// What Google Benchmark leaves over; false where there is something unknown.
+bool parse(int count, char **arguments, Arguments &parsed) {
+    for (int i = 1; i < count; ++i) {
+        const std::string argument = arguments[i];
+        const auto valueOf = [&](const std::string &name) {
+            return argument.rfind(name, 0) == 0 ? argument.substr(name.size()) : "";
+        };
+        if (argument == "--sweep")
+            parsed.sweep = true;
+        else if (argument == "--growth")
+            parsed.growth = true;
+        else if (!valueOf("--report=").empty())
+            parsed.reportFolder = valueOf("--report=");
+        else if (valueOf("--target=").empty() || !useTarget(valueOf("--target=")))
+            return false;
+    }
+    return true;
 }
 
 } // namespace
@@ -37,15 +75,13 @@ Plan makePlan() {
 int main(int argc, char **argv) {
     pinToOneCore();
     benchmark::Initialize(&argc, argv);
-    // What is left over is ours: --report=FOLDER.
-    std::string reportFolder;
-    for (int i = 1; i < argc; ++i) {
-        const std::string argument = argv[i];
-        if (argument.rfind("--report=", 0) == 0)
-            reportFolder = argument.substr(9);
-        else
-            return benchmark::ReportUnrecognizedArguments(argc, argv), 1;
-    }
+    Arguments arguments;
+    if (!parse(argc, argv, arguments))
+        return benchmark::ReportUnrecognizedArguments(argc, argv), 1;
+    if (arguments.sweep)
+        return sweep();
+    if (arguments.growth)
+        return growth(arguments.reportFolder);
 
     const Plan plan = makePlan();
     std::vector<Result> results;
@@ -53,8 +89,8 @@ int main(int argc, char **argv) {
     Reporter reporter(results);
     benchmark::RunSpecifiedBenchmarks(&reporter);
     printSummary(results);
-    if (!reportFolder.empty())
-        writeReport(results, reportFolder);
+    if (!arguments.reportFolder.empty())
+        writeReport(results, arguments.reportFolder);
     benchmark::Shutdown();
     return 0;
 }

@@ -18,13 +18,6 @@ constexpr size_t kLeft = 100;
 // different distances from a page, and in the surface at kLeft.
 constexpr size_t kSlack = 1024;
 
-size_t placeBytes(const Operation &operation) {
-    size_t bytes = 0;
-    for (const Plane &plane : operation.planes)
-        bytes += (plane.bytes() + kSlack + kPage - 1) / kPage * kPage;
-    return bytes;
-}
-
 // The memory that all operations share, one after the other.
 uint8 *arena() {
     static uint8 *const memory = [] {
@@ -41,7 +34,8 @@ uint8 *arena() {
 } // namespace
 
 Plane plane(const Area &area, uint32 bitsPerPixel, const Content &content) {
-    return {area.width, area.height, bitsPerPixel, area.surfaceWidth, content};
+    return {area.width, area.height, bitsPerPixel,  area.surfaceWidth,
+            content,    area.offset, area.extraStep};
 }
 
 size_t arenaBytes() {
@@ -51,8 +45,15 @@ size_t arenaBytes() {
     return std::clamp(2 * static_cast<size_t>(std::max(lastCache, 0L)), kLeast, kMost);
 }
 
+size_t Places::bytesOf(const Operation &operation) {
+    size_t bytes = 0;
+    for (const Plane &plane : operation.planes)
+        bytes += (plane.bytes() + kSlack + kPage - 1) / kPage * kPage;
+    return bytes;
+}
+
 Places::Places(const Operation &operation) : dstPlane(operation.planes.front()) {
-    const size_t bytes = placeBytes(operation);
+    const size_t bytes = bytesOf(operation);
     if (bytes > arenaBytes())
         throw std::runtime_error(operation.name + " is larger than the memory for it");
     const size_t places = operation.area.uncached ? arenaBytes() / bytes : 1;
@@ -64,8 +65,9 @@ Places::Places(const Operation &operation) : dstPlane(operation.planes.front()) 
         for (size_t p = 0; p < operation.planes.size(); ++p) {
             const Plane &plane = operation.planes[p];
             const size_t left = plane.surfaceWidth == 0 ? 0 : kLeft * plane.bitsPerPixel / 8;
-            const Buffer buffer = {next + (p + 1) * 64 + left, plane.step(), plane.width,
-                                   plane.height, plane.rowBytes()};
+            const size_t start = (p + 1) * 64 + left + plane.offset;
+            const Buffer buffer = {next + start, plane.step(), plane.width, plane.height,
+                                   plane.rowBytes()};
             (p == 0 ? job.dst : job.sources[p - 1]) = buffer;
             if (place == 0)
                 plane.content(buffer.data, plane.bytes());

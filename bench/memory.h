@@ -12,6 +12,9 @@ class Places {
 public:
     explicit Places(const Operation &operation);
 
+    // What one place takes; not more than arenaBytes().
+    static size_t bytesOf(const Operation &operation);
+
     size_t count() const { return jobs.size(); }
     const Job &job(size_t place) const { return jobs[place]; }
 

@@ -11,6 +11,7 @@
 #include <sys/stat.h>
 #include <sys/time.h>
 #include <thread>
+#include <tuple>
 #include <unistd.h>
 
 // Under a sanitizer: null for what cannot be had, as everywhere else.
@@ -34,27 +35,21 @@ TEST(Hearth, Messages) {
 TEST(Hearth, Memory) {
     EXPECT_EQ(UtilSafeMalloc0(0), nullptr);
     EXPECT_EQ(UtilSafeCalloc0(0, 8), nullptr);
-    EXPECT_EQ(UtilSafeCalloc0(8, 0), nullptr);
     EXPECT_EQ(UtilSafeMalloc0(kHuge), nullptr);
     EXPECT_EQ(UtilSafeCalloc0(kHuge / 2, 4), nullptr); // 4 fewer than nothing, wrapped
 
     DynBuf buffer;
-    std::memset(&buffer, 0x5A, sizeof buffer);
     DynBuf_Init(&buffer);
     std::string expected;
     for (size_t length = 0; length < 3000; length = length * 5 / 4 + 1) {
         const std::string part(length, static_cast<char>('a' + length % 26));
         ASSERT_TRUE(DynBuf_Append(&buffer, part.data(), length));
         expected += part;
-        ASSERT_EQ(std::string(buffer.data, buffer.size), expected);
-        ASSERT_LE(buffer.size, buffer.allocated);
     }
-    const DynBuf before = buffer;
     EXPECT_FALSE(DynBuf_Append(&buffer, "x", kHuge));     // the size would wrap
     EXPECT_FALSE(DynBuf_Append(&buffer, "x", kHuge / 2)); // no such block
-    EXPECT_EQ(std::memcmp(&buffer, &before, sizeof buffer), 0);
+    EXPECT_EQ(std::string(buffer.data, buffer.data + buffer.size), expected);
     DynBuf_Destroy(&buffer);
-    EXPECT_EQ(buffer.data, nullptr);
     DynBuf_Destroy(&buffer);
 }
 
@@ -71,46 +66,36 @@ struct HearthFile : testing::Test {
 };
 
 TEST_F(HearthFile, OpensAndCreates) {
-    const struct {
-        int access, action;
-        std::string text, content;
-    } steps[] = {
-        {FILEIO_ACCESS_WRITE, FILEIO_OPEN_CREATE, "a long text", "a long text"},
-        {FILEIO_ACCESS_WRITE, FILEIO_OPEN, "A", "A long text"},
-        {FILEIO_ACCESS_READ | FILEIO_ACCESS_WRITE, FILEIO_OPEN_CREATE, "short", "short"},
-    };
+    const std::tuple<int, std::string, std::string> steps[] = {
+        {FILEIO_OPEN_CREATE, "a long text", "a long text"},
+        {FILEIO_OPEN, "A", "A long text"},
+        {FILEIO_OPEN_CREATE, "short", "short"}};
     EXPECT_EQ(open(FILEIO_ACCESS_WRITE, FILEIO_OPEN), ENOENT);
-    for (const auto &step : steps) {
+    for (const auto &[action, text, content] : steps) {
+        std::string found(100, '\0');
         size_t actual = 0;
-        ASSERT_EQ(open(step.access, step.action), 0);
-        EXPECT_EQ(FileIO_Write(&file, step.text.data(), step.text.size(), &actual), 0);
-        EXPECT_EQ(actual, step.text.size());
+        ASSERT_EQ(open(FILEIO_ACCESS_WRITE, action), 0);
+        EXPECT_EQ(FileIO_Write(&file, text.data(), text.size(), &actual), 0);
+        EXPECT_EQ(actual, text.size());
         EXPECT_EQ(FileIO_Close(&file), 0);
-        std::string content(100, '\0');
-        ASSERT_EQ(open(FILEIO_ACCESS_READ, FILEIO_OPEN), 0);
-        EXPECT_EQ(FileIO_Read(&file, content.data(), content.size(), &actual), 0);
-        EXPECT_EQ(FileIO_GetSize(&file), static_cast<int64_t>(actual));
+        ASSERT_EQ(open(FILEIO_ACCESS_READ | FILEIO_ACCESS_WRITE, FILEIO_OPEN), 0);
+        EXPECT_EQ(FileIO_GetSize(&file), std::ssize(content));
+        EXPECT_EQ(FileIO_Read(&file, found.data(), found.size(), &actual), 0);
         EXPECT_EQ(FileIO_Close(&file), 0);
-        EXPECT_EQ(content.substr(0, actual), step.content);
+        EXPECT_EQ(found.substr(0, actual), content);
     }
 }
 
 TEST_F(HearthFile, SaysWhatIsWrong) {
-    EXPECT_EQ(open(0, FILEIO_OPEN), EINVAL);
-    EXPECT_EQ(open(FILEIO_ACCESS_READ, 1), EINVAL);
-    EXPECT_EQ(FileIO_Open(&file, "/", FILEIO_ACCESS_WRITE, FILEIO_OPEN), EISDIR);
-    EXPECT_EQ(file.fd, -1);
-
     char byte = 0;
     size_t actual = 7;
+    EXPECT_EQ(open(0, FILEIO_OPEN), EINVAL);
+    EXPECT_EQ(open(FILEIO_ACCESS_READ, 1), EINVAL);
     EXPECT_EQ(FileIO_GetSize(&file), -1);
     EXPECT_EQ(FileIO_Read(&file, &byte, 1, &actual), EBADF);
     EXPECT_EQ(actual, 0u);
-    EXPECT_EQ(FileIO_Close(&file), 0);
     EXPECT_EQ(FileIO_Open(&file, "/dev/full", FILEIO_ACCESS_WRITE, FILEIO_OPEN), 0);
     EXPECT_EQ(FileIO_Write(&file, &byte, 1, nullptr), ENOSPC);
-
-    EXPECT_STREQ(FileIO_ErrorEnglish(0), "Success");
     EXPECT_STREQ(FileIO_ErrorEnglish(ENOENT), "No such file or directory");
     EXPECT_STREQ(FileIO_ErrorEnglish(-12345), "Unknown error");
 }
@@ -127,7 +112,6 @@ TEST_F(HearthFile, GoesOnOverShortAndInterruptedTransfers) {
     size_t written = 0, actual = 0;
     ASSERT_EQ(mkfifo(path.c_str(), 0600), 0);
     std::thread reader([&] {
-        usleep(20000);
         FileIODescriptor pipe;
         EXPECT_EQ(FileIO_Open(&pipe, path.c_str(), FILEIO_ACCESS_READ, FILEIO_OPEN), 0);
         usleep(20000); // while the other side waits for room

@@ -1,7 +1,6 @@
 // Bit and stencil expansion against their reference.
 
 #include "raster.h"
-#include "reference/bits.h"
 #include "support/messages.h"
 #include "support/surfaces.h"
 
@@ -23,64 +22,68 @@ Operation expansion(Random &random, bool isStencil) {
     const uint32 member = random.below(4), pixel = random.word(), background = random.word();
     const auto bytes = static_cast<int32>(member + 1);
     const bool isNamed = random.oneIn(2);
-    const auto call = [=](bool isReference, const Surfaces &at, Size size) {
-        const auto expand = [&](auto function, auto... rest) {
-            function(at[1].first, at[1].signedLine(), at[0].first, at[0].signedLine(), rest...);
-        };
-        const auto width = static_cast<int32>(size.width);
-        if (isNamed && !isReference)
-            return isStencil ? expand(kStencil[member], width, size.height, pixel)
-                             : expand(kOpaque[member], width, size.height, pixel, background);
-        if (isStencil)
-            expand(isReference ? reference::bitsToPixelsStencil : Raster_BitsToPixelsStencil, bytes,
-                   width, size.height, pixel);
-        else
-            expand(isReference ? reference::bitsToPixels : Raster_BitsToPixels, bytes, width,
-                   size.height, pixel, background);
-    };
-    Operation operation((isStencil ? "stencil " : "opaque ") + std::to_string(bytes),
-                        {{.bytes = member + 1}, {.bytes = 0}}, false, true, call);
-    operation.mayOverlap = false;
-    if (random.oneIn(4)) { // all bits alike
-        operation.parts[1].low = random.oneOf({0u, 0xFFu});
-        operation.parts[1].count = 1;
-    }
-    return operation;
+    const uint32 low = random.oneOf({0u, 0u, 0u, 0xFFu}), count = low == 0 ? 256 : 1;
+    return {(isStencil ? "stencil " : "opaque ") + std::to_string(bytes),
+            {{.bytes = member + 1}, {.bytes = 0, .low = low, .count = count}},
+            [=](const Surfaces &at, Size size) {
+                const auto expand = [&](auto function, auto... rest) {
+                    function(at[1].first, at[1].signedLine(), at[0].first, at[0].signedLine(),
+                             rest...);
+                };
+                const auto width = static_cast<int32>(size.width);
+                if (isStencil && isNamed)
+                    expand(kStencil[member], width, size.height, pixel);
+                else if (isStencil)
+                    expand(Raster_BitsToPixelsStencil, bytes, width, size.height, pixel);
+                else if (isNamed)
+                    expand(kOpaque[member], width, size.height, pixel, background);
+                else
+                    expand(Raster_BitsToPixels, bytes, width, size.height, pixel, background);
+            },
+            [=](const Pixels &old) {
+                const uint32 clear = isStencil ? old[0] : background;
+                return old[1] != 0 ? pixel : clear;
+            },
+            Walk::kForwards,
+            false};
 }
 
 TEST(BitsToPixels, matchesReference) {
-    clearMessages();
+    warnings.clear();
     holdToReference(16000, [](Random &random) { return expansion(random, random.oneIn(2)); });
-    EXPECT_TRUE(warnings().empty());
+    EXPECT_TRUE(warnings.empty());
 }
 
 // A page of which pixels under set bits are part, amid inaccessible ones where
 // all bits are clear.
 TEST(BitsToPixelsStencil, touchesNoPageWhereAllBitsAreClear) {
-    TwinMemory page(pageSize(), 1, 0);
-    std::vector<uint8> bitmap(64);
+    const FencedBuffer page(pageSize());
+    const auto end = static_cast<int32>(page.size());
     forEachTarget([&] {
         forEachCase(6000, [&](Random &random) {
             const Operation call = expansion(random, true);
             const auto bytes = static_cast<int32>(call.parts[0].bytes);
-            const int32 width = 1 + static_cast<int32>(random.below(300));
-            const auto size = static_cast<int32>(page.runBytes());
+            const auto width = random.between(1, 300);
             // The first byte's place in the page, across one of its ends.
-            const int32 start = random.oneOf({0, size}) - random.between(0, width * bytes);
+            const int32 start = random.oneOf({0, end}) - random.between(0, width * bytes);
+            std::vector<uint8> bitmap(64);
             random.fill(bitmap.data(), bitmap.size());
-            for (int32 x = 0; x < width; ++x) {
-                const int32 at = start + x * bytes;
-                if (at < 0 || at + bytes > size)
-                    bitmap[static_cast<size_t>(x / 8)] &= static_cast<uint8>(~(0x80 >> x % 8));
+            random.fill(page.data(), page.size());
+            std::vector<uint8> expected(page.data(), page.end());
+            for (int32 x = 0, at = start; x < width; ++x, at += bytes) {
+                uint8 &bits = bitmap[static_cast<size_t>(x / 8)];
+                const auto bit = static_cast<uint8>(0x80 >> x % 8);
+                if (at < 0 || at + bytes > end)
+                    bits &= static_cast<uint8>(~bit);
+                const uint32 pixel = call.reference({0, 1});
+                if ((bits & bit) != 0)
+                    std::memcpy(&expected[static_cast<size_t>(at)], &pixel, call.parts[0].bytes);
             }
-            page.refill(random);
-            const auto run = [&](const auto &function, uint8 *first) {
-                function({{nullptr, first + start, 0, 0, 0}, {nullptr, bitmap.data(), 0, 0, 0}},
-                         {static_cast<uint32>(width), 1});
-            };
-            run(call.library, page.run(0));
-            run(call.reference, page.inModel(page.run(0)));
-            EXPECT_TRUE(page.agree()) << call.name << ", from byte " << start << " of the page";
+            call.library(
+                {{nullptr, page.data() + start, 0, 0, 0}, {nullptr, bitmap.data(), 0, 0, 0}},
+                {static_cast<uint32>(width), 1});
+            EXPECT_TRUE(std::equal(page.data(), page.end(), expected.begin()))
+                << call.name << ", from byte " << start << " of the page";
         });
     });
 }
@@ -124,28 +127,17 @@ TEST(BitsToPixelsStencil, leavesClearPixelsToAnotherThread) {
 TEST(BitsToPixels, touchesNothingWhereThereIsNothingToDo) {
     const FencedBuffer fence(1);
     uint8 *nowhere = fence.end();
-    clearMessages();
-    const auto call = [&](int32 bytes, int32 width, uint32 height) {
-        Raster_BitsToPixels(nowhere, 8, nowhere, 64, bytes, width, height, 1, 2);
-        Raster_BitsToPixelsStencil(nowhere, 8, nowhere, 64, bytes, width, height, 1);
+    warnings.clear();
+    const auto call = [&](int32 bytes, int32 width) {
+        Raster_BitsToPixels(nowhere, 8, nowhere, 64, bytes, width, 9, 1, 2);
+        Raster_BitsToPixelsStencil(nowhere, 8, nowhere, 64, bytes, width, 9, 1);
     };
     for (const int32 bytes : {1, 2, 3, 4})
         for (const int32 width : {-1, -8, INT32_MIN})
-            call(bytes, width, 1000);
-    for (const int32 bytes : {0, 5, -1, 8, 32, 0x101, INT32_MIN, INT32_MAX})
-        call(bytes, 9, 2);
-    EXPECT_TRUE(warnings().empty());
-}
-
-TEST(BitsToPixels, knownValues) {
-    // The leftmost pixel is the high bit; the second row begins at byte 7
-    // exactly, on top of the first one's end.
-    const uint8 bitmap[] = {0xA5, 0x5F};
-    const std::vector<uint8> expected = {0xD4, 0xC3, 0xB2, 0xA1, 4,    3,    2,    4,
-                                         3,    2,    1,    0xD4, 0xC3, 0xB2, 0xA1, 0};
-    std::vector<uint8> words(expected.size());
-    Raster_BitsToPixels(bitmap, 1, words.data(), 7, 4, 2, 2, 0xA1B2C3D4, 0x01020304);
-    EXPECT_EQ(words, expected);
+            call(bytes, width);
+    for (const int32 bytes : {0, 5, -1, 8, 0x101, INT32_MIN, INT32_MAX})
+        call(bytes, 9);
+    EXPECT_TRUE(warnings.empty());
 }
 
 } // namespace

@@ -7,7 +7,6 @@
 #include <algorithm>
 #include <cstring>
 #include <limits>
-#include <regex>
 #include <vector>
 
 using namespace quillon::test;
@@ -101,14 +100,11 @@ uint32 model(RasterRectList &list, const Entry &rect, bool isAdding) {
     if (entries.size() > 15) {
         if (!isAdding)
             return 0;
-        Entry box = rect;
-        for (const Entry &e : all) {
-            const int32 right = std::max(box.x + box.width, e.x + e.width);
-            const int32 bottom = std::max(box.y + box.height, e.y + e.height);
-            const int32 left = std::min(box.x, e.x), top = std::min(box.y, e.y);
-            box = {left, top, right - left, bottom - top};
-        }
-        entries = {box};
+        Rect box = {rect.x, rect.y, rect.x + rect.width, rect.y + rect.height};
+        for (const Entry &e : all)
+            box = {std::min(box.left, e.x), std::min(box.top, e.y),
+                   std::max(box.right, e.x + e.width), std::max(box.bottom, e.y + e.height)};
+        entries = {{box.left, box.top, box.right - box.left, box.bottom - box.top}};
     }
     list = listOf(entries);
     return areaOf(entries);
@@ -161,11 +157,11 @@ struct Placement {
         }
     }
     Entry operator()(const Entry &e) const {
-        const auto place = [](int32 start, int32 cells, int32 cellSize) {
-            return int32(uint32(start) + uint32(cells) * uint32(cellSize));
+        const auto place = [&](int axis, int32 cells, int32 start) {
+            return int32(uint32(start) + uint32(cells) * uint32(size[axis]));
         };
-        return {place(origin[0], e.x, size[0]), place(origin[1], e.y, size[1]),
-                place(0, e.width, size[0]), place(0, e.height, size[1])};
+        return {place(0, e.x, origin[0]), place(1, e.y, origin[1]), place(0, e.width, 0),
+                place(1, e.height, 0)};
     }
     // What lies behind the end stays.
     RasterRectList operator()(RasterRectList list) const {
@@ -180,6 +176,8 @@ TEST(RectList, agreesWithABitmap) {
         const Placement placement(random);
         RasterRectList cells = random.oneIn(2) ? randomList(random) : RasterRectList{};
         for (int step = 0; step < 30 && !testing::Test::HasFailure(); ++step) {
+            if (random.oneIn(30))
+                Raster_ClearRectList(&cells);
             if (random.oneIn(8))
                 disturb(random, cells);
             Entry rect = randomRect(random);
@@ -197,18 +195,6 @@ TEST(RectList, agreesWithABitmap) {
     });
 }
 
-TEST(RectList, theSixteenthEntryIsTooMany) {
-    RasterRectList list = {};
-    for (int i = 0; i < 15; ++i)
-        EXPECT_EQ(add(list, {20 * i, 20 * i, 10, 10}), 100u * uint32(i + 1));
-    EXPECT_EQ(add(list, {300, 300, 10, 10}), 96100u);
-    EXPECT_EQ(list, listOf({{0, 0, 310, 310}}));
-    EXPECT_EQ(subtract(list, {4, 4, 2, 2}), 96096u);
-    EXPECT_EQ(list, listOf({{0, 0, 310, 4}, {0, 4, 4, 2}, {6, 4, 304, 2}, {0, 6, 310, 304}}));
-    Raster_ClearRectList(&list);
-    EXPECT_EQ(list, RasterRectList{});
-}
-
 // --- Limits
 
 TEST(RectList, refusesWhatHasNoSize) {
@@ -217,22 +203,17 @@ TEST(RectList, refusesWhatHasNoSize) {
             return isWide ? e : Entry{e.y, e.x, e.height, e.width};
         };
         // Together they are wider than an entry tells.
-        RasterRectList list = {};
-        EXPECT_EQ(add(list, turned({kMin, 0, kMax, 1})), uint32(kMax));
+        RasterRectList list = listOf({turned({kMin, 0, kMax, 1})});
         const RasterRectList before = list;
         EXPECT_EQ(add(list, turned({-1, 0, 100, 1})), 0u);
         // Whose edge wraps covers nothing.
         EXPECT_EQ(add(list, turned({kMax - 5, 0, 10, 10})), uint32(kMax));
         EXPECT_EQ(subtract(list, turned({kMax - 5, 0, 10, 10})), uint32(kMax));
-        for (const Entry &e : {Entry{0, 0, -1, 5}, Entry{0, 0, 5, kMin}, Entry{0, 0, -1, -1}}) {
-            EXPECT_TRUE(std::regex_match(
-                expectPanic([&] { add(list, turned(e)); }),
-                std::regex("VERIFY lib/raster/rasterRect:[1-9][0-9]* bugNr=15740\n")));
-        }
+        for (const Entry &e : {Entry{0, 0, -1, 5}, Entry{0, 0, 5, kMin}, Entry{0, 0, -1, -1}})
+            expectPanic(
+                "VERIFY lib/raster/rasterRect", [&] { add(list, turned(e)); }, " bugNr=15740");
         EXPECT_EQ(add(list, turned({0, 0, 0, -5})), 0u); // a size of 0 comes first
         EXPECT_EQ(list, before);
-        EXPECT_EQ(subtract(list, before.entries[0]), 0u);
-        EXPECT_EQ(list, RasterRectList{});
     }
 }
 
@@ -248,12 +229,13 @@ TEST(RectList, survivesAnyNumbers) {
         for (uint32 i = 0, count = random.below(17); i < count; ++i)
             list.entries[i] = {number(), number(), random.between(1, kMax), number()};
         const Entry rect = {number(), number(), random.between(0, kMax), random.between(0, kMax)};
+        const Entry nothing = {0, 0, -1, -1};
         try {
             random.oneIn(2) ? add(list, rect) : subtract(list, rect);
-            if (subtract(list, {0, 0, -1, -1}) == 0)
+            if (subtract(list, nothing) == 0)
                 return;
             const RasterRectList normal = list;
-            EXPECT_EQ(subtract(list, {0, 0, -1, -1}), areaOf(used(normal)));
+            EXPECT_EQ(subtract(list, nothing), areaOf(used(normal)));
             EXPECT_EQ(list, normal);
         } catch (const PanicError &) {
         }
@@ -266,19 +248,14 @@ TEST(RectList, sixteenSpansInARow) {
         columns.entries[i] = {10 * i, 0, 5, 20};
     RasterRectList list = columns;
     // From the first row on, the split finds no free span.
-    panicLine(expectPanic([&] { subtract(list, {1, -5, 2, 10}); }), "VERIFY lib/raster/rasterRect");
-    EXPECT_EQ(list, columns);
+    expectPanic("VERIFY lib/raster/rasterRect", [&] { subtract(list, {1, -5, 2, 10}); });
     // Further down the sixteen entries are too many before it comes to that.
     EXPECT_EQ(subtract(list, {1, 5, 2, 10}), 0u);
     EXPECT_EQ(list, columns);
-    // Without one of the columns the rest fits.
-    EXPECT_EQ(subtract(list, {70, 0, 5, 20}), 1500u);
     // A seventeenth rectangle takes full part, whether it fits or not.
-    list = columns;
     EXPECT_EQ(add(list, {0, 0, 150, 20}), 3100u);
     list = columns;
     EXPECT_EQ(add(list, {200, 0, 5, 30}), 205u * 30u);
-    EXPECT_EQ(list, listOf({{0, 0, 205, 30}}));
 }
 
 } // namespace

@@ -43,14 +43,12 @@ void addStencil(Plan &plan, const Area &area, const std::string &name, const Con
 
 } // namespace
 
-void addBits(Plan &plan) {
-    for (const Area &area : kAreas) {
-        for (const uint32 bits : {8, 16, 24, 32}) {
-            addOpaque(plan, area, "noise", noise, bits);
-            addStencil(plan, area, "text", textBits, bits);
-            addStencil(plan, area, "noise", noise, bits);
-            addStencil(plan, area, "sparse", sparseBits, bits);
-        }
+void addBits(Plan &plan, const Area &area) {
+    for (const uint32 bits : {8, 16, 24, 32}) {
+        addOpaque(plan, area, "noise", noise, bits);
+        addStencil(plan, area, "text", textBits, bits);
+        addStencil(plan, area, "noise", noise, bits);
+        addStencil(plan, area, "sparse", sparseBits, bits);
     }
 }
 

@@ -22,11 +22,9 @@ void addBlend(Plan &plan, const Area &area, const std::string &name, const Conte
 
 } // namespace
 
-void addBlends(Plan &plan) {
-    for (const Area &area : kAreas) {
-        addBlend(plan, area, "noise", noise);
-        addBlend(plan, area, "interface", interfacePixels);
-    }
+void addBlends(Plan &plan, const Area &area) {
+    addBlend(plan, area, "noise", noise);
+    addBlend(plan, area, "interface", interfacePixels);
 }
 
 } // namespace quillon::bench

@@ -39,13 +39,11 @@ void addConversion(Plan &plan, const Area &area, int32 srcDepth, int32 dstDepth)
 
 } // namespace
 
-void addConversions(Plan &plan) {
-    for (const Area &area : kAreas) {
-        for (const int32 src : {kIndex, 15, 16, 24, 32}) {
-            for (const int32 dst : {3, 6, 8, 15, 16, 24, 32}) {
-                if (src != dst)
-                    addConversion(plan, area, src, dst);
-            }
+void addConversions(Plan &plan, const Area &area) {
+    for (const int32 src : {kIndex, 15, 16, 24, 32}) {
+        for (const int32 dst : {3, 6, 8, 15, 16, 24, 32}) {
+            if (src != dst)
+                addConversion(plan, area, src, dst);
         }
     }
 }

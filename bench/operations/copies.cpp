@@ -27,6 +27,8 @@ void addCopy(Plan &plan, const Area &area, uint32 bits) {
 // Within one surface, by lines and pixels: what memmove does row by row.
 void addScroll(Plan &plan, const Area &area, const std::string &name, uint32 fromX, uint32 fromY,
                uint32 toX, uint32 toY) {
+    if (area.width <= fromX + toX || area.height <= fromY + toY)
+        return;
     const auto ours = [=](const Job &job) -> Work {
         return [=, dst = job.dst] {
             Raster_RectCopy(dst.data, dst.line(), dst.data, dst.line(), 4, fromX, fromY, toX, toY,
@@ -73,20 +75,18 @@ void addRasterCopy(Plan &plan, const Area &area, uint32 rop, uint32 bits) {
 
 } // namespace
 
-void addCopies(Plan &plan) {
-    for (const Area &area : kAreas) {
-        for (const uint32 bits : {8, 16, 24, 32})
-            addCopy(plan, area, bits);
-        addScroll(plan, area, "up", 0, 8, 0, 0);
-        addScroll(plan, area, "down", 0, 0, 0, 8);
-        addScroll(plan, area, "right", 0, 0, 3, 0);
-        for (uint32 rop = 0; rop < 16; ++rop) {
-            if (rop != RASTER_ROP_NOOP)
-                addRasterCopy(plan, area, rop, 32);
-        }
-        for (const uint32 bits : {8, 16, 24})
-            addRasterCopy(plan, area, RASTER_ROP_XOR, bits);
+void addCopies(Plan &plan, const Area &area) {
+    for (const uint32 bits : {8, 16, 24, 32})
+        addCopy(plan, area, bits);
+    addScroll(plan, area, "up", 0, 8, 0, 0);
+    addScroll(plan, area, "down", 0, 0, 0, 8);
+    addScroll(plan, area, "right", 0, 0, 3, 0);
+    for (uint32 rop = 0; rop < 16; ++rop) {
+        if (rop != RASTER_ROP_NOOP)
+            addRasterCopy(plan, area, rop, 32);
     }
+    for (const uint32 bits : {8, 16, 24})
+        addRasterCopy(plan, area, RASTER_ROP_XOR, bits);
 }
 
 } // namespace quillon::bench

@@ -53,19 +53,17 @@ void addRasterFill(Plan &plan, const Area &area, uint32 rop, uint32 bits) {
 
 } // namespace
 
-void addFills(Plan &plan) {
-    for (const Area &area : kAreas) {
-        for (const uint32 bits : {8, 16, 24, 32})
-            addFill(plan, area, bits);
-        addAlphaFill(plan, area);
-        for (uint32 rop = 0; rop < 16; ++rop) {
-            if (rop == RASTER_ROP_NOOP)
-                continue;
-            addRasterFill(plan, area, rop, 32);
-        }
-        for (const uint32 bits : {8, 16, 24})
-            addRasterFill(plan, area, RASTER_ROP_XOR, bits);
+void addFills(Plan &plan, const Area &area) {
+    for (const uint32 bits : {8, 16, 24, 32})
+        addFill(plan, area, bits);
+    addAlphaFill(plan, area);
+    for (uint32 rop = 0; rop < 16; ++rop) {
+        if (rop == RASTER_ROP_NOOP)
+            continue;
+        addRasterFill(plan, area, rop, 32);
     }
+    for (const uint32 bits : {8, 16, 24})
+        addRasterFill(plan, area, RASTER_ROP_XOR, bits);
 }
 
 } // namespace quillon::bench

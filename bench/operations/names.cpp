@@ -20,6 +20,8 @@ std::string ropFamily(const std::string &operation, uint32 rop) {
     case RASTER_ROP_OR:
     case RASTER_ROP_XOR:
     case RASTER_ROP_COPY:
+    case RASTER_ROP_INVERT:
+    case RASTER_ROP_COPY_INVERTED:
         return operation;
     default:
         return operation + ", rarer codes";

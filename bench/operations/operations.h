@@ -12,13 +12,17 @@ inline constexpr uint32 kForeground = 0xFF102030;
 inline constexpr uint32 kBackground = 0xFFE0D0C0;
 inline constexpr uint8 kAlpha = 0x80;
 
-void addFills(Plan &plan);
-void addCopies(Plan &plan);
-void addBlends(Plan &plan);
-void addBits(Plan &plan);
-void addConversions(Plan &plan);
-void addScaling(Plan &plan);
-void addVideo(Plan &plan);
+void addFills(Plan &plan, const Area &area);
+void addCopies(Plan &plan, const Area &area);
+void addBlends(Plan &plan, const Area &area);
+void addBits(Plan &plan, const Area &area);
+void addConversions(Plan &plan, const Area &area);
+void addScaling(Plan &plan, const Area &area);
+void addVideo(Plan &plan, const Area &area);
+// All of these.
+void addPixelOperations(Plan &plan, const Area &area);
+
+// Those that have no area.
 void addRectLists(Plan &plan);
 void addImages(Plan &plan);
 

@@ -39,17 +39,13 @@ void addScale(Plan &plan, const Area &area, const std::string &filter, double fa
 
 } // namespace
 
-void addScaling(Plan &plan) {
-    for (const Area &area : kAreas) {
-        if (area.surfaceWidth != 0 && area.width != 32)
-            continue;
-        for (const double factor : kNearestFactors)
-            addScale(plan, area, "nearest", factor);
-        for (const double factor : kLinearFactors)
-            addScale(plan, area, "linear", factor);
-        for (const double factor : kBoxFactors)
-            addScale(plan, area, "box", factor);
-    }
+void addScaling(Plan &plan, const Area &area) {
+    for (const double factor : kNearestFactors)
+        addScale(plan, area, "nearest", factor);
+    for (const double factor : kLinearFactors)
+        addScale(plan, area, "linear", factor);
+    for (const double factor : kBoxFactors)
+        addScale(plan, area, "box", factor);
 }
 
 } // namespace quillon::bench

@@ -25,9 +25,11 @@ cv::Scalar channels(uint32 pixel) {
             double(pixel >> 24)};
 }
 
-// What it has of the bitwise codes; the others take two passes.
+// The bitwise codes that it has; the others would take several passes.
+constexpr uint32 kRops[] = {RASTER_ROP_AND,  RASTER_ROP_OR,     RASTER_ROP_XOR,
+                            RASTER_ROP_COPY, RASTER_ROP_INVERT, RASTER_ROP_COPY_INVERTED};
+
 void combine(uint32 rop, const cv::Mat &src, cv::Mat &dst) {
-    const auto invert = [&] { cv::bitwise_not(dst, dst); };
     switch (rop) {
     case RASTER_ROP_AND:
         return cv::bitwise_and(src, dst, dst);
@@ -35,43 +37,18 @@ void combine(uint32 rop, const cv::Mat &src, cv::Mat &dst) {
         return cv::bitwise_or(src, dst, dst);
     case RASTER_ROP_XOR:
         return cv::bitwise_xor(src, dst, dst);
-    case RASTER_ROP_COPY:
-        return src.copyTo(dst);
+    case RASTER_ROP_INVERT:
+        return cv::bitwise_not(dst, dst);
     case RASTER_ROP_COPY_INVERTED:
         return cv::bitwise_not(src, dst);
-    case RASTER_ROP_INVERT:
-        return invert();
-    case RASTER_ROP_NAND:
-        cv::bitwise_and(src, dst, dst);
-        return invert();
-    case RASTER_ROP_NOR:
-        cv::bitwise_or(src, dst, dst);
-        return invert();
-    case RASTER_ROP_EQUIV:
-        cv::bitwise_xor(src, dst, dst);
-        return invert();
-    case RASTER_ROP_AND_REVERSE: // S & ~D
-        invert();
-        return cv::bitwise_and(src, dst, dst);
-    case RASTER_ROP_OR_REVERSE: // S | ~D
-        invert();
-        return cv::bitwise_or(src, dst, dst);
-    case RASTER_ROP_AND_INVERTED: // ~(S | ~D)
-        invert();
-        cv::bitwise_or(src, dst, dst);
-        return invert();
-    case RASTER_ROP_OR_INVERTED: // ~(S & ~D)
-        invert();
-        cv::bitwise_and(src, dst, dst);
-        return invert();
     default:
-        dst.setTo(cv::Scalar::all(rop == RASTER_ROP_SET ? 255 : 0));
+        return src.copyTo(dst);
     }
 }
 
 void offerRasterCopies(Offers &offers) {
     for (const int32 bits : {8, 16, 24, 32}) {
-        for (uint32 rop = 0; rop < 16; ++rop) {
+        for (const uint32 rop : kRops) {
             offers["raster copy " + ropName(rop) + " " + std::to_string(bits)].push_back(
                 {"OpenCV", Agreement::Exact, [=](const Job &job) -> Work {
                      const cv::Mat src =

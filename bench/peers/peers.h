@@ -19,6 +19,9 @@ using Offers = std::map<std::string, std::vector<Contender>>;
 [[gnu::weak]] void offerSdl(Offers &offers);
 [[gnu::weak]] void offerSpng(Offers &offers);
 
+// What the library has to be faster than at any shape.  No peer.
+void offerPlainLoops(Offers &offers);
+
 struct Peer {
     const char *name;
     void (*offer)(Offers &); // null: it was not there

@@ -85,7 +85,7 @@ void offerSdl(Offers &offers) {
         if (format.depth == kIndex || format.depth == 15)
             continue;
         const std::string depth = std::to_string(format.depth);
-        const uint32 mask = 0xFFFFFFFF >> (32 - SDL_BITSPERPIXEL(format.format));
+        const uint32 mask = 0xFFFFFFFF >> (32 - 8 * SDL_BYTESPERPIXEL(format.format));
         offers["fill " + depth].push_back({"SDL", Agreement::Exact, [=](const Job &job) -> Work {
                                                // Only the bytes of a pixel may be set.
                                                const uint32 pixel = kPixel & mask;

@@ -1,5 +1,8 @@
 #include "raster/copyRows.h"
 
+#include "raster/rasterCopyKernels.h"
+#include "raster/streaming.h"
+
 #include <cstring>
 
 namespace quillon {
@@ -21,22 +24,42 @@ bool overlap(Span a, Span b) {
     return a.begin < b.end && b.begin < a.end;
 }
 
-} // namespace
-
-void copyRows(DstRows dst, SrcRows src, Size size, RowOrder order) {
-    if (overlap(spanOf(dst.first, dst.step, size), spanOf(src.first, src.step, size))) {
-        if (order == RowOrder::Upwards) {
-            dst = {dst.row(size.height - 1), -dst.step};
-            src = {src.row(size.height - 1), -src.step};
-        }
-        for (size_t y = 0; y < size.height; ++y)
-            std::memmove(dst.row(y), src.row(y), size.width);
+// Long rows, or the rows of a surface from end to end.
+void copyLongRows(DstRows dst, SrcRows src, Size size) {
+    if (isStreamed(size.width, size.height)) {
+        copyStreamedRows(dst, src, size);
         return;
     }
-
-    size = joinedRows(size, size.width, dst.step, size.width, src.step);
+    if (size.width <= kMiddlingRow) {
+        copyMiddlingRows(dst, src, size);
+        return;
+    }
     for (size_t y = 0; y < size.height; ++y)
         std::memcpy(dst.row(y), src.row(y), size.width);
+}
+
+} // namespace
+
+bool rowsOverlap(DstRows dst, SrcRows src, Size size) {
+    return overlap(spanOf(dst.first, dst.step, size), spanOf(src.first, src.step, size));
+}
+
+void copyRows(DstRows dst, SrcRows src, Size size, RowOrder order) {
+    const bool overlapping = rowsOverlap(dst, src, size);
+    if (overlapping && order == RowOrder::Upwards) {
+        dst = {dst.row(size.height - 1), -dst.step};
+        src = {src.row(size.height - 1), -src.step};
+    }
+    if (!overlapping)
+        size = joinedRows(size, size.width, dst.step, size.width, src.step);
+    if (size.width <= kShortRow) {
+        copyShortRows(dst, src, size);
+    } else if (!overlapping) {
+        copyLongRows(dst, src, size);
+    } else {
+        for (size_t y = 0; y < size.height; ++y)
+            std::memmove(dst.row(y), src.row(y), size.width);
+    }
 }
 
 } // namespace quillon

@@ -6,6 +6,10 @@
 
 namespace quillon {
 
+// Whether rectangles have bytes in common, or lie between each other's rows.
+// size.width counts bytes.
+bool rowsOverlap(DstRows dst, SrcRows src, Size size);
+
 enum class RowOrder { Downwards, Upwards };
 
 // Copies rows of bytes.  size.width counts bytes; neither size is 0.

@@ -6,9 +6,11 @@
 #include "hwy/highway.h"
 
 #include "raster.h"
+#include "raster/copyRows.h"
 
 #include "raster/bytePattern-inl.h"
 #include "raster/kernels-inl.h"
+#include "raster/streaming-inl.h"
 
 HWY_BEFORE_NAMESPACE();
 namespace quillon::HWY_NAMESPACE {
@@ -16,40 +18,62 @@ namespace {
 
 // ---- Against a constant -------------------------------------------------
 
-template <size_t kBytes>
-struct RopPattern {
-    BytePattern<kBytes> keep;
-    BytePattern<kBytes> flip;
-};
+template <class D, class Lanes>
+HWY_INLINE void combineVector(D d, uint8_t *at, hn::Vec<D> keep, hn::Vec<D> flip, Lanes lanes) {
+    auto *to = reinterpret_cast<hn::TFromD<D> *>(at);
+    lanes.store(d, hn::Xor(hn::And(lanes.load(d, to), keep), flip), to);
+}
 
-// One vector from byte i of a row on; kPeriod is the number of bytes after which
-// the pattern repeats, and 1 where it is the same in all vectors.
-template <size_t kPeriod, size_t kBytes>
-struct RopFillBody {
+// A row of whole vectors.
+template <class D>
+HWY_INLINE void combineVectors(D d, uint8_t *row, size_t bytes, const PatternVectors<D> &keep,
+                               const PatternVectors<D> &flip) {
+    constexpr size_t n = PatternVectors<D>::kBytes;
+    const AllLanes all;
+    size_t i = 0;
+    for (; bytes - i >= 3 * n; i += 3 * n) {
+        combineVector(d, row + i, keep.first, flip.first, all);
+        combineVector(d, row + i + n, keep.second, flip.second, all);
+        combineVector(d, row + i + 2 * n, keep.third, flip.third, all);
+    }
+    if (bytes - i >= n)
+        combineVector(d, row + i, keep.first, flip.first, all);
+    if (bytes - i >= 2 * n)
+        combineVector(d, row + i + n, keep.second, flip.second, all);
+}
+
+// The rest of a row, behind its whole vectors; the pattern from there on.
+struct RopFillRest {
     uint8_t *dst;
-    const RopPattern<kBytes> &pattern;
+    const uint8_t *keep;
+    const uint8_t *flip;
 
-    template <class D>
-    HWY_INLINE void operator()(D d, size_t i) const {
-        const size_t phase = kPeriod == 1 ? 0 : i % kPeriod;
-        const auto keep = hn::LoadU(d, pattern.keep.bytes + phase);
-        const auto flip = hn::LoadU(d, pattern.flip.bytes + phase);
-        hn::StoreU(hn::Xor(hn::And(hn::LoadU(d, dst + i), keep), flip), d, dst + i);
+    template <class D, class Lanes>
+    HWY_INLINE void operator()(D d, size_t i, Lanes lanes) const {
+        combineVector(d, dst + i, hn::LoadU(d, keep + i), hn::LoadU(d, flip + i), lanes);
     }
 };
 
 void RopFill(DstRows dst, Size bytes, int32 bytesPerPixel, uint32 keep, uint32 flip) {
-    constexpr size_t n = kLanes<Widest<uint8_t>>;
-    const RopPattern<n> pattern = {BytePattern<n>(keep, bytesPerPixel),
-                                   BytePattern<n>(flip, bytesPerPixel)};
+    const Widest<uint32_t> d;
+    using Vectors = PatternVectors<Widest<uint32_t>>;
+    const PixelPattern keepPattern(keep, bytesPerPixel), flipPattern(flip, bytesPerPixel);
+    const Vectors keepVectors(d, keepPattern, 0), flipVectors(d, flipPattern, 0);
+
     bytes = joinedRows(bytes, bytes.width, dst.step);
-    // Vectors of a single byte, on the scalar target, see a byte of the pixel each.
-    constexpr size_t kPeriod = n < 4 ? 12 : 3;
+    const size_t whole = bytes.width - bytes.width % Vectors::kBytes;
+    HWY_ALIGN uint32_t keepRest[kLanes<decltype(d)>];
+    HWY_ALIGN uint32_t flipRest[kLanes<decltype(d)>];
+    hn::Store(keepPattern.from(d, whole), d, keepRest);
+    hn::Store(flipPattern.from(d, whole), d, flipRest);
+
     for (size_t y = 0; y < bytes.height; ++y) {
-        if (bytesPerPixel == 3 || n < 4)
-            walkOnce<uint8_t>(bytes.width, RopFillBody<kPeriod, n>{dst.row(y), pattern});
-        else
-            walkOnce<uint8_t>(bytes.width, RopFillBody<1, n>{dst.row(y), pattern});
+        uint8_t *row = dst.row(y);
+        combineVectors(d, row, whole, keepVectors, flipVectors);
+        const RopFillRest rest = {row + whole, reinterpret_cast<const uint8_t *>(keepRest),
+                                  reinterpret_cast<const uint8_t *>(flipRest)};
+        if (whole != bytes.width)
+            walkParts<uint8_t>(rest.dst, bytes.width - whole, rest);
     }
 }
 
@@ -88,11 +112,11 @@ struct RopCopyBody {
     uint8_t *dst;
     const uint8_t *src;
 
-    template <class D>
-    HWY_INLINE void operator()(D d, size_t i) const {
+    template <class D, class Lanes = AllLanes>
+    HWY_INLINE void operator()(D d, size_t i, Lanes lanes = {}) const {
         auto *to = reinterpret_cast<T *>(dst) + i;
-        const auto s = hn::LoadU(d, reinterpret_cast<const T *>(src) + i);
-        hn::StoreU(combine<kRop>(s, hn::LoadU(d, to)), d, to);
+        const auto s = lanes.load(d, reinterpret_cast<const T *>(src) + i);
+        lanes.store(d, combine<kRop>(s, lanes.load(d, to)), to);
     }
 };
 
@@ -119,9 +143,9 @@ void ropRows(DstRows dst, SrcRows src, Size bytes, int32 bytesPerPixel, bool bac
         if (!ordered) {
             const RopCopyBody<kRop, uint8_t> body = {to, from};
             if (backwards)
-                walkOnceBackwards<uint8_t>(bytes.width, body);
+                walkPartsBackwards<uint8_t>(bytes.width, body);
             else
-                walkOnce<uint8_t>(bytes.width, body);
+                walkParts<uint8_t>(to, bytes.width, body);
         } else if (bytesPerPixel == 2) {
             ropPixels<kRop, uint16_t>(to, from, bytes.width, backwards);
         } else if (bytesPerPixel == 4) {
@@ -139,11 +163,25 @@ void ropRowsOf(uint32_t rop, DstRows dst, SrcRows src, Size bytes, int32 bytesPe
            ...);
 }
 
+// The one operation of these that does not read what it writes.
+void copyInvertedStreamed(DstRows dst, SrcRows src, Size bytes) {
+    for (size_t y = 0; y < bytes.height; ++y) {
+        const RopCopyBody<RASTER_ROP_COPY_INVERTED, uint8_t> body = {dst.row(y), src.row(y)};
+        walkStreaming<uint8_t, 1>(
+            body.dst, bytes.width, [&](auto d, size_t i) HWY_ATTR { body(d, i); },
+            [&](auto d, size_t i) HWY_ATTR { body(d, i, AroundCaches()); });
+    }
+    hwy::FlushStream();
+}
+
 void RopCopy(DstRows dst, SrcRows src, Size bytes, int32 bytesPerPixel, uint32 rop,
              RowDirection direction) {
     const bool backwards = direction == RowDirection::RightToLeft;
     if (!backwards)
         bytes = joinedRows(bytes, bytes.width, dst.step, bytes.width, src.step);
+    if (rop == RASTER_ROP_COPY_INVERTED && isStreamed(bytes.width, bytes.height) &&
+        !rowsOverlap(dst, src, bytes))
+        return copyInvertedStreamed(dst, src, bytes);
     ropRowsOf<RASTER_ROP_AND, RASTER_ROP_AND_REVERSE, RASTER_ROP_AND_INVERTED, RASTER_ROP_XOR,
               RASTER_ROP_OR, RASTER_ROP_NOR, RASTER_ROP_EQUIV, RASTER_ROP_OR_REVERSE,
               RASTER_ROP_COPY_INVERTED, RASTER_ROP_OR_INVERTED, RASTER_ROP_NAND>(

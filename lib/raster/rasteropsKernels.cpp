@@ -7,6 +7,7 @@
 
 #include "raster/bytePattern-inl.h"
 #include "raster/kernels-inl.h"
+#include "raster/streaming-inl.h"
 
 HWY_BEFORE_NAMESPACE();
 namespace quillon::HWY_NAMESPACE {
@@ -15,62 +16,85 @@ namespace {
 // ---- Fill ---------------------------------------------------------------
 
 // Rows too short for the smallest vector, of 1 to 3 bytes.
-void fillFewBytes(DstRows dst, Size bytes, const uint8_t *pattern) {
+void fillFewBytes(DstRows dst, Size bytes, const PixelPattern &pattern) {
+    const uint32_t word = hn::GetLane(pattern.from(hn::CappedTag<uint32_t, 1>(), 0));
+    const size_t middle = bytes.width / 2, last = bytes.width - 1;
     for (size_t y = 0; y < bytes.height; ++y) {
         uint8_t *row = dst.row(y);
-        for (size_t i = 0; i < bytes.width; ++i)
-            row[i] = pattern[i];
+        row[0] = static_cast<uint8_t>(word);
+        row[middle] = static_cast<uint8_t>(word >> (8 * middle));
+        row[last] = static_cast<uint8_t>(word >> (8 * last));
     }
 }
 
-// Whole vectors, three in turn so that each holds its part of the pattern, and
-// one that ends with the row.
-template <size_t kCap>
-void fillVectors(DstRows dst, Size bytes, const BytePattern<kCap> &pattern) {
-    const hn::CappedTag<uint32_t, kCap / 4>
-        d; // in words: the fallback has no other lanes of 4 bytes
-    constexpr size_t n = kCap;
-    const auto from = [&](size_t offset) HWY_ATTR {
-        return hn::LoadU(d, reinterpret_cast<const uint32_t *>(pattern.from(offset)));
+// The vectors from byte i on, but for the last one of the row.
+template <class Stores, class D>
+HWY_INLINE void fillFrom(D d, uint8_t *row, size_t i, size_t end, const PatternVectors<D> &v) {
+    constexpr size_t n = PatternVectors<D>::kBytes;
+    const auto storeThree = [&](size_t at) HWY_ATTR {
+        Stores::store(d, v.first, row + at);
+        Stores::store(d, v.second, row + at + n);
+        Stores::store(d, v.third, row + at + 2 * n);
     };
-    const auto store = [&](hn::Vec<decltype(d)> v, uint8_t *to)
-                           HWY_ATTR { hn::StoreU(v, d, reinterpret_cast<uint32_t *>(to)); };
-    const auto first = from(0);
-    const auto second = from(n);
-    const auto third = from(2 * n);
-    const auto last = from(bytes.width - n);
+    for (; end - i > 6 * n; i += 6 * n) {
+        storeThree(i);
+        storeThree(i + 3 * n);
+    }
+    if (end - i > 3 * n) {
+        storeThree(i);
+        i += 3 * n;
+    }
+    if (end - i > n)
+        Stores::store(d, v.first, row + i);
+    if (end - i > 2 * n)
+        Stores::store(d, v.second, row + i + n);
+}
 
+// Rows of at least one vector.  The first and the last vector are stored as they
+// come and may overlap what is between them, which is aligned where it is long
+// enough to be worth that.
+template <class Stores, class D>
+void fillVectors(D d, DstRows dst, Size bytes, const PixelPattern &pattern) {
+    constexpr size_t n = PatternVectors<D>::kBytes;
+    const auto first = pattern.from(d, 0);
+    const auto last = pattern.from(d, bytes.width - n);
+    const bool isLong = bytes.width >= 4 * n;
+    size_t begin = n;
+    PatternVectors<D> between(d, pattern, begin);
     for (size_t y = 0; y < bytes.height; ++y) {
         uint8_t *row = dst.row(y);
-        size_t i = 0;
-        for (; bytes.width - i >= 3 * n; i += 3 * n) {
-            store(first, row + i);
-            store(second, row + i + n);
-            store(third, row + i + 2 * n);
+        const size_t toAligned = n - reinterpret_cast<uintptr_t>(row) % n;
+        if (isLong && begin != toAligned) {
+            begin = toAligned;
+            between = PatternVectors<D>(d, pattern, begin);
         }
-        if (bytes.width - i >= n)
-            store(first, row + i);
-        if (bytes.width - i >= 2 * n)
-            store(second, row + i + n);
-        store(last, row + bytes.width - n);
+        ThroughCaches::store(d, first, row);
+        fillFrom<Stores>(d, row, begin, bytes.width, between);
+        ThroughCaches::store(d, last, row + bytes.width - n);
     }
 }
 
-// The widest vectors that fit a row.
-template <size_t kCap>
-void fillCapped(DstRows dst, Size bytes, uint32_t pixel, int32_t bytesPerPixel) {
-    if (bytes.width >= kCap)
-        fillVectors<kCap>(dst, bytes, BytePattern<kCap>(pixel, bytesPerPixel));
-    else if constexpr (kCap > 4)
-        fillCapped<kCap / 2>(dst, bytes, pixel, bytesPerPixel);
+// The widest vectors that fit a row, in words: the fallback has no others of 4 bytes.
+template <size_t kBytes>
+void fillCapped(DstRows dst, Size bytes, const PixelPattern &pattern) {
+    if (bytes.width >= kBytes)
+        fillVectors<ThroughCaches>(hn::CappedTag<uint32_t, kBytes / 4>(), dst, bytes, pattern);
+    else if constexpr (kBytes > 4)
+        fillCapped<kBytes / 2>(dst, bytes, pattern);
     else
-        fillFewBytes(dst, bytes, BytePattern<4>(pixel, bytesPerPixel).bytes);
+        fillFewBytes(dst, bytes, pattern);
 }
 
 void Fill(DstRows dst, Size size, int32 bytesPerPixel, uint32 pixel) {
     const size_t rowBytes = size.width * static_cast<size_t>(bytesPerPixel);
     const Size bytes = joinedRows({rowBytes, size.height}, rowBytes, dst.step);
-    fillCapped<4 * kLanes<Widest<uint32_t>>>(dst, bytes, pixel, bytesPerPixel);
+    const PixelPattern pattern(pixel, bytesPerPixel);
+    if (isStreamed(bytes.width, bytes.height)) {
+        fillVectors<AroundCaches>(Widest<uint32_t>(), dst, bytes, pattern);
+        hwy::FlushStream();
+    } else {
+        fillCapped<4 * kLanes<Widest<uint32_t>>>(dst, bytes, pattern);
+    }
 }
 
 // ---- Alpha --------------------------------------------------------------
@@ -79,103 +103,126 @@ struct SetAlpha {
     uint8_t *dst;
     uint32_t alpha; // in the top byte
 
-    template <class D>
-    HWY_INLINE void operator()(D d, size_t i) const {
+    template <class D, class Lanes>
+    HWY_INLINE void operator()(D d, size_t i, Lanes lanes) const {
         auto *pixels = reinterpret_cast<uint32_t *>(dst + 4 * i);
-        const auto colour = hn::And(hn::LoadU(d, pixels), hn::Set(d, 0x00FFFFFF));
-        hn::StoreU(hn::Or(colour, hn::Set(d, alpha)), d, pixels);
+        const auto colour = hn::And(lanes.load(d, pixels), hn::Set(d, 0x00FFFFFF));
+        lanes.store(d, hn::Or(colour, hn::Set(d, alpha)), pixels);
     }
 };
 
+// Rows too short for vectors, of 1 to 3 pixels: only the bytes that change.
+void fillFewAlphas(DstRows dst, Size size, uint8 alpha) {
+    for (size_t y = 0; y < size.height; ++y) {
+        uint8_t *row = dst.row(y);
+        row[3] = row[4 * (size.width / 2) + 3] = row[4 * size.width - 1] = alpha;
+    }
+}
+
 void FillAlpha(DstRows dst, Size size, uint8 alpha) {
     size = joinedRows(size, 4 * size.width, dst.step);
-    for (size_t y = 0; y < size.height; ++y)
-        walkAgain<uint32_t>(size.width, SetAlpha{dst.row(y), uint32_t{alpha} << 24});
+    if (size.width < 4)
+        return fillFewAlphas(dst, size, alpha);
+    for (size_t y = 0; y < size.height; ++y) {
+        uint8_t *row = dst.row(y);
+        walkParts<uint32_t>(row, size.width, SetAlpha{row, uint32_t{alpha} << 24});
+    }
 }
 
 // ---- Blend --------------------------------------------------------------
 
-// Products of the two 16-bit halves of each lane.  The halves hold at most 255,
-// so where there are no 16-bit lanes to multiply, one wide product will do: b is
-// the same in both halves.
-template <class D, class V>
-HWY_INLINE V mulHalves(D d, V a, V b) {
+// source + destination * (255 - source alpha) / 255 in the colour bytes, held at
+// 255, and the destination's alpha byte as it is.
 #if HWY_TARGET == HWY_SCALAR
-    (void)d;
-    return hn::Mul(a, hn::And(b, hn::Set(d, 0xFF)));
-#else
-    const hn::Repartition<uint16_t, D> d16;
-    return hn::BitCast(d, hn::Mul(hn::BitCast(d16, a), hn::BitCast(d16, b)));
-#endif
-}
 
-// x / 255, truncated, in bits 8 and up of the sum x + 1 + x / 256, for two
-// 16-bit values a lane.  Exact for x up to 255 * 255, and no half overflows.
 template <class D, class V>
-HWY_INLINE V divideHalvesBy255(D d, V x) {
-    const auto low = hn::Set(d, 0x00FF00FF);
-    const auto carry = hn::And(hn::ShiftRight<8>(x), low);
-    return hn::Add(hn::Add(x, hn::Set(d, 0x00010001)), carry);
+HWY_INLINE V blendOver(D d, V srcPixel, V dstPixel) {
+    const uint32_t src = hn::GetLane(srcPixel), dst = hn::GetLane(dstPixel);
+    uint32_t blended = dst & 0xFF000000;
+    for (uint32_t shift = 0; shift < 24; shift += 8) {
+        const uint32_t under = (dst >> shift & 0xFF) * (255 - (src >> 24)) / 255;
+        blended |= HWY_MIN((src >> shift & 0xFF) + under, 255u) << shift;
+    }
+    return hn::Set(d, blended);
 }
 
-// Sums of bytes, held at 255.
-template <class D, class V>
-HWY_INLINE V addBytes(D d, V a, V b) {
-#if HWY_TARGET == HWY_SCALAR
-    const auto low = hn::Set(d, 0x00FF00FF);
-    const auto held = [&](V sum) HWY_ATTR {
-        const auto over = hn::And(hn::ShiftRight<8>(sum), hn::Set(d, 0x00010001));
-        return hn::And(hn::Or(sum, hn::Sub(hn::ShiftLeft<8>(over), over)), low);
-    };
-    const auto even = held(hn::Add(hn::And(a, low), hn::And(b, low)));
-    const auto odd =
-        held(hn::Add(hn::And(hn::ShiftRight<8>(a), low), hn::And(hn::ShiftRight<8>(b), low)));
-    return hn::Or(even, hn::ShiftLeft<8>(odd));
 #else
-    const hn::Repartition<uint8_t, D> d8;
-    return hn::BitCast(d, hn::SaturatedAdd(hn::BitCast(d8, a), hn::BitCast(d8, b)));
-#endif
-}
 
-// source + destination * (255 - source alpha) / 255 in the colour bytes, and the
-// destination's alpha byte as it is.
+// With a the source's alpha, channel * (255 - a) / 255 is the upper half of
+// channel * (65536 - 257 * a), exactly, unless a is 0.  A channel in the upper
+// byte of 16 bits gives it in the upper byte again, with the rest below.
 template <class D, class V>
 HWY_INLINE V blendOver(D d, V src, V dst) {
-    const auto low = hn::Set(d, 0x00FF00FF);
-    const auto alpha = hn::ShiftRight<24>(src);
-    const auto inverse = hn::Xor(hn::Or(alpha, hn::ShiftLeft<16>(alpha)), low);
+    const hn::Repartition<uint8_t, D> d8;
+    const hn::Repartition<uint16_t, D> d16;
+    HWY_ALIGN static constexpr uint8_t kAlphas[16] = {3,  3,  3,  3,  7,  7,  7,  7,
+                                                      11, 11, 11, 11, 15, 15, 15, 15};
+    const auto alphas = hn::TableLookupBytes(hn::BitCast(d8, src), hn::LoadDup128(d8, kAlphas));
+    const auto factor = hn::Sub(hn::Zero(d16), hn::BitCast(d16, alphas));
+    const auto low = hn::Set(d16, 0x00FF);
+    const auto dst16 = hn::BitCast(d16, dst);
+    const auto blueRed = hn::MulHigh(hn::And(dst16, low), factor);
+    const auto green = hn::MulHigh(hn::AndNot(low, dst16), factor);
+    const auto under = hn::OrAnd(blueRed, green, hn::Set(d16, 0xFF00));
 
-    const auto dstGreen = hn::And(hn::ShiftRight<8>(dst), hn::Set(d, 0xFF));
-    const auto blueRed = divideHalvesBy255(d, mulHalves(d, hn::And(dst, low), inverse));
-    const auto green = divideHalvesBy255(d, mulHalves(d, dstGreen, inverse));
-    const auto under =
-        hn::Or(hn::And(hn::ShiftRight<8>(blueRed), low), hn::And(green, hn::Set(d, 0x0000FF00)));
-
-    const auto dstAlpha = hn::And(dst, hn::Set(d, 0xFF000000));
-    return addBytes(d, hn::And(src, hn::Set(d, 0x00FFFFFF)), hn::Or(under, dstAlpha));
+    const auto uncovered = hn::Eq(hn::BitCast(d, factor), hn::Zero(d));
+    const auto kept = hn::IfThenElse(uncovered, dst, hn::BitCast(d, under));
+    const auto sum = hn::SaturatedAdd(hn::BitCast(d8, src), hn::BitCast(d8, kept));
+    return hn::IfVecThenElse(hn::Set(d, 0x00FFFFFF), hn::BitCast(d, sum), dst);
 }
 
+#endif
+
+// In surfaces that no cache holds the arithmetic leaves memory waiting, unless it
+// is told ahead.
+constexpr size_t kAhead = 2048;
+
+template <bool kIsLarge>
 struct BlendOver {
     uint8_t *dst;
     const uint8_t *src;
 
-    template <class D>
-    HWY_INLINE void operator()(D d, size_t i) const {
-        auto *pixels = reinterpret_cast<uint32_t *>(dst + 4 * i);
-        const auto *over = reinterpret_cast<const uint32_t *>(src + 4 * i);
-        hn::StoreU(blendOver(d, hn::LoadU(d, over), hn::LoadU(d, pixels)), d, pixels);
+    template <class D, class Lanes = AllLanes>
+    HWY_INLINE void operator()(D d, size_t i, Lanes lanes = {}) const {
+        uint8_t *at = dst + 4 * i;
+        const uint8_t *from = src + 4 * i;
+        if constexpr (kIsLarge) {
+            hwy::Prefetch(at + kAhead);
+            hwy::Prefetch(from + kAhead);
+        }
+        auto *pixels = reinterpret_cast<uint32_t *>(at);
+        const auto over = lanes.load(d, reinterpret_cast<const uint32_t *>(from));
+        // Much of what lies over a picture is clear, in long runs, and changes
+        // nothing.  A look at one pixel is cheaper than one at a vector.
+        if (isClear(from) && hn::AllTrue(d, hn::Eq(over, hn::Zero(d))))
+            return;
+        lanes.store(d, blendOver(d, over, lanes.load(d, pixels)), pixels);
+    }
+
+    HWY_INLINE static bool isClear(const uint8_t *from) {
+        uint32_t pixel;
+        hwy::CopyBytes<4>(from, &pixel);
+        return pixel == 0;
     }
 };
 
-void Blend(DstRows dst, SrcRows src, Size size) {
-    size = joinedRows(size, 4 * size.width, dst.step, 4 * size.width, src.step);
+template <bool kIsLarge>
+void blendRows(DstRows dst, SrcRows src, Size size) {
     for (size_t y = 0; y < size.height; ++y) {
-        const BlendOver body = {dst.row(y), src.row(y)};
+        const BlendOver<kIsLarge> body = {dst.row(y), src.row(y)};
         if (runsIntoItself(body.dst, body.src, 4 * kLanes<Widest<uint32_t>>))
             walkSingly<uint32_t>(size.width, body);
         else
-            walkOnce<uint32_t>(size.width, body);
+            walkParts<uint32_t>(body.dst, size.width, body);
     }
+}
+
+void Blend(DstRows dst, SrcRows src, Size size) {
+    size = joinedRows(size, 4 * size.width, dst.step, 4 * size.width, src.step);
+    if (isStreamed(4 * size.width, size.height))
+        blendRows<true>(dst, src, size);
+    else
+        blendRows<false>(dst, src, size);
 }
 
 } // namespace

@@ -33,6 +33,10 @@ struct ThroughCaches {
 // such stores.
 struct AroundCaches {
     template <class D>
+    HWY_INLINE static hn::Vec<D> load(D d, const hn::TFromD<D> *from) {
+        return hn::LoadU(d, from);
+    }
+    template <class D>
     HWY_INLINE static void store(D d, hn::Vec<D> v, uint8_t *to) {
         auto *lanes = reinterpret_cast<hn::TFromD<D> *>(to);
         if constexpr (kLanes<D> * sizeof(hn::TFromD<D>) >= 16)

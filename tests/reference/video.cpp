@@ -1,13 +1,10 @@
 #include "reference/video.h"
 
-#include "reference/pixels.h"
-
 #include <algorithm>
+#include <cstring>
 
 namespace quillon::reference {
 namespace {
-
-// --- YUV
 
 uint32 clamped(int32 value) {
     return static_cast<uint32>(std::clamp(value, 0, 255));
@@ -56,42 +53,24 @@ uint32 channel(int64_t sum) {
 void yuvToRgb(const uint8 *srcBuffer, uint8 *dstBuffer, uint32 width, uint32 height, uint32 format,
               int32 bppdepth) {
     const bool isPlanar = format == RASTER_VIDEO_YV12;
-    const int32 bytes = (bppdepth + 1) / 8;
+    const auto bytes = static_cast<size_t>(bppdepth + 1) / 8;
     for (uint64_t i = 0; i < uint64_t{width} * height; ++i) {
         const uint64_t x = i % width, y = i / width;
         const bool isWritten = isPlanar ? x < width / 2 * 2 && y < height / 2 * 2
                                         : i < uint64_t{width} * height / 2 * 2;
         const Samples at = isPlanar ? planarSamples(x, y, width, height)
                                     : packedSamples(i, format == RASTER_VIDEO_YUY2);
-        if (isWritten)
-            store(dstBuffer + i * static_cast<uint64_t>(bytes), bytes,
-                  framePixel(srcBuffer[at.luma], srcBuffer[at.chromaLow], srcBuffer[at.chromaHigh],
-                             bppdepth));
+        if (isWritten) {
+            const uint32 pixel = framePixel(srcBuffer[at.luma], srcBuffer[at.chromaLow],
+                                            srcBuffer[at.chromaHigh], bppdepth);
+            std::memcpy(dstBuffer + i * bytes, &pixel, bytes);
+        }
     }
 }
 
 uint32 yuvToBgrx(int32 y, int32 u, int32 v) {
     const int64_t t = (int64_t{y} - 16) * 298, d = int64_t{u} - 128, e = int64_t{v} - 128;
     return channel(t + 409 * e) << 16 | channel(t - 100 * d - 208 * e) << 8 | channel(t + 516 * d);
-}
-
-void applyColorKey(const uint8 *background, uint8 *dstBuffer, const uint8 *overlay,
-                   const uint8 *keySurface, int32 backgroundLineIncrement, int32 dstLineIncrement,
-                   int32 overlayLineIncrement, int32 keyLineIncrement, uint32 key, uint32 x,
-                   uint32 y, uint32 width, uint32 height, uint32 keyDepth) {
-    const int32 keyBytes = keyDepth == 32 ? 4 : keyDepth == 16 ? 2 : 1;
-    const uint32 compared = keyDepth == 32 ? 0x00FFFFFF : 0xFFFFFFFF;
-    for (uint64_t row = 0; row < height; ++row)
-        for (uint64_t column = 0; column < width; ++column) {
-            const auto at = [&](auto *buffer, int32 line, int32 bytes) {
-                return pixelAt(buffer, line, bytes, x + column, y + row);
-            };
-            const uint32 pixel = load(at(keySurface, keyLineIncrement, keyBytes), keyBytes);
-            const uint8 *taken = (pixel & compared) == (key & compared)
-                                     ? pixelAt(overlay, overlayLineIncrement, 4, column, row)
-                                     : at(background, backgroundLineIncrement, 4);
-            store(at(dstBuffer, dstLineIncrement, 4), 4, load(taken, 4));
-        }
 }
 
 } // namespace quillon::reference

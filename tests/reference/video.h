@@ -12,9 +12,4 @@ void yuvToRgb(const uint8 *srcBuffer, uint8 *dstBuffer, uint32 width, uint32 hei
 
 uint32 yuvToBgrx(int32 y, int32 u, int32 v);
 
-void applyColorKey(const uint8 *background, uint8 *dstBuffer, const uint8 *overlay,
-                   const uint8 *keySurface, int32 backgroundLineIncrement, int32 dstLineIncrement,
-                   int32 overlayLineIncrement, int32 keyLineIncrement, uint32 key, uint32 x,
-                   uint32 y, uint32 width, uint32 height, uint32 keyDepth);
-
 } // namespace quillon::reference

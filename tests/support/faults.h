@@ -1,9 +1,9 @@
-// Faults of memory and of files, put in where a test wants them.
+// Memory that fails where a test wants it to.
 //
-// A test program that links this has its own UtilSafeMalloc0, UtilSafeCalloc0,
-// DynBuf_Append and FileIO_*, which pass on to libhearth's, and its own malloc,
-// calloc, realloc and free; the latter not under a sanitizer, which brings its
-// own.  Blocks of UtilSafeMalloc0 come filled with kStale.
+// A test program that links this has its own malloc, calloc, realloc and free;
+// not under a sanitizer, which brings its own.  And it has its own UtilSafeMalloc0,
+// UtilSafeCalloc0 and DynBuf_Append, which pass on to libhearth's.  Blocks of
+// UtilSafeMalloc0 come filled with kStale.
 #pragma once
 
 #include <gtest/gtest.h>
@@ -14,20 +14,16 @@ namespace quillon::test {
 
 inline constexpr uint8_t kStale = 0xA5;
 
-enum class Requests {
-    kAll,   // those of the libraries beneath too
-    kHearth // UtilSafeMalloc0, UtilSafeCalloc0 and DynBuf_Append
-};
-
 // While one lives, the n-th request for memory, from 0, fails: that one alone.
+// All requests count, or only those to libhearth.
 struct MemoryFault {
-    explicit MemoryFault(uint64_t n, Requests kind = Requests::kAll);
+    explicit MemoryFault(uint64_t n, bool ofHearth = false);
     ~MemoryFault();
     MemoryFault(const MemoryFault &) = delete;
     MemoryFault &operator=(const MemoryFault &) = delete;
 
-    const Requests counted;
     uint64_t requestsLeft; // until the one that fails
+    const bool isOfHearth;
     bool happened = false;
     // Blocks taken since construction and not given back.  0 under a sanitizer,
     // which finds leaks itself.
@@ -35,34 +31,18 @@ struct MemoryFault {
 };
 
 // Calls run() once for each request for memory it makes, with that one failing,
-// and once more with none failing.  run() gives back what it got.  After each,
-// check(failed) looks at what run() has noted down.
-template <class Run, class Check>
-void forEachMemoryFault(const Run &run, const Check &check) {
+// and once more with none failing.  run() gives back what it got, and tells
+// whether there was anything.
+template <class Run>
+void forEachMemoryFault(const Run &run) {
     bool failed = true;
     for (uint64_t n = 0; failed && !testing::Test::HasFailure(); ++n) {
-        int64_t held = 0;
-        {
-            const MemoryFault fault(n);
-            run();
-            failed = fault.happened;
-            held = fault.blocksHeld;
-        }
-        EXPECT_EQ(held, 0) << "request " << n;
-        check(failed);
+        const MemoryFault fault(n);
+        const bool succeeded = run();
+        failed = fault.happened;
+        EXPECT_EQ(fault.blocksHeld, 0) << "request " << n;
+        EXPECT_EQ(succeeded, !failed) << "request " << n;
     }
 }
-
-enum class FileFault {
-    kNone,
-    kSizeFails,
-    kReadFails,  // EIO
-    kReadShort,  // all but the last byte
-    kWriteFails, // ENOSPC
-    kWriteShort, // all but the last byte
-};
-
-inline FileFault fileFault = FileFault::kNone; // of every file operation
-inline int filesOpen = 0;                      // opened and not closed
 
 } // namespace quillon::test

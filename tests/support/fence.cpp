@@ -1,5 +1,6 @@
 #include "support/fence.h"
 
+#include <gtest/gtest.h>
 #include <sys/mman.h>
 #include <unistd.h>
 
@@ -48,13 +49,10 @@ FencedBuffer::FencedBuffer(size_t size, Flush flush)
     std::fill(end(), open_ + openSize_, kCanary);
 }
 
-testing::AssertionResult FencedBuffer::canariesIntact() const {
+FencedBuffer::~FencedBuffer() {
     const auto isCanary = [](uint8_t byte) { return byte == kCanary; };
-    if (!std::all_of(open_, data_, isCanary))
-        return testing::AssertionFailure() << "written ahead of the block";
-    if (!std::all_of(end(), open_ + openSize_, isCanary))
-        return testing::AssertionFailure() << "written behind the block";
-    return testing::AssertionSuccess();
+    EXPECT_TRUE(std::all_of(open_, data_, isCanary)) << "written ahead of the block";
+    EXPECT_TRUE(std::all_of(end(), open_ + openSize_, isCanary)) << "written behind the block";
 }
 
 } // namespace quillon::test

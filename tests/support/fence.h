@@ -2,8 +2,6 @@
 // whether it was read or written.
 #pragma once
 
-#include <gtest/gtest.h>
-
 #include <cstddef>
 #include <cstdint>
 
@@ -37,13 +35,13 @@ public:
     enum class Flush { kBehind, kBefore }; // where the page lies that the block touches
 
     explicit FencedBuffer(size_t size, Flush flush = Flush::kBehind);
+    ~FencedBuffer(); // fails the test if a canary has lost its value
+    FencedBuffer(const FencedBuffer &) = delete;
+    FencedBuffer &operator=(const FencedBuffer &) = delete;
 
     uint8_t *data() const { return data_; }
     uint8_t *end() const { return data_ + size_; }
     size_t size() const { return size_; }
-
-    // Whether every canary still has its value.
-    testing::AssertionResult canariesIntact() const;
 
 private:
     Mapping mapping_;

@@ -4,6 +4,7 @@
 
 #include <gtest/gtest.h>
 
+#include <regex>
 #include <stdexcept>
 #include <string>
 #include <vector>
@@ -16,28 +17,21 @@ public:
     using std::runtime_error::runtime_error;
 };
 
-// The messages since the last clearMessages(), oldest first.
-std::vector<std::string> warnings();
-std::vector<std::string> logs();
-void clearMessages();
+// Since the last expectPanic() or clear(), oldest first.
+inline std::vector<std::string> warnings, logs;
 
-// Runs a call that has to end in a Panic, and gives its message; warnings()
-// then holds those of this call alone.
+// Runs a call that has to end in a Panic of the message "<start>:<line><end>\n",
+// such as "NOT_IMPLEMENTED lib/raster/rasterops:95\n".
 template <class Call>
-std::string expectPanic(const Call &call) {
-    clearMessages();
+void expectPanic(const std::string &start, const Call &call, const std::string &end = {}) {
+    warnings.clear();
     try {
         call();
+        ADD_FAILURE() << "the call returned without a Panic";
     } catch (const PanicError &panic) {
-        return panic.what();
+        EXPECT_TRUE(std::regex_match(panic.what(), std::regex(start + ":[1-9][0-9]*" + end + '\n')))
+            << panic.what();
     }
-    ADD_FAILURE() << "the call returned without a Panic";
-    return {};
 }
-
-// Takes the line out of a message "<start>:<line>\n", such as
-// "NOT_IMPLEMENTED lib/raster/rasterops:95\n".  Any other message is a failure,
-// and gives 0.
-int panicLine(const std::string &message, const std::string &start);
 
 } // namespace quillon::test

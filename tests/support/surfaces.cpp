@@ -8,6 +8,7 @@ namespace {
 
 constexpr uint32 kFencedRows = 3;
 constexpr uint32 kMost = UINT32_MAX;
+constexpr size_t kLargePages = 450; // more than is kept in the caches of a core
 
 // The largest step there is downwards, and a step that only unsigned line
 // increments can have upwards.
@@ -70,6 +71,12 @@ struct Case {
         return {std::max<int64_t>(0, -toLast),
                 std::max<int64_t>(0, toLast) + static_cast<int64_t>(rowBytes(i))};
     }
+
+    bool overlaps() const {
+        const Extent dst = extent(0), src = extent(1);
+        return memories[0] == memories[1] && at[0].first - dst.below < at[1].first + src.above &&
+               at[1].first - src.below < at[0].first + dst.above;
+    }
 };
 
 void drawCoordinates(Random &random, Case &c) {
@@ -82,8 +89,7 @@ void drawCoordinates(Random &random, Case &c) {
         surface.y = isOneRow ? y : randomCoordinate(random);
     }
     // Rounded steps are taken from the first row that is walked.
-    c.isUpwards = c.at.size() == 2 && c.operation.parts[1].rule == RowRule::kRoundedSteps &&
-                  c.at[1].y < c.at[0].y;
+    c.isUpwards = c.operation.walk == Walk::kAwayFromSource && c.at[1].y < c.at[0].y;
 }
 
 void drawLine(Random &random, Case &c, size_t i) {
@@ -114,12 +120,13 @@ uint8 *drawFirst(Random &random, Case &c, size_t i, bool isFlushBehind, bool isN
     if (c.isInRows)
         return memory.run(c.step(i) < 0 ? kFencedRows - 1 : 0) +
                (isFlushBehind ? memory.runBytes() - c.rowBytes(i) : 0);
-    if (isNear)
-        return memory.run(0) + memory.runBytes() / 2 + (i == 0 ? 0 : random.between(-128, 128));
     const Extent extent = c.extent(i);
+    uint8 *const lowest = memory.run(0) + extent.below;
     const int64_t room = static_cast<int64_t>(memory.runBytes()) - extent.below - extent.above;
+    if (isNear && i > 0)
+        return std::clamp(c.at[0].first + random.between(-128, 128), lowest, lowest + room);
     const int64_t anywhere = random.below(static_cast<uint32>(room) + 1);
-    return memory.run(0) + extent.below + random.oneOf({int64_t{0}, room, room, anywhere});
+    return lowest + (isNear ? room / 2 : random.oneOf({int64_t{0}, room, room, anywhere}));
 }
 
 void drawPlaces(Random &random, Case &c) {
@@ -131,7 +138,8 @@ void drawPlaces(Random &random, Case &c) {
         const bool isShared = isNear || (!c.isInRows && c.operation.mayOverlap && random.oneIn(3));
         c.memories[i] = &c.home[isShared ? 0 : i];
         Surface &surface = c.at[i];
-        surface.first = drawFirst(random, c, i, isFlushBehind, isNear);
+        surface.first = part.isTouched ? drawFirst(random, c, i, isFlushBehind, isNear)
+                                       : c.memories[i]->nowhere();
         const uint64_t row = uint64_t{surface.y} + (c.isUpwards ? c.size.height - 1 : 0);
         const int64_t line =
             part.rule == RowRule::kRounded ? rowStep(surface.line, part) : surface.line;
@@ -141,25 +149,43 @@ void drawPlaces(Random &random, Case &c) {
     }
 }
 
-Surface moved(const Surface &surface, uint8 *first) {
-    const uintptr_t distance =
-        reinterpret_cast<uintptr_t>(first) - reinterpret_cast<uintptr_t>(surface.first);
-    auto *buffer =
-        reinterpret_cast<uint8 *>(reinterpret_cast<uintptr_t>(surface.buffer) + distance);
-    return {buffer, first, surface.line, surface.x, surface.y};
+// Carries out the operation in the model.
+void walk(const Case &c) {
+    const std::vector<Part> &parts = c.operation.parts;
+    const bool isRowByRow = c.operation.walk == Walk::kRowByRow;
+    const bool isAway = c.operation.walk == Walk::kAwayFromSource;
+    const bool isSplit = parts[0].bytes > sizeof(uint32) || (isAway && parts[0].bytes == 3);
+    const uint32 split = isSplit ? parts[0].bytes : 1;
+    const int64_t width = int64_t{c.size.width} * split, height = c.size.height;
+    const bool isFromLast = isRowByRow && c.at[1].y < c.at[0].y && c.overlaps();
+    for (int64_t i = 0; i < height; ++i) {
+        std::array<uint8 *, 4> rows = {};
+        for (size_t k = 0; k < parts.size(); ++k)
+            rows[k] = c.memories[k]->inModel(c.at[k].first +
+                                             (isFromLast ? height - 1 - i : i) * c.step(k));
+        const bool isLeftwards = (isRowByRow && rows[1] < rows[0]) ||
+                                 (isAway && c.at[1].y == c.at[0].y && c.at[1].x < c.at[0].x);
+        for (int64_t j = 0; j < width; ++j) {
+            const int64_t column = isLeftwards ? width - 1 - j : j;
+            Pixels pixels = {};
+            for (size_t k = 0; k < parts.size(); ++k) {
+                const uint32 bytes = parts[k].bytes / split;
+                if (bytes == 0)
+                    pixels[k] = rows[k][column / 8] >> (7 - column % 8) & 1;
+                else if (parts[k].isTouched)
+                    std::memcpy(&pixels[k], rows[k] + column * bytes, bytes);
+            }
+            const uint32 result = c.operation.reference(pixels), bytes = parts[0].bytes / split;
+            std::memcpy(rows[0] + column * bytes, &result, bytes);
+        }
+    }
 }
 
 void compare(Random &random, const Case &c) {
-    Surfaces inModel = c.at, called = c.at;
-    for (size_t i = 0; i < c.at.size(); ++i) {
-        const Part &part = c.operation.parts[i];
-        c.memories[i]->refill(random, part.low, part.count);
-        inModel[i] = moved(c.at[i], c.memories[i]->inModel(c.at[i].first));
-        if (!part.isTouched)
-            called[i] = moved(c.at[i], c.memories[i]->nowhere());
-    }
-    c.operation.library(called, c.size);
-    c.operation.reference(inModel, c.size);
+    for (size_t i = 0; i < c.at.size(); ++i)
+        c.memories[i]->refill(random, c.operation.parts[i].low, c.operation.parts[i].count);
+    c.operation.library(c.at, c.size);
+    walk(c);
     for (const TwinMemory *memory : c.memories)
         EXPECT_TRUE(memory->agree());
     if (testing::Test::HasFailure())
@@ -213,22 +239,32 @@ testing::AssertionResult TwinMemory::agree() const {
 }
 
 Arena::Arena()
-    : blocks_(four(6, 1, 0)), rows_(four(1, kFencedRows, 2 * pageSize())),
-      farRows_(four(1, kFencedRows, kFar)) {}
+    : blocks_(four(6, 1, 0)), largeBlocks_(four(kLargePages, 1, 0)),
+      rows_(four(1, kFencedRows, 2 * pageSize())), farRows_(four(1, kFencedRows, kFar)) {}
 
 void Arena::check(Random &random, const Operation &operation) {
     if (!operation.parts[0].isTouched || random.oneIn(32))
         return callForNothing(random, operation, random.oneIn(4) ? nullptr : blocks_[0].nowhere());
 
-    const bool isFar = random.oneIn(16), isInRows = isFar || random.oneIn(3);
+    const bool isLarge = random.oneIn(1000), isFar = !isLarge && random.oneIn(16);
+    const bool isInRows = isFar || (!isLarge && random.oneIn(3));
     const bool isNear = !isInRows && operation.mayOverlap && random.oneIn(2);
     Size size = {randomWidth(random), random.below(random.oneIn(16) ? 40 : 6)};
-    if (isInRows)
+    if (isInRows) {
         size = {random.below(141), kFencedRows};
-    else if (isNear)
+    } else if (isLarge) {
+        size.width = 256 + random.below(2000);
+        const size_t rowBytes = operation.parts[0].rowBytes(size.width);
+        size.height = static_cast<uint32>(largeBlocks_[0].runBytes() / rowBytes);
+    } else if (isNear) {
         size = {random.below(100), 1 + random.below(4)};
+    }
 
-    Case c = {operation, isInRows, isNear, size, isFar ? farRows_ : isInRows ? rows_ : blocks_};
+    Case c = {operation, isInRows, isNear, size,
+              isLarge    ? largeBlocks_
+              : isFar    ? farRows_
+              : isInRows ? rows_
+                         : blocks_};
     drawCoordinates(random, c);
     for (size_t i = 0; i < c.at.size(); ++i)
         drawLine(random, c, i);

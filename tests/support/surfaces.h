@@ -68,22 +68,31 @@ struct Part {
     }
 };
 
+// The order in which an operation goes through its pixels, each of which it
+// reads on all surfaces before it stores one.
+enum class Walk {
+    kForwards,
+    // From the last row where the source begins higher up, from the right where
+    // it begins further left in the same row.  Three bytes count one by one.
+    kAwayFromSource,
+    // Each row as if it were read whole; from the last one where the source
+    // begins higher up and is overlapped.
+    kRowByRow,
+};
+
+using Pixels = std::array<uint32, 4>; // of each surface
+
 // A call with all its arguments but the surfaces, of which the first is the
 // destination, and the size.
 struct Operation {
     std::string name;
     std::vector<Part> parts;
-    std::function<void(const Surfaces &, Size)> library, reference;
+    std::function<void(const Surfaces &, Size)> library;
+    std::function<uint32(const Pixels &)> reference; // the pixel that is stored
+    Walk walk = Walk::kForwards;
     bool mayOverlap = true;
     bool isSigned = true;     // the line increments
     bool isOneCorner = false; // the coordinates are the same on all surfaces
-
-    template <class Library, class Reference, class Call>
-    Operation(std::string title, std::vector<Part> surfaces, Library libraryFunction,
-              Reference referenceFunction, const Call &call)
-        : name(std::move(title)), parts(std::move(surfaces)),
-          library([=](const Surfaces &at, Size size) { call(libraryFunction, at, size); }),
-          reference([=](const Surfaces &at, Size size) { call(referenceFunction, at, size); }) {}
 };
 
 class Arena {
@@ -92,11 +101,12 @@ public:
 
     // One call: anywhere in memory, often flush against a fence; or with
     // surfaces so near that a vector can run into itself; or with a fence at an
-    // edge of every row, the rows up to 2 GB apart; or with nothing to do.
+    // edge of every row, the rows up to 2 GB apart; or so large that caches are
+    // passed by; or with nothing to do.
     void check(Random &random, const Operation &operation);
 
 private:
-    std::array<TwinMemory, 4> blocks_, rows_, farRows_; // for each surface
+    std::array<TwinMemory, 4> blocks_, largeBlocks_, rows_, farRows_; // for each surface
 };
 
 // Random operations, on every instruction set.

@@ -2,9 +2,8 @@
 #pragma once
 
 #include "imageUtil.h"
+#include "support/fence.h"
 #include "support/random.h"
-
-#include <vector>
 
 namespace quillon::test {
 
@@ -16,7 +15,8 @@ inline constexpr Format kFormats[] = {{8, 8}, {15, 16}, {16, 16}, {24, 24}, {24,
 
 // An image with a block of exactly the size that its record tells.
 struct TestImage {
-    TestImage(Random &random, Format format, uint32 width, uint32 height, uint32 padding = 0) {
+    TestImage(Random &random, Format format, uint32 width, uint32 height, uint32 padding = 0)
+        : pixels(size_t{height} * (width * format.bpp / 8 + padding)) {
         random.fill(&info, sizeof info); // flags without a meaning, too
         info.width = width;
         info.height = height;
@@ -24,15 +24,12 @@ struct TestImage {
         info.bpp = format.bpp;
         info.bytesPerLine = width * format.bpp / 8 + padding;
         info.numColors = format.bpp == 8 ? 256 : 0;
-        pixels.resize(size_t{height} * info.bytesPerLine);
         random.fill(pixels.data(), pixels.size());
         info.data = pixels.data();
     }
-    TestImage(const TestImage &) = delete;
-    TestImage &operator=(const TestImage &) = delete;
 
     ImageInfo info;
-    std::vector<uint8> pixels;
+    FencedBuffer pixels;
 };
 
 struct Color {
@@ -64,6 +61,19 @@ inline Color colorAt(const ImageInfo &image, uint32 x, uint32 row) {
 inline Color pictureColorAt(const ImageInfo &image, uint32 x, uint32 y) {
     const bool isReversed = (image.flags & IMAGEUTIL_FLAG_BOTTOM_UP) != 0;
     return colorAt(image, x, isReversed ? image.height - 1 - y : y);
+}
+
+// Holds the rows, from the first of the picture to the last, to colorOf(x, y).
+template <class ColorOf>
+void expectColors(const ImageInfo &image, bool isBottomUp, const ColorOf &colorOf) {
+    for (uint32 y = 0; y < image.height; ++y)
+        for (uint32 x = 0; x < image.width; ++x) {
+            Color expected = colorOf(x, y);
+            if (image.bpp != 32)
+                expected.alpha = 255;
+            ASSERT_EQ(colorAt(image, x, isBottomUp ? image.height - 1 - y : y), expected)
+                << "pixel " << x << ", " << y;
+        }
 }
 
 } // namespace quillon::test

@@ -1,0 +1,318 @@
+#include "plainLoops.h"
+
+#include <algorithm>
+#include <bit>
+#include <cstdlib>
+#include <utility>
+#include <vector>
+
+namespace quillon::bench::plain {
+namespace {
+
+// The first byte of pixel (x, y).  In whole addresses that wrap around: pixel
+// (0, 0) may lie outside of memory as long as the rectangle does not.
+template <class Byte>
+Byte *pixelAt(Byte *buffer, int64_t lineIncrement, int32 bytesPerPixel, uint64_t x, uint64_t y) {
+    return reinterpret_cast<Byte *>(reinterpret_cast<uintptr_t>(buffer) +
+                                    y * static_cast<uint64_t>(lineIncrement) +
+                                    x * static_cast<uint64_t>(bytesPerPixel));
+}
+
+inline uint32 load(const uint8 *address, int32 bytes) {
+    uint32 pixel = 0;
+    for (int32 i = 0; i < bytes; ++i)
+        pixel |= uint32{address[i]} << (8 * i);
+    return pixel;
+}
+
+inline void store(uint8 *address, int32 bytes, uint32 pixel) {
+    for (int32 i = 0; i < bytes; ++i)
+        address[i] = static_cast<uint8>(pixel >> (8 * i));
+}
+
+// A line increment in whole pixels, rounded down, where pixels are units of 2 or
+// 4 bytes; as it is where they are bytes.
+inline int64_t wholePixelLine(int64_t lineIncrement, int32 bytes) {
+    if (bytes != 2 && bytes != 4)
+        return lineIncrement;
+    const int64_t rest = ((lineIncrement % bytes) + bytes) % bytes; // 0 to bytes - 1
+    return lineIncrement - rest;
+}
+
+// --- Layouts and colours
+
+struct Layout {
+    int32 depth;
+    int32 bytes;
+    uint32 red, green, blue, alpha; // masks
+};
+
+const Layout &layoutOf(int32 depth) {
+    static const Layout layouts[] = {
+        {3, 1, 0x04, 0x20, 0x80, 0},
+        {6, 1, 0x30, 0x0C, 0x03, 0},
+        {8, 1, 0x07, 0x38, 0xC0, 0},
+        {15, 2, 0x7C00, 0x03E0, 0x001F, 0},
+        {16, 2, 0xF800, 0x07E0, 0x001F, 0},
+        {24, 3, 0xFF0000, 0x00FF00, 0x0000FF, 0},
+        {32, 4, 0xFF0000, 0x00FF00, 0x0000FF, 0xFF000000},
+    };
+    for (const Layout &layout : layouts)
+        if (layout.depth == depth)
+            return layout;
+    std::abort(); // the test asks for what there is not
+}
+
+// Channels of 8 bits.
+struct Color {
+    uint32 red, green, blue, alpha;
+};
+
+// The channel under a mask, widened to 8 bits by repeating its bits.
+uint32 widened(uint32 pixel, uint32 mask) {
+    const int bits = std::popcount(mask);
+    const uint32 value = (pixel & mask) >> std::countr_zero(mask);
+    uint32 repeated = 0;
+    int have = 0;
+    for (; have < 8; have += bits)
+        repeated = (repeated << bits) | value;
+    return repeated >> (have - 8);
+}
+
+// The top bits of an 8-bit channel, put under a mask.
+uint32 narrowed(uint32 channel, uint32 mask) {
+    if (mask == 0)
+        return 0;
+    return (channel >> (8 - std::popcount(mask))) << std::countr_zero(mask);
+}
+
+Color colorOf(uint32 pixel, const Layout &layout, uint32 alphaWhereNone) {
+    return {widened(pixel, layout.red), widened(pixel, layout.green), widened(pixel, layout.blue),
+            layout.alpha != 0 ? widened(pixel, layout.alpha) : alphaWhereNone};
+}
+
+uint32 pixelOf(const Color &color, const Layout &layout) {
+    return narrowed(color.red, layout.red) | narrowed(color.green, layout.green) |
+           narrowed(color.blue, layout.blue) | narrowed(color.alpha, layout.alpha);
+}
+
+// --- Raster operations
+
+constexpr uint32 kCopy = 3, kNoop = 5, kLast = 15;
+
+// Each bit of the code says what becomes of one pair of operand bits.
+uint32 combined(uint32 rop, uint32 s, uint32 d) {
+    uint32 result = 0;
+    if ((rop & 8) != 0)
+        result |= ~s & ~d;
+    if ((rop & 4) != 0)
+        result |= ~s & d;
+    if ((rop & 2) != 0)
+        result |= s & ~d;
+    if ((rop & 1) != 0)
+        result |= s & d;
+    return result;
+}
+
+// --- Bits
+
+bool isSet(const uint8 *rowBits, int32 column) {
+    return ((rowBits[column / 8] >> (7 - column % 8)) & 1) != 0;
+}
+
+// Calls paint(address, set) for every pixel.
+template <class Paint>
+void forEachBit(const uint8 *srcBits, int32 srcLineIncrement, uint8 *dstBuffer,
+                int32 dstLineIncrement, int32 bytesPerPixel, int32 width, uint32 height,
+                const Paint &paint) {
+    for (int64_t row = 0; row < height; ++row)
+        for (int32 column = 0; column < width; ++column)
+            paint(dstBuffer + row * dstLineIncrement + int64_t{column} * bytesPerPixel,
+                  isSet(srcBits + row * srcLineIncrement, column));
+}
+
+} // namespace
+
+// --- Fill, copy, alpha
+
+void rectFill(uint8 *frameBuffer, int32 lineIncrement, int32 bytesPerPixel, uint32 pixel, uint32 x,
+              uint32 y, uint32 width, uint32 height) {
+    uint8 *first = pixelAt(frameBuffer, lineIncrement, bytesPerPixel, x, y);
+    const int64_t step = wholePixelLine(lineIncrement, bytesPerPixel);
+    for (uint64_t row = 0; row < height; ++row)
+        for (uint64_t column = 0; column < width; ++column)
+            store(pixelAt(first, step, bytesPerPixel, column, row), bytesPerPixel, pixel);
+}
+
+void rectCopy(uint8 *dstBuffer, int64_t dstLineIncrement, const uint8 *srcBuffer,
+              int64_t srcLineIncrement, int32 bytesPerPixel, uint32 srcX, uint32 srcY, uint32 dstX,
+              uint32 dstY, uint32 width, uint32 height) {
+    if (bytesPerPixel <= 0 || width == 0 || height == 0)
+        return;
+    const size_t rowBytes = size_t{width} * static_cast<size_t>(bytesPerPixel);
+    const auto srcRow = [&](uint64_t row) {
+        return pixelAt(srcBuffer, srcLineIncrement, bytesPerPixel, srcX, srcY + row);
+    };
+    const auto dstRow = [&](uint64_t row) {
+        return pixelAt(dstBuffer, dstLineIncrement, bytesPerPixel, dstX, dstY + row);
+    };
+
+    // With a negative line increment the last row is the lowest in memory.
+    const uint64_t last = uint64_t{height} - 1;
+    const auto [srcLow, srcHigh] = std::minmax({srcRow(0), srcRow(last)});
+    const auto [dstLow, dstHigh] = std::minmax({dstRow(0), dstRow(last)});
+    const bool overlap = srcLow < dstHigh + rowBytes && dstLow < srcHigh + rowBytes;
+    const bool fromLastRow = overlap && srcY < dstY;
+
+    for (uint64_t i = 0; i < height; ++i) {
+        const uint64_t row = fromLastRow ? last - i : i;
+        const std::vector<uint8> bytes(srcRow(row), srcRow(row) + rowBytes);
+        std::copy(bytes.begin(), bytes.end(), dstRow(row));
+    }
+}
+
+void rectFillAlpha(uint8 *frameBuffer, int32 lineIncrement, uint8 alpha, uint32 x, uint32 y,
+                   uint32 width, uint32 height) {
+    for (uint64_t row = 0; row < height; ++row)
+        for (uint64_t column = 0; column < width; ++column)
+            pixelAt(frameBuffer, lineIncrement, 4, x + column, y + row)[3] = alpha;
+}
+
+void alphaBlendOver(uint8 *dstBuffer, uint32 dstX, uint32 dstY, int32 dstLineIncrement,
+                    const uint8 *srcBuffer, uint32 srcX, uint32 srcY, int32 srcLineIncrement,
+                    uint32 width, uint32 height) {
+    for (uint64_t row = 0; row < height; ++row)
+        for (uint64_t column = 0; column < width; ++column) {
+            uint8 *dst = pixelAt(dstBuffer, dstLineIncrement, 4, dstX + column, dstY + row);
+            const uint8 *src = pixelAt(srcBuffer, srcLineIncrement, 4, srcX + column, srcY + row);
+            // Read whole: the store to dst may change src where they overlap.
+            const uint32 source[] = {src[0], src[1], src[2]};
+            const uint32 below[] = {dst[0], dst[1], dst[2]};
+            const uint32 inverse = 255u - src[3];
+            for (int c = 0; c < 3; ++c)
+                dst[c] = static_cast<uint8>(std::min(255u, source[c] + below[c] * inverse / 255));
+        }
+}
+
+// --- Conversion
+
+void convertPixels(uint8 *dstBuffer, uint32 dstLineIncrement, int32 dstDepth,
+                   const uint8 *srcBuffer, uint32 srcLineIncrement, int32 srcDepth,
+                   bool pseudoColor, const uint32 *palette, uint32 srcX, uint32 srcY, uint32 dstX,
+                   uint32 dstY, uint32 width, uint32 height) {
+    const Layout &dstLayout = layoutOf(dstDepth);
+    const Layout &srcLayout = layoutOf(pseudoColor ? 32 : srcDepth); // of a palette's entries
+    const int32 srcBytes = pseudoColor ? 1 : srcLayout.bytes;
+    if (!pseudoColor && srcDepth == dstDepth)
+        return rectCopy(dstBuffer, dstLineIncrement, srcBuffer, srcLineIncrement, srcBytes, srcX,
+                        srcY, dstX, dstY, width, height);
+
+    const bool isExact = pseudoColor && dstDepth == 32;
+    const int64_t dstLine =
+        isExact ? dstLineIncrement : wholePixelLine(dstLineIncrement, dstLayout.bytes);
+    const int64_t srcLine = wholePixelLine(srcLineIncrement, srcBytes);
+    for (uint64_t row = 0; row < height; ++row)
+        for (uint64_t column = 0; column < width; ++column) {
+            const uint8 *src = pixelAt(srcBuffer, srcLine, srcBytes, srcX + column, srcY + row);
+            uint8 *dst = pixelAt(dstBuffer, dstLine, dstLayout.bytes, dstX + column, dstY + row);
+            const uint32 pixel = pseudoColor ? palette[*src] : load(src, srcBytes);
+            store(dst, dstLayout.bytes, pixelOf(colorOf(pixel, srcLayout, 255), dstLayout));
+        }
+}
+
+// --- Raster operations
+
+void rectRopFill(uint8 *frameBuffer, int32 lineIncrement, int32 bytesPerPixel, uint32 pixel,
+                 uint32 rop, uint32 x, uint32 y, uint32 width, uint32 height) {
+    if (rop == kNoop || rop > kLast)
+        return;
+    uint8 *first = pixelAt(frameBuffer, lineIncrement, bytesPerPixel, x, y);
+    const int64_t step = wholePixelLine(lineIncrement, bytesPerPixel);
+    for (uint64_t row = 0; row < height; ++row)
+        for (uint64_t column = 0; column < width; ++column) {
+            uint8 *dst = pixelAt(first, step, bytesPerPixel, column, row);
+            store(dst, bytesPerPixel, combined(rop, pixel, load(dst, bytesPerPixel)));
+        }
+}
+
+void rectRopCopy(uint8 *dstBuffer, int32 dstLineIncrement, const uint8 *srcBuffer,
+                 int32 srcLineIncrement, int32 bytesPerPixel, uint32 srcX, uint32 srcY, uint32 rop,
+                 uint32 dstX, uint32 dstY, uint32 width, uint32 height) {
+    if (rop == kCopy)
+        return rectCopy(dstBuffer, dstLineIncrement, srcBuffer, srcLineIncrement, bytesPerPixel,
+                        srcX, srcY, dstX, dstY, width, height);
+    if (rop == kNoop || rop > kLast || width == 0 || height == 0)
+        return;
+
+    const bool upwards = srcY < dstY;
+    const bool leftwards = srcY == dstY && dstX > srcX;
+    const uint64_t firstRow = upwards ? uint64_t{height} - 1 : 0;
+    const uint64_t firstColumn = leftwards ? uint64_t{width} - 1 : 0;
+    const auto stepOf = [&](int64_t line) {
+        return wholePixelLine(upwards ? -line : line, bytesPerPixel);
+    };
+    const int32 pixelStep = leftwards ? -bytesPerPixel : bytesPerPixel;
+    uint8 *dstFirst =
+        pixelAt(dstBuffer, dstLineIncrement, bytesPerPixel, dstX + firstColumn, dstY + firstRow);
+    const uint8 *srcFirst =
+        pixelAt(srcBuffer, srcLineIncrement, bytesPerPixel, srcX + firstColumn, srcY + firstRow);
+
+    for (uint64_t row = 0; row < height; ++row)
+        for (uint64_t column = 0; column < width; ++column) {
+            uint8 *dst = pixelAt(dstFirst, stepOf(dstLineIncrement), pixelStep, column, row);
+            const uint8 *src = pixelAt(srcFirst, stepOf(srcLineIncrement), pixelStep, column, row);
+            if (bytesPerPixel != 3) {
+                store(dst, bytesPerPixel,
+                      combined(rop, load(src, bytesPerPixel), load(dst, bytesPerPixel)));
+                continue;
+            }
+            for (int i = 0; i < 3; ++i) { // one byte is stored before the next is read
+                const int at = leftwards ? 2 - i : i;
+                dst[at] = static_cast<uint8>(combined(rop, src[at], dst[at]));
+            }
+        }
+}
+
+// --- Bits
+
+void bitsToPixels(const uint8 *srcBits, int32 srcLineIncrement, uint8 *dstBuffer,
+                  int32 dstLineIncrement, int32 bytesPerPixel, int32 width, uint32 height,
+                  uint32 foreground, uint32 background) {
+    forEachBit(srcBits, srcLineIncrement, dstBuffer, dstLineIncrement, bytesPerPixel, width, height,
+               [=](uint8 *pixel, bool set) {
+                   store(pixel, bytesPerPixel, set ? foreground : background);
+               });
+}
+
+void bitsToPixelsStencil(const uint8 *srcBits, int32 srcLineIncrement, uint8 *dstBuffer,
+                         int32 dstLineIncrement, int32 bytesPerPixel, int32 width, uint32 height,
+                         uint32 pixel) {
+    forEachBit(srcBits, srcLineIncrement, dstBuffer, dstLineIncrement, bytesPerPixel, width, height,
+               [=](uint8 *address, bool set) {
+                   if (set)
+                       store(address, bytesPerPixel, pixel);
+               });
+}
+
+// --- Colour key
+
+void applyColorKey(const uint8 *background, uint8 *dstBuffer, const uint8 *overlay,
+                   const uint8 *keySurface, int32 backgroundLineIncrement, int32 dstLineIncrement,
+                   int32 overlayLineIncrement, int32 keyLineIncrement, uint32 key, uint32 x,
+                   uint32 y, uint32 width, uint32 height, uint32 keyDepth) {
+    const int32 keyBytes = keyDepth == 32 ? 4 : keyDepth == 16 ? 2 : 1;
+    const uint32 compared = keyDepth == 32 ? 0x00FFFFFF : 0xFFFFFFFF;
+    for (uint64_t row = 0; row < height; ++row)
+        for (uint64_t column = 0; column < width; ++column) {
+            const auto at = [&](auto *buffer, int32 line, int32 bytes) {
+                return pixelAt(buffer, line, bytes, x + column, y + row);
+            };
+            const uint32 pixel = load(at(keySurface, keyLineIncrement, keyBytes), keyBytes);
+            const uint8 *taken = (pixel & compared) == (key & compared)
+                                     ? pixelAt(overlay, overlayLineIncrement, 4, column, row)
+                                     : at(background, backgroundLineIncrement, 4);
+            store(at(dstBuffer, dstLineIncrement, 4), 4, load(taken, 4));
+        }
+}
+
+} // namespace quillon::bench::plain

@@ -1,0 +1,261 @@
+// PNG files of every kind, whole and broken, into image records.
+
+#include "hearth.h"
+#include "imageUtil.h"
+#include "support/faults.h"
+#include "support/testImage.h"
+
+#include <algorithm>
+#include <cstring>
+#include <fstream>
+#include <png.h>
+#include <unistd.h>
+
+using namespace quillon::test;
+
+namespace {
+
+using Bytes = std::vector<uint8>;
+
+int64_t toldSize = 0;
+
+} // namespace
+
+// In the place of libhearth's.
+int64_t FileIO_GetSize(const FileIODescriptor * /*file*/) {
+    return toldSize;
+}
+
+namespace {
+
+// A record as a test begins with it, to be overwritten or not.
+ImageInfo recordOf(uint8 byte) {
+    ImageInfo image;
+    std::memset(&image, byte, sizeof image);
+    return image;
+}
+constexpr uint8 kUntouched = 0x5A;
+
+bool isRecordOf(const ImageInfo &image, uint8 byte) {
+    const ImageInfo expected = recordOf(byte);
+    return std::memcmp(&image, &expected, sizeof image) == 0;
+}
+
+// --- Files made by libpng alone
+
+struct PngPicture {
+    int colorType, bitDepth;
+    uint32 width, height;
+    std::vector<png_color> palette = {};
+    Bytes samples = {}; // as stored, but for a byte each at least
+
+    bool isIndexed() const { return colorType == PNG_COLOR_TYPE_PALETTE; }
+    bool hasAlpha() const { return (colorType & PNG_COLOR_MASK_ALPHA) != 0; }
+    bool isGrey() const { return (colorType & PNG_COLOR_MASK_COLOR) == 0; }
+    size_t pixelBytes() const {
+        const size_t channels = isIndexed() ? 1 : (isGrey() ? 1 : 3) + (hasAlpha() ? 1 : 0);
+        return channels * (bitDepth == 16 ? 2 : 1);
+    }
+};
+
+PngPicture randomPicture(Random &random, std::pair<int, int> kind, uint32 width, uint32 height) {
+    PngPicture picture = {kind.first, kind.second, width, height};
+    if (picture.isIndexed())
+        picture.palette.resize(2 + random.below((1u << picture.bitDepth) - 1));
+    else if (!picture.isGrey() && random.oneIn(2))
+        picture.palette.resize(3); // a suggested one
+    random.fill(picture.palette.data(), sizeof(png_color) * picture.palette.size());
+    picture.samples.resize(width * height * picture.pixelBytes());
+    random.fill(picture.samples.data(), picture.samples.size());
+    if (picture.isIndexed() || picture.bitDepth < 8)
+        for (uint8 &sample : picture.samples)
+            sample =
+                static_cast<uint8>(sample % (picture.isIndexed() ? picture.palette.size() : 2));
+    return picture;
+}
+
+// Without samples, a file that ends in the first bytes of its pixels.
+Bytes encode(Random &random, const PngPicture &picture) {
+    Bytes file;
+    png_structp png = png_create_write_struct(PNG_LIBPNG_VER_STRING, nullptr, nullptr, nullptr);
+    png_infop info = png_create_info_struct(png);
+    const auto append = [](png_structp writer, png_bytep bytes, size_t length) {
+        auto &to = *static_cast<Bytes *>(png_get_io_ptr(writer));
+        to.insert(to.end(), bytes, bytes + length);
+    };
+    png_set_write_fn(png, &file, append, nullptr);
+    png_set_IHDR(png, info, picture.width, picture.height, picture.bitDepth, picture.colorType,
+                 random.oneOf({PNG_INTERLACE_ADAM7, PNG_INTERLACE_NONE}),
+                 PNG_COMPRESSION_TYPE_DEFAULT, PNG_FILTER_TYPE_DEFAULT);
+    if (!picture.palette.empty())
+        png_set_PLTE(png, info, picture.palette.data(), static_cast<int>(picture.palette.size()));
+    const png_byte alphas[] = {0, 64};
+    const png_color_16 key = {0, 1, 1, 1, 1};
+    if (!picture.hasAlpha() && random.oneIn(2))
+        png_set_tRNS(png, info, alphas, 2, &key);
+    std::vector<const png_byte *> rows;
+    for (size_t i = 0; i < picture.samples.size(); i += picture.width * picture.pixelBytes())
+        rows.push_back(&picture.samples[i]);
+    png_set_rows(png, info, const_cast<png_bytepp>(rows.data()));
+    if (rows.empty()) {
+        const uint8 pixels[] = {'I', 'D', 'A', 'T', 0x78, 0x9C};
+        png_write_info(png, info);
+        png_write_chunk(png, pixels, pixels + 4, 2);
+    } else {
+        png_write_png(png, info, PNG_TRANSFORM_PACKING, nullptr);
+    }
+    png_destroy_write_struct(&png, &info);
+    return file;
+}
+
+// Where the compressed pixels begin.
+size_t pixelStream(const Bytes &file) {
+    const char kChunk[] = {'I', 'D', 'A', 'T'};
+    const auto found = std::search(file.begin(), file.end(), kChunk, kChunk + 4);
+    return static_cast<size_t>(found - file.begin()) + 4;
+}
+
+bool readBuffer(ImageInfo *image, const Bytes &file, uint32 flags) {
+    *image = recordOf(kUntouched);
+    const FencedBuffer fenced(file.size());
+    std::copy(file.begin(), file.end(), fenced.data());
+    return ImageUtil_ReadPNGBuffer(image, fenced.data(), static_cast<uint32>(file.size()), flags);
+}
+
+void expectRecord(const ImageInfo &image, const PngPicture &picture, uint32 flags) {
+    const bool hasAlpha =
+        (flags & (picture.hasAlpha() ? IMAGEUTIL_READ_KEEP_ALPHA : IMAGEUTIL_READ_ADD_ALPHA)) != 0;
+    ASSERT_TRUE(image.width == picture.width && image.height == picture.height);
+    EXPECT_EQ(image.depth, picture.isIndexed() ? 8u : 24u);
+    ASSERT_EQ(image.bpp, picture.isIndexed() ? 8u : hasAlpha ? 32u : 24u);
+    EXPECT_EQ(image.flags, 0u);
+    const uint32 rowBytes = picture.width * image.bpp / 8;
+    ASSERT_EQ(image.bytesPerLine, (rowBytes + 3) / 4 * 4);
+    ASSERT_EQ(image.numColors, picture.isIndexed() ? picture.palette.size() : 0);
+    for (const ImageUtilColor &color : image.palette)
+        EXPECT_EQ(color.reserved, 0);
+    expectColors(image, (flags & IMAGEUTIL_READ_BOTTOM_UP) != 0, [&](uint32 x, uint32 y) {
+        const uint8 *s = &picture.samples[(size_t{y} * picture.width + x) * picture.pixelBytes()];
+        if (picture.isIndexed())
+            return Color{picture.palette[s[0]].blue, picture.palette[s[0]].green,
+                         picture.palette[s[0]].red, 255};
+        // To the nearest, as v / 65535 = r / 255 has it.
+        const auto at8Bits = [&](size_t c) {
+            return static_cast<uint8>(
+                picture.bitDepth == 16 ? (s[2 * c] * 256 + s[2 * c + 1] + 128) / 257 : s[c]);
+        };
+        return Color{at8Bits(2), at8Bits(1), at8Bits(0),
+                     picture.hasAlpha() ? at8Bits(3) : uint8{255}};
+    });
+    for (uint32 i = 0; i < image.height * image.bytesPerLine; ++i)
+        EXPECT_TRUE(i % image.bytesPerLine < rowBytes || image.data[i] == kStale) << "padding";
+}
+
+constexpr std::pair<int, int> kRgb16(PNG_COLOR_TYPE_RGB, 16), kRgba8(PNG_COLOR_TYPE_RGB_ALPHA, 8),
+    kRgba16(PNG_COLOR_TYPE_RGB_ALPHA, 16), kPalette4(PNG_COLOR_TYPE_PALETTE, 4);
+constexpr std::pair<int, int> kKinds[] = {kRgb16,
+                                          kRgba8,
+                                          kRgba16,
+                                          kPalette4,
+                                          {PNG_COLOR_TYPE_RGB, 8},
+                                          {PNG_COLOR_TYPE_PALETTE, 1},
+                                          {PNG_COLOR_TYPE_PALETTE, 2},
+                                          {PNG_COLOR_TYPE_PALETTE, 8},
+                                          {PNG_COLOR_TYPE_GRAY, 1},
+                                          {PNG_COLOR_TYPE_GRAY_ALPHA, 8}};
+
+// Chunks that suggest colours or make some of them transparent change nothing;
+// bits of the flags that mean nothing do not either.  Grey is refused.
+TEST(PngRead, EveryFormatAndFlag) {
+    testing::internal::CaptureStderr();
+    forEachCase(600, [](Random &random) {
+        const PngPicture picture = randomPicture(random, kKinds[random.below(std::size(kKinds))],
+                                                 1 + random.below(20), 1 + random.below(20));
+        const uint32 flags = random.below(8) | (random.oneIn(2) ? 0xFFFFFFF8u : 0);
+        ImageInfo image;
+        ASSERT_NE(readBuffer(&image, encode(random, picture), flags), picture.isGrey());
+        if (picture.isGrey()) {
+            EXPECT_TRUE(isRecordOf(image, 0));
+            return;
+        }
+        expectRecord(image, picture, flags);
+        ImageUtil_FreeImageData(&image);
+        EXPECT_EQ(image.data, nullptr);
+        ImageUtil_FreeImageData(&image);
+    });
+    EXPECT_EQ(testing::internal::GetCapturedStderr(), "") << "libpng has nothing to complain of";
+}
+
+// 65536 rows of 65536 bytes are one byte too many, counted in 32 bits.
+TEST(PngRead, PicturesTooLarge) {
+    Random random(10);
+    PngPicture large = {PNG_COLOR_TYPE_RGB_ALPHA, 8, 65536 / 4, 0};
+    for (const uint32 height : {65536u, 999999u}) {
+        large.height = height;
+        ImageInfo image;
+        EXPECT_FALSE(readBuffer(&image, encode(random, large), IMAGEUTIL_READ_KEEP_ALPHA));
+        EXPECT_EQ(image.data, nullptr);
+        EXPECT_EQ(image.height, height);
+    }
+}
+
+// What was decoded ahead of the error stays with the caller.
+TEST(PngRead, DamagedOrEndingEarlyAtEveryLength) {
+    Random random(11);
+    for (const auto &kind : {kRgb16, kRgba8, kPalette4}) {
+        const Bytes whole = encode(random, randomPicture(random, kind, 5, 7));
+        for (size_t length = whole.size(); length > 0; --length) {
+            Bytes file(whole.begin(), whole.begin() + static_cast<ptrdiff_t>(length));
+            if (length == whole.size())
+                file[length - 13] ^= 1; // the check sum of the pixels
+            const bool hasPixels = length >= pixelStream(whole);
+            ImageInfo image;
+            EXPECT_FALSE(readBuffer(&image, file, IMAGEUTIL_READ_KEEP_ALPHA)) << length;
+            EXPECT_EQ(image.data != nullptr, hasPixels) << length;
+            EXPECT_TRUE(!hasPixels || (image.width == 5 && image.height == 7));
+            EXPECT_TRUE(length >= 8 || isRecordOf(image, 0)); // the signature
+            ImageUtil_FreeImageData(&image);
+        }
+    }
+}
+
+TEST(PngRead, Files) {
+    const std::string path = testing::TempDir() + "quillonRead" + std::to_string(getpid());
+    Random random(12);
+    const Bytes content = encode(random, randomPicture(random, kRgba16, 5, 7));
+    ImageInfo image = recordOf(kUntouched);
+    const auto read = [&](const char *name, int64_t size) {
+        toldSize = size;
+        return ImageUtil_ReadPNG(&image, name, IMAGEUTIL_READ_KEEP_ALPHA);
+    };
+    EXPECT_FALSE(read(path.c_str(), 9));
+    std::ofstream file(path, std::ios::binary);
+    file.write(reinterpret_cast<const char *>(content.data()), std::ssize(content)).flush();
+    const int descriptor = dup(STDIN_FILENO); // the lowest that is free
+    close(descriptor);
+    {
+        const MemoryFault none(UINT64_MAX);
+        EXPECT_FALSE(read(path.c_str(), 0));
+        EXPECT_FALSE(read(path.c_str(), -1));
+        EXPECT_FALSE(read("/", 99)); // has no bytes to read
+        EXPECT_EQ(none.blocksHeld, 0);
+    }
+    EXPECT_FALSE(ImageUtil_ReadPNGBuffer(&image, content.data(), 0, 0));
+    EXPECT_TRUE(isRecordOf(image, kUntouched));
+
+    image.data = nullptr;
+    forEachMemoryFault([&] {
+        const bool isRead = read(path.c_str(), 99999); // the file has become shorter
+        ImageUtil_FreeImageData(&image);
+        return isRead;
+    });
+    for (const uint64_t request : {1u, 2u, 3u}) { // the state, the pixels, the rows
+        const MemoryFault fault(request, true);
+        EXPECT_FALSE(read(path.c_str(), std::ssize(content)));
+        EXPECT_EQ(image.data, nullptr);
+    }
+    EXPECT_EQ(dup(STDIN_FILENO), descriptor);
+    std::remove(path.c_str());
+}
+
+} // namespace

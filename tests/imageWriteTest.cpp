@@ -1,0 +1,279 @@
+// Images of every format into BMP and PNG streams and files.
+
+#include "hearth.h"
+#include "imageUtil.h"
+#include "support/faults.h"
+#include "support/messages.h"
+#include "support/testImage.h"
+
+#include <algorithm>
+#include <cerrno>
+#include <csetjmp>
+#include <cstdlib>
+#include <cstring>
+#include <fstream>
+#include <iterator>
+#include <png.h>
+#include <string>
+#include <unistd.h>
+
+using namespace quillon::test;
+
+namespace {
+
+using Bytes = std::vector<uint8>;
+
+bool writesShort = false;
+
+} // namespace
+
+// In the place of libhearth's.
+int FileIO_Write(FileIODescriptor *file, const void *source, size_t count, size_t *actual) {
+    const ssize_t written = write(file->fd, source, count - (writesShort ? 1 : 0));
+    *actual = static_cast<size_t>(std::max<ssize_t>(written, 0));
+    return written < 0 ? errno : 0;
+}
+
+namespace {
+
+bool encode(const ImageInfo &image, uint32 format, DynBuf *buffer) {
+    return format == IMAGEUTIL_FORMAT_PNG ? ImageUtil_ConstructPNGBuffer(&image, nullptr, buffer)
+                                          : ImageUtil_ConstructBMPBuffer(&image, buffer);
+}
+
+// What a call has put into a buffer, or nothing where it failed.
+template <class Call>
+Bytes written(const Call &call) {
+    DynBuf buffer = {};
+    const bool isWritten = call(&buffer);
+    EXPECT_EQ(buffer.data != nullptr, isWritten);
+    const Bytes bytes(buffer.data, buffer.data + buffer.size);
+    DynBuf_Destroy(&buffer);
+    return bytes;
+}
+
+Bytes fileOf(const ImageInfo &image, uint32 format) {
+    return written([&](DynBuf *buffer) { return encode(image, format, buffer); });
+}
+
+TEST(ImageWrite, BmpOfEveryFormat) {
+    forEachCase(600, [](Random &random) {
+        const Format format = kFormats[random.below(std::size(kFormats))];
+        const uint32 inRow = 1 + random.below(40), height = 1 + random.below(20);
+        const TestImage image(random, format, inRow, height, random.below(5)); // odd distances too
+        ImageInfo info = image.info;
+        // Of rows that lie closer than they are long, what there is comes first.
+        const uint32 width = info.width = inRow + (random.oneIn(4) ? 4 + random.below(9) : 0);
+        const bool isIndexed = format.bpp == 8;
+        const uint32 numColors = info.numColors =
+            isIndexed ? random.oneOf({256u, 257u, 0xFFFFFFFFu}) : 0;
+        const Bytes file = fileOf(info, IMAGEUTIL_FORMAT_BMP);
+
+        const uint32 offset = 54 + std::min(numColors, 256u) * 4;
+        const uint32 rowBytes = (width * (isIndexed ? 1 : 3) + 3) / 4 * 4;
+        ASSERT_EQ(file.size(), offset + rowBytes * height);
+        const uint32 imageBytes = rowBytes * height;
+        const uint32 planesAndBits = isIndexed ? 8u << 16 | 1 : 24u << 16 | 1;
+        const uint32 sizes[] = {offset + imageBytes, 0, offset, 40, width, height, planesAndBits};
+        const uint32 rest[] = {0, imageBytes, 0, 0, std::min(numColors, 256u), 0};
+        EXPECT_EQ(Bytes(&file[0], &file[2]), (Bytes{'B', 'M'}));
+        EXPECT_EQ(std::memcmp(&file[2], sizes, sizeof sizes), 0);
+        EXPECT_EQ(std::memcmp(&file[30], rest, sizeof rest), 0);
+        for (uint32 y = 0; y < height; ++y) {
+            const uint8 *const row = &file[offset + (height - 1 - y) * rowBytes];
+            for (uint32 x = 0; x < inRow; ++x) {
+                const uint8 *const p = isIndexed ? &file[54 + 4 * row[x]] : row + x * 3;
+                const Color expected = pictureColorAt(info, x, y);
+                ASSERT_EQ((Color{p[0], p[1], p[2], expected.alpha}), expected) << x << ", " << y;
+            }
+            // Behind them: padding of the image where rows are copied, then zeros.
+            const bool isCopied = isIndexed || format.bpp == 24;
+            const uint32 converted = std::min(width, info.bytesPerLine / (format.bpp / 8));
+            for (uint32 i = isCopied ? info.bytesPerLine : converted * 3; i < rowBytes; ++i)
+                EXPECT_EQ(row[i], 0);
+        }
+    });
+}
+
+TEST(ImageWrite, PngOfEveryFormat) {
+    forEachCase(400, [](Random &random) {
+        const Format format = kFormats[random.below(std::size(kFormats))];
+        TestImage image(random, format, 1 + random.below(40), 1 + random.below(20),
+                        random.below(4));
+        ImageInfo &info = image.info;
+        if (format.bpp == 8 && random.oneIn(4)) {
+            std::memset(info.data, 0, image.pixels.size());
+            info.numColors = random.oneOf({1u, 16u, 257u, 0xFFFFFFFFu});
+        }
+        const int32 level = random.between(-2, 12);
+        const ImageUtilPngOptions options = {level, random.oneIn(2)};
+        const bool isDefault = random.oneIn(3);
+        const Bytes file = written([&](DynBuf *buffer) {
+            return ImageUtil_ConstructPNGBuffer(&info, isDefault ? nullptr : &options, buffer);
+        });
+        const bool hasAlpha = format.bpp == 32 && !isDefault && !options.stripAlpha;
+        const int colorType = format.bpp == 8 ? PNG_COLOR_TYPE_PALETTE
+                              : hasAlpha      ? PNG_COLOR_TYPE_RGB_ALPHA
+                                              : PNG_COLOR_TYPE_RGB;
+        ASSERT_GT(file.size(), 40u);
+        EXPECT_EQ(Bytes(&file[24], &file[29]), (Bytes{8, static_cast<uint8>(colorType), 0, 0, 0}));
+        info.bytesPerLine -= format.bpp == 16 ? info.bytesPerLine % 2 : 0; // counts as even
+        ImageInfo read;
+        ASSERT_TRUE(ImageUtil_ReadPNGBuffer(&read, file.data(), static_cast<uint32>(file.size()),
+                                            IMAGEUTIL_READ_KEEP_ALPHA));
+        ASSERT_TRUE(read.width == info.width && read.height == info.height);
+        ASSERT_EQ(read.numColors, std::min(info.numColors, 256u));
+        expectColors(read, false, [&](uint32 x, uint32 y) { return pictureColorAt(info, x, y); });
+        ImageUtil_FreeImageData(&read);
+
+        // Bits 6 and 7 of the second byte of a zlib stream tell the effort made.
+        const char kChunk[] = {'I', 'D', 'A', 'T'};
+        const int effort = std::search(file.begin(), file.end(), kChunk, kChunk + 4)[5] >> 6;
+        const bool isLevel = !isDefault && level >= 0 && level <= 9 && level != 6;
+        const bool isSlow = isLevel && level > 6, isFast = isLevel && level < 2;
+        EXPECT_TRUE(effort == (isSlow ? 3 : isFast ? 0 : 2) || (isLevel && level < 6 && !isFast));
+    });
+}
+
+TEST(ImageWrite, WhatCannotBeWritten) {
+    Random random(4);
+    TestImage image(random, {24, 24}, 4, 4);
+    image.info.data[0] = 3;
+    const struct {
+        uint32 format, width, height, depth, bpp, bytesPerLine, numColors;
+    } cases[] = {
+        {IMAGEUTIL_FORMAT_BMP, 0x55555556, 4, 24, 24, 12, 0}, // rows of 2^32 + 2 bytes
+        {IMAGEUTIL_FORMAT_BMP, 0xFFFFFFFF, 4, 24, 24, 12, 0},
+        {IMAGEUTIL_FORMAT_BMP, 4, 0xFFFFFFFF, 24, 24, 12, 0},
+        {IMAGEUTIL_FORMAT_BMP, 0x7FFFFFFF, 0x7FFFFFFF, 24, 24, 12, 0},
+        {IMAGEUTIL_FORMAT_BMP, 0x10000, 0x10000, 24, 24, 12, 0},
+        {IMAGEUTIL_FORMAT_BMP, 4, 4, 7, 7, 12, 0},
+        {IMAGEUTIL_FORMAT_PNG, 0, 4, 24, 24, 12, 0},
+        {IMAGEUTIL_FORMAT_PNG, 4, 0xFFFFFFFF, 24, 24, 12, 0},
+        {IMAGEUTIL_FORMAT_PNG, 4, 4, 24, 24, 11, 0}, // shorter than its pixels
+        {IMAGEUTIL_FORMAT_PNG, 4, 4, 32, 16, 12, 0},
+        {IMAGEUTIL_FORMAT_PNG, 4, 4, 8, 8, 12, 0}, // without colours
+        {IMAGEUTIL_FORMAT_PNG, 4, 4, 8, 8, 12, 3}, // found out when pixels are written already
+    };
+    for (const auto &c : cases) {
+        ImageInfo info = image.info;
+        info.width = c.width, info.height = c.height, info.depth = c.depth, info.bpp = c.bpp;
+        info.bytesPerLine = c.bytesPerLine, info.numColors = c.numColors;
+        EXPECT_TRUE(fileOf(info, c.format).empty()) << "number " << &c - cases;
+    }
+    for (const uint32 format : {IMAGEUTIL_FORMAT_PNG, IMAGEUTIL_FORMAT_BMP}) {
+        // The exception must find nothing held; the leak sanitizer would tell.
+        ImageInfo info = image.info;
+        info.depth = 12, info.bpp = 16;
+        expectPanic("NOT_IMPLEMENTED lib/raster/rasterConv", [&] { fileOf(info, format); });
+        info.depth = 16, info.data = nullptr;
+        EXPECT_TRUE(fileOf(info, format).empty());
+    }
+}
+
+// The block stays for the caller to release; what is in it is given up.
+TEST(ImageWrite, PngStreamBeyond4GiB) {
+    png_structp png = png_create_write_struct(PNG_LIBPNG_VER_STRING, nullptr, nullptr, nullptr);
+    const ImageUtilMemOps noMemory = {};
+    uint8 block[4] = {};
+    for (const size_t length : {size_t{16}, ~size_t{0}}) {
+        ImageUtilPngBuffer buffer = {block, 0xFFFFFFF8u, 0xFFFFFFF8u, &noMemory};
+        png_set_write_fn(png, &buffer, ImageUtilBufferWriteCallback, nullptr);
+        if (setjmp(png_jmpbuf(png)) == 0) {
+            ImageUtilBufferWriteCallback(png, block, length);
+            ADD_FAILURE() << "no error";
+        }
+        EXPECT_TRUE(buffer.data == block && buffer.size == 0 && buffer.capacity == 0);
+    }
+    png_destroy_write_struct(&png, nullptr);
+}
+
+// Memory operations whose blocks no other functions could resize or free.
+size_t kAhead = 64; // its address is their context
+
+void *resizeBlock(void *context, void *block, size_t size) {
+    EXPECT_EQ(context, &kAhead);
+    void *whole = block == nullptr ? nullptr : static_cast<uint8 *>(block) - kAhead;
+    whole = std::realloc(whole, size + kAhead);
+    return whole == nullptr ? nullptr : static_cast<uint8 *>(whole) + kAhead;
+}
+
+void *takeBlock(void *context, size_t size) {
+    return resizeBlock(context, nullptr, size);
+}
+
+void releaseBlock(void *context, void *block) {
+    EXPECT_EQ(context, &kAhead);
+    std::free(block == nullptr ? nullptr : static_cast<uint8 *>(block) - kAhead);
+}
+
+TEST(ImageWrite, WithoutMemoryOrWithThatOfTheCaller) {
+    Random random(11);
+    for (const Format format : {Format{8, 8}, Format{15, 16}, Format{24, 32}}) {
+        const TestImage image(random, format, 50, 40);
+        const Bytes file = fileOf(image.info, IMAGEUTIL_FORMAT_PNG);
+        for (const uint32 kind : {IMAGEUTIL_FORMAT_PNG, IMAGEUTIL_FORMAT_BMP})
+            forEachMemoryFault([&] {
+                DynBuf buffer = {};
+                const bool isWritten = encode(image.info, kind, &buffer);
+                DynBuf_Destroy(&buffer);
+                return isWritten;
+            });
+        forEachMemoryFault([&] {
+            const ImageUtilMemOps ops = {&kAhead, takeBlock, releaseBlock, resizeBlock};
+            uint8 *data = image.info.data;
+            uint32 size = 77;
+            const bool isWritten =
+                ImageUtil_ConstructPNGBufferWithMemOps(&image.info, nullptr, &data, &size, &ops);
+            EXPECT_TRUE(isWritten ? std::equal(file.begin(), file.end(), data, data + size)
+                                  : data == image.info.data && size == 0);
+            if (isWritten)
+                releaseBlock(&kAhead, data);
+            return isWritten;
+        });
+    }
+}
+
+TEST(ImageWrite, FilesOrALoggedFailure) {
+    const std::string path = testing::TempDir() + "quillonWrite" + std::to_string(getpid());
+    const auto content = [&] {
+        std::ifstream file(path, std::ios::binary);
+        return Bytes(std::istreambuf_iterator<char>(file), {});
+    };
+    Random random(6);
+    const TestImage image(random, {24, 32}, 9, 5);
+    const auto write = [&](uint32 format, const std::string &name) {
+        return ImageUtil_WriteImage(&image.info, name.c_str(), format);
+    };
+    expectPanic("NOT_IMPLEMENTED lib/image/imageUtil", [&] { write(2, path); });
+    EXPECT_FALSE(ImageUtil_WritePNG(nullptr, path.c_str(), nullptr));
+    EXPECT_NE(access(path.c_str(), F_OK), 0);
+    const int descriptor = dup(STDIN_FILENO); // the lowest that is free
+    close(descriptor);
+
+    std::ofstream(path) << std::string(100000, 'x');
+    ASSERT_TRUE(write(IMAGEUTIL_FORMAT_BMP, path));
+    EXPECT_EQ(content(), fileOf(image.info, IMAGEUTIL_FORMAT_BMP));
+    ASSERT_TRUE(write(IMAGEUTIL_FORMAT_PNG, path));
+    EXPECT_EQ(content().at(25), 2); // no alpha by default
+    const ImageUtilPngOptions options = {.compressionLevel = 0, .stripAlpha = false};
+    ASSERT_TRUE(ImageUtil_WritePNG(&image.info, path.c_str(), &options));
+    EXPECT_EQ(content().at(25), 6);
+    EXPECT_TRUE(logs.empty());
+
+    EXPECT_FALSE(write(IMAGEUTIL_FORMAT_PNG, "/nowhere/at.all"));
+    EXPECT_FALSE(write(IMAGEUTIL_FORMAT_PNG, "/dev/full"));
+    writesShort = true;
+    EXPECT_FALSE(write(IMAGEUTIL_FORMAT_BMP, path));
+    EXPECT_EQ(dup(STDIN_FILENO), descriptor);
+    EXPECT_EQ(content().size() + 1,
+              fileOf(image.info, IMAGEUTIL_FORMAT_BMP).size()); // it is not removed
+    const std::vector<std::string> expected = {
+        "ImageUtilWriteBuf: Failed open file '/nowhere/at.all': No such file or directory (2)\n",
+        "ImageUtilWriteBuf: Failed to write file '/dev/full': No space left on device (28)\n",
+        "ImageUtilWriteBuf: Wrong number of image bytes written to '" + path + "': Success (0)\n"};
+    EXPECT_EQ(logs, expected);
+    std::remove(path.c_str());
+}
+
+} // namespace
