@@ -7,6 +7,7 @@
 
 #include <algorithm>
 #include <cstring>
+#include <memory>
 #include <png.h>
 
 namespace quillon::bench {
@@ -16,12 +17,11 @@ namespace {
 Contender memoryPass(size_t read, size_t written) {
     return {"one pass", Agreement::Approximate, [=](const Job & /*job*/) -> Work {
                 return [=, from = std::vector<uint8>(read, 1)] {
-                    auto *to = static_cast<uint8 *>(std::malloc(written));
+                    const std::unique_ptr<uint8[]> to(new uint8[written]); // not cleared
                     for (size_t done = 0; done < written; done += read)
-                        std::memcpy(to + done, from.data(), std::min(read, written - done));
-                    benchmark::DoNotOptimize(to);
+                        std::memcpy(to.get() + done, from.data(), std::min(read, written - done));
+                    benchmark::DoNotOptimize(to.get());
                     benchmark::ClobberMemory();
-                    std::free(to);
                 };
             }};
 }
@@ -57,15 +57,14 @@ Work readDirectly() {
         png_set_bgr(png);
         const size_t rowBytes = png_get_rowbytes(png, info);
         const uint32 height = png_get_image_height(png, info);
-        auto *pixels = static_cast<uint8 *>(std::malloc(rowBytes * height));
+        const std::unique_ptr<uint8[]> pixels(new uint8[rowBytes * height]); // not cleared
         std::vector<png_bytep> rows;
         for (uint32 y = 0; y < height; ++y)
-            rows.push_back(pixels + y * rowBytes);
+            rows.push_back(pixels.get() + y * rowBytes);
         png_read_image(png, rows.data());
         png_read_end(png, nullptr);
         png_destroy_read_struct(&png, &info, nullptr);
-        benchmark::DoNotOptimize(pixels);
-        std::free(pixels);
+        benchmark::DoNotOptimize(pixels.get());
     };
 }
 
