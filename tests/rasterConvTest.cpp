@@ -90,6 +90,45 @@ TEST(ConvertPixels, matchesReference) {
     });
 }
 
+// Beyond the caches there are other stores, which need aligned addresses: rows that
+// begin everywhere in a line, and pixels that never begin one.
+TEST(ConvertPixels, matchesReferenceOnLargeSurfaces) {
+    constexpr uint32 kWidth = 1037, kLeast = 2 << 20;
+    Random random(baseSeed());
+    std::vector<uint32> palette(256);
+    random.fill(reinterpret_cast<uint8 *>(palette.data()), 256 * sizeof(uint32));
+    for (const int32 srcDepth : {8, 15, 16, 24, 32})
+        for (const int32 dstDepth : {8, 16, 24, 32}) {
+            const Pair pair = {srcDepth, dstDepth, srcDepth == 8, palette.data()};
+            const uint32 height = kLeast / (kWidth * bytesOf(dstDepth)) + 1;
+            const auto lineOf = [](int32 depth) { return (kWidth + 3) * bytesOf(depth); };
+            const FencedBuffer src(size_t{height} * lineOf(srcDepth));
+            random.fill(src.data(), src.size());
+            const uint32 odd = srcDepth == 24 ? 1 : 0;
+            const FencedBuffer dst(size_t{height} * lineOf(dstDepth) + odd);
+            std::vector<uint8> expected(dst.size(), 0x5A);
+            for (uint32 y = 0; y < height; ++y)
+                for (uint32 x = 0; x < kWidth; ++x) {
+                    uint32 pixel = 0;
+                    std::memcpy(&pixel,
+                                src.data() + y * lineOf(srcDepth) + (x + 3) * bytesOf(srcDepth),
+                                bytesOf(srcDepth));
+                    const uint32 wanted = convertedByReference(pair, pixel);
+                    std::memcpy(&expected[y * lineOf(dstDepth) + x * bytesOf(dstDepth)], &wanted,
+                                bytesOf(dstDepth));
+                }
+            forEachTarget([&] {
+                std::fill(dst.data(), dst.end(), uint8{0x5A});
+                convert(pair, 0,
+                        {{dst.data(), nullptr, lineOf(dstDepth), 0, 0},
+                         {src.data(), nullptr, lineOf(srcDepth), 3, 0}},
+                        {kWidth, height});
+                EXPECT_TRUE(std::equal(dst.data(), dst.end(), expected.begin(), expected.end()))
+                    << srcDepth << " to " << dstDepth;
+            });
+        }
+}
+
 // All there is in 16 bits, as a rectangle and one by one.
 TEST(ConvertPixels, every16BitPixel) {
     constexpr uint32 kSide = 256;

@@ -1,203 +1,48 @@
 #include "raster/rasterConvKernels.h"
 
+#include <algorithm>
+
 #undef HWY_TARGET_INCLUDE
 #define HWY_TARGET_INCLUDE "raster/rasterConvKernels.cpp"
 #include "hwy/foreach_target.h"
 #include "hwy/highway.h"
 
 #include "raster/kernels-inl.h"
-#include "raster/packed24-inl.h"
+#include "raster/pixelWords-inl.h"
+#include "raster/streaming-inl.h"
 
-// A conversion is a source, which loads a vector of pixels as words of the
-// 32-bit layout, and a destination, which stores such words.  Narrowing what has
-// been widened gives back every bit, so the detour through words, which never
-// leaves the registers, costs nothing in exactness.  Pairs whose pixels stay
-// within 16 bits skip it.
+// A conversion goes over a row in blocks, as many pixels as a vector has bytes.  It
+// is a source, which loads a block as vectors of words of the 32-bit layout, and a
+// destination, which stores such vectors.  Narrowing what has been widened gives
+// back every bit, so that the detour through words, which never leaves the
+// registers, costs nothing in exactness.  Pairs whose pixels stay within 16 bits
+// skip it.
 
 HWY_BEFORE_NAMESPACE();
 namespace quillon::HWY_NAMESPACE {
 namespace {
 
-template <class D>
-HWY_INLINE hn::Vec<D> masked(D d, hn::Vec<D> v, uint32_t mask) {
-    return hn::And(v, hn::Set(d, static_cast<hn::TFromD<D>>(mask)));
-}
-
-// A shift to the right, or to the left where the distance is negative.
-template <int kDistance, class V>
-HWY_INLINE V shiftedRight(V v) {
-    if constexpr (kDistance >= 0)
-        return hn::ShiftRight<kDistance>(v);
-    else
-        return hn::ShiftLeft<-kDistance>(v);
-}
-
-// Pixels moved into a one-byte layout, in lanes of any width.
-template <ChannelEnds kEnds, int kDepth, class D>
-HWY_INLINE hn::Vec<D> toSmall(D d, hn::Vec<D> v) {
-    constexpr const auto &mask = RasterSmallMasks[kDepth];
-    const auto red = shiftedRight<shiftToMask(kEnds.red, mask[0])>(v);
-    const auto green = shiftedRight<shiftToMask(kEnds.green, mask[1])>(v);
-    const auto blue = shiftedRight<shiftToMask(kEnds.blue, mask[2])>(v);
-    return hn::Or(masked(d, red, mask[0]),
-                  hn::Or(masked(d, green, mask[1]), masked(d, blue, mask[2])));
-}
-
-// ---- Sources ------------------------------------------------------------
-
-// 16-bit pixels, one to a lane of 32 bits.
-template <class D>
-HWY_INLINE hn::Vec<D> load16(D d, const uint8_t *src) {
-    const hn::Rebind<uint16_t, D> d16;
-    return hn::PromoteTo(d, hn::LoadU(d16, reinterpret_cast<const uint16_t *>(src)));
-}
-
-struct From15 {
-    static constexpr size_t kBytes = 2;
-    static constexpr bool kHasAlpha = false;
-
-    template <class D>
-    HWY_INLINE static hn::Vec<D> load(D d, const uint8_t *src, const uint32_t * /*palette*/) {
-        const auto p = load16(d, src);
-        const auto top = hn::Or(
-            hn::ShiftLeft<9>(masked(d, p, 0x7C00)),
-            hn::Or(hn::ShiftLeft<6>(masked(d, p, 0x03E0)), hn::ShiftLeft<3>(masked(d, p, 0x001F))));
-        return hn::Or(top, masked(d, hn::ShiftRight<5>(top), 0x070707));
-    }
+// What conversions have to be told beyond their layouts.
+struct Tables {
+    const uint32_t *palette;
+    Weights weights;
 };
 
-struct From16 {
-    static constexpr size_t kBytes = 2;
-    static constexpr bool kHasAlpha = false;
-
-    template <class D>
-    HWY_INLINE static hn::Vec<D> load(D d, const uint8_t *src, const uint32_t * /*palette*/) {
-        const auto p = load16(d, src);
-        const auto top = hn::Or(
-            hn::ShiftLeft<8>(masked(d, p, 0xF800)),
-            hn::Or(hn::ShiftLeft<5>(masked(d, p, 0x07E0)), hn::ShiftLeft<3>(masked(d, p, 0x001F))));
-        return hn::Or(top, hn::Or(masked(d, hn::ShiftRight<5>(top), 0x070007),
-                                  masked(d, hn::ShiftRight<6>(top), 0x000300)));
-    }
-};
-
-struct From24 {
-    static constexpr size_t kBytes = 3;
-    static constexpr bool kHasAlpha = false;
-
-    template <class D>
-    HWY_INLINE static hn::Vec<D> load(D d, const uint8_t *src, const uint32_t * /*palette*/) {
-        return load24(d, src);
-    }
-};
-
-struct From32 {
-    static constexpr size_t kBytes = 4;
-    static constexpr bool kHasAlpha = true;
-
-    template <class D>
-    HWY_INLINE static hn::Vec<D> load(D d, const uint8_t *src, const uint32_t * /*palette*/) {
-        return hn::LoadU(d, reinterpret_cast<const uint32_t *>(src));
-    }
-};
-
-struct FromIndex {
-    static constexpr size_t kBytes = 1;
-    static constexpr bool kHasAlpha = true;
-
-    template <class D>
-    HWY_INLINE static hn::Vec<D> load(D d, const uint8_t *src, const uint32_t *palette) {
-        // A gather of less than four lanes would look up the lanes that are not
-        // there, too.
-        constexpr size_t n = kLanes<D>;
-        if constexpr (n == 1) {
-            return hn::Set(d, palette[src[0]]);
-        } else if constexpr (n == 2) {
-            const hn::Repartition<uint64_t, D> d64;
-            return hn::BitCast(d, hn::Set(d64, palette[src[0]] | uint64_t{palette[src[1]]} << 32));
-        } else {
-            const hn::Rebind<int32_t, D> index;
-            const hn::Rebind<uint8_t, D> d8;
-            return hn::GatherIndex(d, palette, hn::PromoteTo(index, hn::LoadU(d8, src)));
-        }
-    }
-};
-
-// ---- Destinations -------------------------------------------------------
-
-template <class D>
-HWY_INLINE void store16(D /*d*/, hn::Vec<D> v, uint8_t *dst) {
-    const hn::Rebind<uint16_t, D> d16;
-    hn::StoreU(hn::TruncateTo(d16, v), d16, reinterpret_cast<uint16_t *>(dst));
-}
-
-template <int kDepth>
-struct ToSmall {
-    static constexpr size_t kBytes = 1;
-    static constexpr bool kHasAlpha = false;
-
-    template <class D>
-    HWY_INLINE static void store(D d, hn::Vec<D> v, uint8_t *dst) {
-        const hn::Rebind<uint8_t, D> d8;
-        hn::StoreU(hn::TruncateTo(d8, toSmall<kEnds32, kDepth>(d, v)), d8, dst);
-    }
-};
-
-template <int kRedShift, uint32_t kRed, int kGreenShift, uint32_t kGreen>
-struct To16Bits {
-    static constexpr size_t kBytes = 2;
-    static constexpr bool kHasAlpha = false;
-
-    template <class D>
-    HWY_INLINE static void store(D d, hn::Vec<D> v, uint8_t *dst) {
-        store16(d,
-                hn::Or(masked(d, hn::ShiftRight<kRedShift>(v), kRed),
-                       hn::Or(masked(d, hn::ShiftRight<kGreenShift>(v), kGreen),
-                              masked(d, hn::ShiftRight<3>(v), 0x001F))),
-                dst);
-    }
-};
-using To15 = To16Bits<9, 0x7C00, 6, 0x03E0>;
-using To16 = To16Bits<8, 0xF800, 5, 0x07E0>;
-
-struct To24 {
-    static constexpr size_t kBytes = 3;
-    static constexpr bool kHasAlpha = false;
-
-    template <class D>
-    HWY_INLINE static void store(D d, hn::Vec<D> v, uint8_t *dst) {
-        store24(d, v, dst);
-    }
-};
-
-struct To32 {
-    static constexpr size_t kBytes = 4;
-    static constexpr bool kHasAlpha = true;
-
-    template <class D>
-    HWY_INLINE static void store(D d, hn::Vec<D> v, uint8_t *dst) {
-        hn::StoreU(v, d, reinterpret_cast<uint32_t *>(dst));
-    }
-};
-
-// ---- Bodies -------------------------------------------------------------
+// ---- Conversions of a block ----------------------------------------------
 
 template <class Source, class Destination>
 struct ThroughWords {
-    using Lane = uint32_t;
     static constexpr size_t kSrcBytes = Source::kBytes;
     static constexpr size_t kDstBytes = Destination::kBytes;
 
-    uint8_t *dst;
-    const uint8_t *src;
-    const uint32_t *palette;
-
-    template <class D>
-    HWY_INLINE void operator()(D d, size_t i) const {
-        auto words = Source::load(d, src + i * kSrcBytes, palette);
-        if constexpr (Destination::kHasAlpha && !Source::kHasAlpha)
-            words = hn::Or(words, hn::Set(d, 0xFF000000));
-        Destination::store(d, words, dst + i * kDstBytes);
+    template <class Stores, class D8>
+    HWY_INLINE static void convert(D8 /*d*/, uint8_t *dst, const uint8_t *src,
+                                   const Tables &tables) {
+        constexpr bool kOpaque = Destination::kHasAlpha && !Source::kHasAlpha;
+        const hn::CappedTag<uint32_t, kLanes<D8>> d;
+        hn::Vec<decltype(d)> words[kLanes<D8> / kLanes<decltype(d)>];
+        Source::template load<kOpaque>(d, src, tables.palette, words);
+        Destination::template store<Stores>(d, words, dst, tables.weights);
     }
 };
 
@@ -220,36 +65,60 @@ struct Narrow16To15 {
 // From one layout of 16 bits to the other.
 template <class Conversion>
 struct Within16 {
-    using Lane = uint16_t;
     static constexpr size_t kSrcBytes = 2;
     static constexpr size_t kDstBytes = 2;
 
-    uint8_t *dst;
-    const uint8_t *src;
-    const uint32_t *palette;
-
-    template <class D>
-    HWY_INLINE void operator()(D d, size_t i) const {
-        const auto p = hn::LoadU(d, reinterpret_cast<const uint16_t *>(src + 2 * i));
-        hn::StoreU(Conversion::converted(d, p), d, reinterpret_cast<uint16_t *>(dst + 2 * i));
+    template <class Stores, class D8>
+    HWY_INLINE static void convert(D8 /*d*/, uint8_t *dst, const uint8_t *src,
+                                   const Tables & /*tables*/) {
+        const hn::CappedTag<uint16_t, kLanes<D8>> d;
+        for (size_t i = 0; i < 2 * kLanes<D8>; i += 2 * kLanes<decltype(d)>) {
+            const auto p = hn::LoadU(d, reinterpret_cast<const uint16_t *>(src + i));
+            Stores::store(d, Conversion::converted(d, p), dst + i);
+        }
     }
 };
 
+// A shift to the right, or to the left where the distance is negative.
+template <int kDistance, class V>
+HWY_INLINE V shiftedRight(V v) {
+    if constexpr (kDistance >= 0)
+        return hn::ShiftRight<kDistance>(v);
+    else
+        return hn::ShiftLeft<-kDistance>(v);
+}
+
+// Pixels of 16 bits moved into a one-byte layout.
+template <ChannelEnds kEnds, int kDepth, class D>
+HWY_INLINE hn::Vec<D> toSmall(D d, hn::Vec<D> v) {
+    constexpr const auto &mask = RasterSmallMasks[kDepth];
+    const auto red = shiftedRight<shiftToMask(kEnds.red, mask[0])>(v);
+    const auto green = shiftedRight<shiftToMask(kEnds.green, mask[1])>(v);
+    const auto blue = shiftedRight<shiftToMask(kEnds.blue, mask[2])>(v);
+    return hn::Or(masked(d, red, mask[0]),
+                  hn::Or(masked(d, green, mask[1]), masked(d, blue, mask[2])));
+}
+
 template <ChannelEnds kEnds, int kDepth>
 struct From16ToSmall {
-    using Lane = uint16_t;
     static constexpr size_t kSrcBytes = 2;
     static constexpr size_t kDstBytes = 1;
 
-    uint8_t *dst;
-    const uint8_t *src;
-    const uint32_t *palette;
+    template <class Stores, class D8>
+    HWY_INLINE static void convert(D8 d8, uint8_t *dst, const uint8_t *src,
+                                   const Tables & /*tables*/) {
+        const hn::CappedTag<uint16_t, kLanes<D8>> d;
+        constexpr size_t n = kLanes<decltype(d)>;
+        if constexpr (kLanes<D8> == n)
+            Stores::store(d8, hn::TruncateTo(d8, pixels(d, src)), dst);
+        else
+            Stores::store(d8, packed8(d8, pixels(d, src), pixels(d, src + 2 * n)), dst);
+    }
 
+private:
     template <class D>
-    HWY_INLINE void operator()(D d, size_t i) const {
-        const hn::Rebind<uint8_t, D> d8;
-        const auto p = hn::LoadU(d, reinterpret_cast<const uint16_t *>(src + 2 * i));
-        hn::StoreU(hn::TruncateTo(d8, toSmall<kEnds, kDepth>(d, p)), d8, dst + i);
+    HWY_INLINE static hn::Vec<D> pixels(D d, const uint8_t *src) {
+        return toSmall<kEnds, kDepth>(d, hn::LoadU(d, reinterpret_cast<const uint16_t *>(src)));
     }
 };
 
@@ -258,36 +127,135 @@ struct From16ToSmall {
 struct Job {
     DstRows dst;
     SrcRows src;
-    const uint32 *palette;
+    Tables tables;
     Size size;
 };
 
-template <class Body>
-void walkRows(const Job &job) {
-    const Size size = joinedRows(job.size, Body::kDstBytes * job.size.width, job.dst.step,
-                                 Body::kSrcBytes * job.size.width, job.src.step);
-    for (size_t y = 0; y < size.height; ++y)
-        walkAgain<typename Body::Lane>(size.width,
-                                       Body{job.dst.row(y), job.src.row(y), job.palette});
+// From how many pixels on it pays to align the blocks to the destination's lines.
+inline constexpr size_t kLongRow = 512;
+
+// How many bytes to ask for ahead of the block at hand where the source is not in
+// the caches: what the processor asks for itself ends with a page.
+inline constexpr size_t kAhead = 3072;
+
+// A row of a conversion, by pixels.
+template <class Conversion>
+struct RowOf {
+    uint8_t *dst;
+    const uint8_t *src;
+    Tables tables;
+
+    template <class Stores, class D8>
+    HWY_INLINE void convert(D8 d, size_t i) const {
+        Conversion::template convert<Stores>(d, dst + i * Conversion::kDstBytes,
+                                             src + i * Conversion::kSrcBytes, tables);
+    }
+    HWY_INLINE void prefetch(size_t i, size_t count) const {
+        for (size_t ahead = kAhead; ahead < kAhead + count * Conversion::kSrcBytes; ahead += 64)
+            hwy::Prefetch(src + i * Conversion::kSrcBytes + ahead);
+    }
+};
+
+// Every pixel of each row at least once, in blocks of kBlock pixels, of which the
+// last may overlap the one before; rows shorter than that in the next smaller ones.
+template <class Conversion, size_t kBlock = kLanes<Widest<uint8_t>>>
+HWY_NOINLINE void convertRows(const Job &job) {
+    if constexpr (kBlock > 1) {
+        if (job.size.width < kBlock)
+            return convertRows<Conversion, kBlock / (kBlock > 16 ? 2 : 4)>(job);
+    }
+    const hn::CappedTag<uint8_t, kBlock> d;
+    const size_t last = job.size.width - kBlock;
+    RowOf<Conversion> row = {job.dst.first, job.src.first, job.tables};
+    for (size_t y = 0; y < job.size.height; ++y) {
+        for (size_t i = 0;; i = std::min(i + kBlock, last)) {
+            row.template convert<ThroughCaches>(d, i);
+            if (i == last)
+                break;
+        }
+        row.dst = advance(row.dst, static_cast<size_t>(job.dst.step));
+        row.src = advance(row.src, static_cast<size_t>(job.src.step));
+    }
+}
+
+// A piece of a row; it may be empty.
+template <class Conversion>
+HWY_NOINLINE void convertPiece(const RowOf<Conversion> &row, size_t begin, size_t end) {
+    if (begin != end)
+        convertRows<Conversion>({{row.dst + begin * Conversion::kDstBytes, 0},
+                                 {row.src + begin * Conversion::kSrcBytes, 0},
+                                 row.tables,
+                                 {end - begin, 1}});
+}
+
+// Long rows: from the first pixel on that begins a cache line, all blocks fill lines.
+template <class Conversion>
+HWY_NOINLINE void convertLongRows(const Job &job) {
+    const Widest<uint8_t> d;
+    constexpr size_t n = kLanes<decltype(d)>;
+    const size_t width = job.size.width;
+    const bool streams = isStreamed(Conversion::kDstBytes * width, job.size.height);
+    for (size_t y = 0; y < job.size.height; ++y) {
+        const RowOf<Conversion> row = {job.dst.row(y), job.src.row(y), job.tables};
+        const size_t toLine = pixelsToLine<Conversion::kDstBytes>(row.dst);
+        const size_t begin = toLine < 64 ? toLine : width;
+        size_t i = begin;
+        convertPiece(row, 0, begin);
+        if (streams) {
+            for (; width - i >= n; i += n) {
+                row.prefetch(i, n);
+                row.template convert<AroundCaches>(d, i);
+            }
+        } else {
+            for (; width - i >= n; i += n)
+                row.template convert<ToWholeLines>(d, i);
+        }
+        convertPiece(row, i, width);
+    }
+    if (streams)
+        hwy::FlushStream();
+}
+
+template <class Conversion>
+void convertRectangle(Job job) {
+    job.size = joinedRows(job.size, Conversion::kDstBytes * job.size.width, job.dst.step,
+                          Conversion::kSrcBytes * job.size.width, job.src.step);
+    constexpr size_t n = kLanes<Widest<uint8_t>>;
+    if (n > 1 && job.size.width >= kLongRow)
+        convertLongRows<Conversion>(job);
+    else
+        convertRows<Conversion>(job);
+}
+
+Weights weightsOf(Layout layout) {
+    switch (layout) {
+    case Layout::Small3:
+    case Layout::Small6:
+    case Layout::Small8:
+        return weightsOfSmall(static_cast<size_t>(layout));
+    case Layout::Rgb15:
+        return kWeights15;
+    case Layout::Rgb16:
+        return kWeights16;
+    default:
+        return {};
+    }
 }
 
 template <class Source>
 void convertWords(Layout dstLayout, const Job &job) {
     switch (dstLayout) {
     case Layout::Small3:
-        return walkRows<ThroughWords<Source, ToSmall<3>>>(job);
     case Layout::Small6:
-        return walkRows<ThroughWords<Source, ToSmall<6>>>(job);
     case Layout::Small8:
-        return walkRows<ThroughWords<Source, ToSmall<8>>>(job);
+        return convertRectangle<ThroughWords<Source, ToSmall>>(job);
     case Layout::Rgb15:
-        return walkRows<ThroughWords<Source, To15>>(job);
     case Layout::Rgb16:
-        return walkRows<ThroughWords<Source, To16>>(job);
+        return convertRectangle<ThroughWords<Source, To16Bits>>(job);
     case Layout::Rgb24:
-        return walkRows<ThroughWords<Source, To24>>(job);
+        return convertRectangle<ThroughWords<Source, To24>>(job);
     case Layout::Rgb32:
-        return walkRows<ThroughWords<Source, To32>>(job);
+        return convertRectangle<ThroughWords<Source, To32>>(job);
     case Layout::Index:
         return;
     }
@@ -298,18 +266,18 @@ template <class Source, ChannelEnds kEnds, class Conversion>
 void convert16(Layout dstLayout, const Job &job) {
     switch (dstLayout) {
     case Layout::Small3:
-        return walkRows<From16ToSmall<kEnds, 3>>(job);
+        return convertRectangle<From16ToSmall<kEnds, 3>>(job);
     case Layout::Small6:
-        return walkRows<From16ToSmall<kEnds, 6>>(job);
+        return convertRectangle<From16ToSmall<kEnds, 6>>(job);
     case Layout::Small8:
-        return walkRows<From16ToSmall<kEnds, 8>>(job);
+        return convertRectangle<From16ToSmall<kEnds, 8>>(job);
     case Layout::Rgb15:
     case Layout::Rgb16:
-        return walkRows<Within16<Conversion>>(job);
+        return convertRectangle<Within16<Conversion>>(job);
     case Layout::Rgb24:
-        return walkRows<ThroughWords<Source, To24>>(job);
+        return convertRectangle<ThroughWords<Source, To24>>(job);
     case Layout::Rgb32:
-        return walkRows<ThroughWords<Source, To32>>(job);
+        return convertRectangle<ThroughWords<Source, To32>>(job);
     case Layout::Index:
         return;
     }
@@ -317,7 +285,7 @@ void convert16(Layout dstLayout, const Job &job) {
 
 void Convert(Layout dstLayout, DstRows dst, Layout srcLayout, SrcRows src, const uint32 *palette,
              Size size) {
-    const Job job = {dst, src, palette, size};
+    const Job job = {dst, src, {palette, weightsOf(dstLayout)}, size};
     switch (srcLayout) {
     case Layout::Index:
         return convertWords<FromIndex>(dstLayout, job);
