@@ -400,8 +400,9 @@ QUILLON_API void RasterCopyPixels(uint8 *dstBuffer, uint32 dstLineIncrement, con
  * may come out one or two levels low.  A shrink by more than 32 averages only
  * the first 32 rows of each span, and comes out darker accordingly.
  *
- * Where rows are mixed (filtered, at a vertical factor other than 1), takes one
- * block of scratch memory for the call: a few destination rows, 33 at most.
+ * Where rows are mixed (filtered, at a vertical factor other than 1), takes at
+ * most one block of scratch memory for the call: a few destination rows, 33 at
+ * most.
  *
  * Rows: exact; the line increments may be negative, srcLineIncrement may be 0.
  *

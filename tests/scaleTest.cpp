@@ -143,6 +143,26 @@ TEST(Scale, equalsItsStatement) {
     });
 }
 
+// Large enough to be written around the caches, from rows at odd addresses.
+TEST(Scale, largeSurfacesEqualTheirStatement) {
+    forEachTarget([] {
+        Random random(baseSeed());
+        for (const double scale : {3.0, 0.9, 0.5, 0.3, 0.25, 0.125, 0.0625})
+            for (const uint32 filter : {0u, 2u}) {
+                const auto srcWidth = static_cast<uint32>(1200 / scale) - 1;
+                const int32 increment = 4 * 1200 + random.oneOf({0, 4, 13, 64});
+                expectAsStated({{srcWidth, 20, static_cast<int32>(4 * srcWidth)},
+                                {1200, 340, increment},
+                                random.oneIn(4) ? 7 : 0,
+                                0,
+                                scale,
+                                scale,
+                                filter},
+                               random);
+            }
+    });
+}
+
 // Sizes are looked at first, then factors, then what is empty.
 TEST(Scale, refusals) {
     struct {

@@ -4,6 +4,7 @@
 #include "raster.h"
 #include "rectSequences.h"
 
+#include <algorithm>
 #include <random>
 
 namespace quillon::bench {
@@ -38,10 +39,46 @@ std::vector<ListStep> touching() {
     return steps;
 }
 
+std::vector<ListStep> shuffledGrid() {
+    std::vector<ListStep> steps = grid();
+    std::shuffle(steps.begin(), steps.end(), std::mt19937(2));
+    return steps;
+}
+
+// Damage that comes in clusters far from each other.
+std::vector<ListStep> clusters() {
+    std::mt19937 random(3);
+    std::vector<ListStep> steps;
+    for (int i = 0; i < 12; ++i) {
+        const auto below = [&](uint32 bound) { return static_cast<int32>(random() % bound); };
+        steps.push_back({false, 600 * (i % 3) + below(60), 400 * (i % 2) + below(40), 40, 20});
+    }
+    return steps;
+}
+
+std::vector<ListStep> crossingBars() {
+    return {{false, 0, 100, 1000, 20}, {false, 100, 0, 20, 600}, {false, 0, 400, 1000, 20}};
+}
+
 std::vector<ListStep> holes() {
     std::vector<ListStep> steps = {{false, 0, 0, 1000, 600}};
     for (int32 i = 0; i < 3; ++i)
         steps.push_back({true, 100 + 250 * i, 100 + 150 * i, 50, 50});
+    return steps;
+}
+
+std::vector<ListStep> holesInARow() {
+    std::vector<ListStep> steps = {{false, 0, 0, 1000, 600}};
+    for (int32 i = 0; i < 8; ++i)
+        steps.push_back({true, 50 + 110 * i, 200, 50, 50});
+    return steps;
+}
+
+// Cuts between the rectangles of a grid.
+std::vector<ListStep> missedCuts() {
+    std::vector<ListStep> steps = grid();
+    for (int32 i = 0; i < 8; ++i)
+        steps.push_back({true, 65 + 100 * (i % 3), 70 * (i % 4), 30, 50});
     return steps;
 }
 
@@ -60,8 +97,13 @@ const std::vector<RectSequence> &rectSequences() {
         {"two apart", {{false, 10, 20, 300, 200}, {false, 10, 400, 300, 200}}},
         {"damage", damage()},
         {"grid", grid()},
+        {"shuffled grid", shuffledGrid()},
         {"touching tiles", touching()},
+        {"clusters", clusters()},
+        {"crossing bars", crossingBars()},
         {"holes", holes()},
+        {"holes in a row", holesInARow()},
+        {"missed cuts", missedCuts()},
         {"typing", typing()},
     };
     return sequences;

@@ -89,25 +89,29 @@ BmpHeaders makeHeaders(const ImageInfo &image, const BmpLayout &layout) {
     return headers;
 }
 
-// One row of the file.  Neither way reads behind the end of the source row;
-// what it lacks stays zero.
-void fillRow(uint8 *fileRow, const BmpLayout &layout, const ImageInfo &image, uint32 row) {
+// One row of the file, without what follows the pixels.  Neither way reads behind
+// the end of the source row.  Gives the number of bytes.
+uint64_t fillRow(uint8 *fileRow, const BmpLayout &layout, const ImageInfo &image, uint32 row) {
     const uint8 *const source = rowAt(image, row);
     if (isCopied(image)) {
         // With the source's padding, as far as the file's row has room for it.
-        std::memcpy(fileRow, source, std::min<uint64_t>(layout.rowBytes, image.bytesPerLine));
-        return;
+        const uint64_t bytes = std::min<uint64_t>(layout.rowBytes, image.bytesPerLine);
+        std::memcpy(fileRow, source, bytes);
+        return bytes;
     }
     const int32 depth = conversionDepth(image);
     const uint32 width = std::min(image.width, image.bytesPerLine / bytesAtDepth(depth));
     Raster_ConvertPixels(fileRow, static_cast<uint32>(layout.rowBytes), 24, source,
                          image.bytesPerLine, depth, false, nullptr, 0, 0, 0, 0, width, 1);
+    return uint64_t{width} * 3;
 }
 
 void fillRows(uint8 *block, const BmpLayout &layout, const ImageInfo &image) {
     for (uint32 i = 0; i < image.height; ++i) {
         const uint32 row = isBottomUp(image) ? i : image.height - 1 - i;
-        fillRow(block + i * layout.rowBytes, layout, image, row);
+        uint8 *const fileRow = block + i * layout.rowBytes;
+        const uint64_t bytes = fillRow(fileRow, layout, image, row);
+        std::memset(fileRow + bytes, 0, layout.rowBytes - bytes);
     }
 }
 
@@ -123,8 +127,7 @@ bool ImageUtil_ConstructBMPBuffer(const ImageInfo *image, DynBuf *buffer) {
         return false;
     }
     const BmpHeaders headers = makeHeaders(*image, layout);
-    // Zeroed, for the padding of converted rows.
-    uint8 *const block = static_cast<uint8 *>(std::calloc(layout.imageBytes, 1));
+    uint8 *const block = static_cast<uint8 *>(std::malloc(layout.imageBytes));
     if (block == nullptr) {
         return false;
     }

@@ -111,9 +111,23 @@ bool isEmptyList(const RasterRectList &list) {
 }
 
 bool isZeroFrom(const RasterRectList &list, int slot) {
-    static constexpr RasterRectListEntry kNone[kSlots] = {};
-    return std::memcmp(list.entries + slot, kNone,
-                       static_cast<size_t>(kSlots - slot) * sizeof(kNone[0])) == 0;
+    // Field by field, so that one instruction takes an entry.
+    RasterRectListEntry bits = {};
+    for (; slot < kSlots; ++slot) {
+        bits.x |= list.entries[slot].x;
+        bits.y |= list.entries[slot].y;
+        bits.width |= list.entries[slot].width;
+        bits.height |= list.entries[slot].height;
+    }
+    return (bits.x | bits.y | bits.width | bits.height) == 0;
+}
+
+// Entry by entry: compilers clear a whole record of this size by a string
+// instruction, which takes longer.
+void clear(RasterRectList &list) {
+#pragma GCC unroll 16
+    for (RasterRectListEntry &entry : list.entries)
+        entry = {};
 }
 
 // Whether a list that is not empty has one entry and is in normal form.
@@ -363,17 +377,20 @@ Rect *appendJoinedRows(const Survey &survey, const Rect &rect, Pieces &pieces) {
     for (int32 y = rect.top; y < rect.bottom;) {
         while (alive != wide.end() && alive->bottom <= y)
             ++alive;
-        Rect band = {.left = rect.left, .top = y, .right = rect.right, .bottom = rect.bottom};
+        // Edges by themselves: a box changed field by field, and then copied
+        // whole, would keep the processor waiting.
+        int32 left = rect.left, right = rect.right, bottom = rect.bottom;
         const Rect *box = alive;
         for (; box != wide.end() && box->top <= y; ++box) {
             if (box->bottom <= y)
                 continue;
-            band.bottom = std::min(band.bottom, box->bottom);
-            band.left = std::min(band.left, box->left);
-            band.right = std::max(band.right, box->right);
+            bottom = std::min(bottom, box->bottom);
+            left = std::min(left, box->left);
+            right = std::max(right, box->right);
         }
         if (box != wide.end())
-            band.bottom = std::min(band.bottom, box->top);
+            bottom = std::min(bottom, box->top);
+        const Rect band = {.left = left, .top = y, .right = right, .bottom = bottom};
         // The first band may continue any piece above, the others only the band
         // before.
         if (piece == nullptr)
@@ -390,21 +407,20 @@ Rect *appendJoinedRows(const Survey &survey, const Rect &rect, Pieces &pieces) {
 
 void makeAddedPieces(const Survey &survey, const Rect &rect, Pieces &pieces) {
     for (int i = 0; i < survey.nearCount; ++i) {
-        Rect box = survey.nearBox(i);
-        box.bottom = std::min(box.bottom, rect.top);
-        if (box.top < box.bottom)
-            pieces.append(box);
+        const Rect &box = survey.nearBox(i);
+        if (box.top < rect.top)
+            pieces.append({box.left, box.top, box.right, std::min(box.bottom, rect.top)});
     }
     Rect *const last = appendJoinedRows(survey, rect, pieces);
     for (int i = 0; i < survey.nearCount; ++i) {
-        Rect box = survey.nearBox(i);
-        box.top = std::max(box.top, rect.bottom);
-        if (box.top >= box.bottom)
+        const Rect &box = survey.nearBox(i);
+        if (box.bottom <= rect.bottom)
             continue;
         if (haveSameColumns(*last, box))
             last->bottom = box.bottom;
         else
-            insertInOrder(pieces, box);
+            insertInOrder(pieces,
+                          {box.left, std::max(box.top, rect.bottom), box.right, box.bottom});
     }
 }
 
@@ -472,7 +488,7 @@ uint32 replaceNear(RasterRectList &list, const Survey &survey, const Pieces &pie
 
 uint32 storeAll(RasterRectList &list, const SweepBoxes &boxes) {
     uint32 area = 0;
-    list = {};
+    clear(list);
     for (int i = 0; i < boxes.count; ++i) {
         list.entries[i] = entryOf(boxes.boxes[i]);
         area += areaOf(list.entries[i]);
@@ -492,10 +508,60 @@ uint32 storeBoundingBox(RasterRectList &list, const SweepBoxes &boxes) {
     return storeAll(list, single);
 }
 
+// What is left of the entries, apart from them, so that their short ways save no
+// registers and make no room for this one.
+[[gnu::noinline]] uint32 addToList(RasterRectList &list, int32 x, int32 y, int32 width,
+                                   int32 height) {
+    const Rect rect = boxOf(x, y, width, height);
+    Survey survey;
+    surveyList(list, rect, survey);
+    if (survey.isNormal && !isEmpty(rect)) {
+        for (int i = 0; i < survey.nearCount; ++i) {
+            if (covers(survey.nearBox(i), rect))
+                return survey.area;
+        }
+        // An entry right above or below runs on only into rows joined to its
+        // own width.
+        survey.keepNear([&](const Rect &box) {
+            return shareRows(box, rect) || (box.left <= rect.left && rect.right <= box.right);
+        });
+        Pieces pieces;
+        makeAddedPieces(survey, rect, pieces);
+        if (canReplace(survey, pieces))
+            return replaceNear(list, survey, pieces);
+        survey.list.append(rect);
+    } else {
+        survey.list.append(rect);
+        SweepBoxes result;
+        if (sweep(survey.list, nullptr, result))
+            return storeAll(list, result);
+    }
+    return storeBoundingBox(list, survey.list);
+}
+
+[[gnu::noinline]] uint32 cutFromList(RasterRectList &list, const Rect &cut) {
+    Survey survey;
+    surveyList(list, cut, survey);
+    if (survey.isNormal) {
+        if (survey.nearCount == 0 || isEmpty(cut))
+            return survey.area;
+        // An entry right above or below runs on only into what the cut leaves
+        // on one of its sides.
+        survey.keepNear([&](const Rect &box) {
+            return shareRows(box, cut) || box.right == cut.left || box.left == cut.right;
+        });
+        Pieces pieces;
+        makeCutPieces(survey, cut, pieces);
+        return canReplace(survey, pieces) ? replaceNear(list, survey, pieces) : 0;
+    }
+    SweepBoxes result;
+    return sweep(survey.list, isEmpty(cut) ? nullptr : &cut, result) ? storeAll(list, result) : 0;
+}
+
 } // namespace
 
 void Raster_ClearRectList(RasterRectList *list) {
-    *list = {};
+    clear(*list);
 }
 
 uint32 Raster_AddRect(RasterRectList *list, int32 x, int32 y, int32 width, int32 height) {
@@ -513,30 +579,7 @@ uint32 Raster_AddRect(RasterRectList *list, int32 x, int32 y, int32 width, int32
     const Rect rect = boxOf(x, y, width, height);
     if (covers(boxOf(list->entries[0]), rect) && isSingle(*list))
         return areaOf(list->entries[0]);
-    Survey survey;
-    surveyList(*list, rect, survey);
-    if (survey.isNormal && !isEmpty(rect)) {
-        for (int i = 0; i < survey.nearCount; ++i) {
-            if (covers(survey.nearBox(i), rect))
-                return survey.area;
-        }
-        // An entry right above or below runs on only into rows joined to its
-        // own width.
-        survey.keepNear([&](const Rect &box) {
-            return shareRows(box, rect) || (box.left <= rect.left && rect.right <= box.right);
-        });
-        Pieces pieces;
-        makeAddedPieces(survey, rect, pieces);
-        if (canReplace(survey, pieces))
-            return replaceNear(*list, survey, pieces);
-        survey.list.append(rect);
-    } else {
-        survey.list.append(rect);
-        SweepBoxes result;
-        if (sweep(survey.list, nullptr, result))
-            return storeAll(*list, result);
-    }
-    return storeBoundingBox(*list, survey.list);
+    return addToList(*list, x, y, width, height);
 }
 
 uint32 Raster_SubRect(RasterRectList *list, int32 x, int32 y, int32 width, int32 height) {
@@ -546,20 +589,5 @@ uint32 Raster_SubRect(RasterRectList *list, int32 x, int32 y, int32 width, int32
     const Rect cut = boxOf(x, y, std::max(width, 0), std::max(height, 0));
     if (!overlap(boxOf(list->entries[0]), cut) && isSingle(*list))
         return areaOf(list->entries[0]);
-    Survey survey;
-    surveyList(*list, cut, survey);
-    if (survey.isNormal) {
-        if (survey.nearCount == 0 || isEmpty(cut))
-            return survey.area;
-        // An entry right above or below runs on only into what the cut leaves
-        // on one of its sides.
-        survey.keepNear([&](const Rect &box) {
-            return shareRows(box, cut) || box.right == cut.left || box.left == cut.right;
-        });
-        Pieces pieces;
-        makeCutPieces(survey, cut, pieces);
-        return canReplace(survey, pieces) ? replaceNear(*list, survey, pieces) : 0;
-    }
-    SweepBoxes result;
-    return sweep(survey.list, isEmpty(cut) ? nullptr : &cut, result) ? storeAll(*list, result) : 0;
+    return cutFromList(*list, cut);
 }

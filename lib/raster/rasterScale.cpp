@@ -6,6 +6,7 @@
 #include "raster/copyRows.h"
 #include "raster/rasterScaleKernels.h"
 
+#include <bit>
 #include <cmath>
 #include <cstdlib>
 
@@ -21,11 +22,23 @@ bool isValidScale(double scale) {
     return scale > kMinScale && scale <= kMaxScale;
 }
 
+// The low 32 bits of 65536 / scale in extended precision.
+uint32 stepOf(double scale) {
+    // Less than 2^32, a quotient of doubles is off by 2^-22 at most.  That only
+    // shows beside whole numbers, and powers of two divide exactly.
+    const double quotient = kScaleOne / scale;
+    const auto whole = static_cast<uint64_t>(quotient);
+    const double fraction = quotient - static_cast<double>(whole);
+    const bool isPowerOfTwo = std::bit_cast<uint64_t>(scale) << 12 == 0;
+    if (isPowerOfTwo || (fraction > 0x1p-20 && fraction < 1 - 0x1p-20))
+        return static_cast<uint32>(whole);
+    return (Extended(kScaleOne) / Extended(scale)).truncated();
+}
+
 // One axis of the job, for the pixels from first to end.
 ScaleAxis makeAxis(double scale, bool isFiltered, int32 first, int32 end, uint32 srcSize) {
-    const Extended factor(scale), one(kScaleOne);
     ScaleAxis axis{};
-    axis.step = (one / factor).truncated();
+    axis.step = stepOf(scale);
     axis.start = axis.step * static_cast<uint32>(first);
     axis.srcSize = srcSize;
     axis.dstSize = static_cast<uint32>(end) - static_cast<uint32>(first);
@@ -33,7 +46,7 @@ ScaleAxis makeAxis(double scale, bool isFiltered, int32 first, int32 end, uint32
         axis.method = ScaleMethod::kNearest;
     } else if (axis.step > kScaleOne) {
         axis.method = ScaleMethod::kBox;
-        axis.normaliser = (factor * one).truncated();
+        axis.normaliser = static_cast<uint32>(scale * kScaleOne); // exact but for the truncation
     } else {
         axis.method = ScaleMethod::kLinear;
         axis.start -= kScaleOne / 2;

@@ -16,7 +16,10 @@
 
 #include "hwy/highway.h"
 #include "raster/kernels-inl.h"
+#include "raster/rasterScaleBox-inl.h"
 #include "raster/rasterScaleRows-inl.h"
+#include "raster/rasterScaleVectors-inl.h"
+#include "raster/streaming-inl.h"
 
 HWY_BEFORE_NAMESPACE();
 namespace quillon::HWY_NAMESPACE {
@@ -28,6 +31,10 @@ HWY_INLINE uint32 rowOf(const ScaleAxis &axis, uint32 position) {
     return isAbove ? 0 : std::min(position >> 16, axis.srcSize - 1);
 }
 
+HWY_INLINE bool isStreamed(const ScaleJob &job) {
+    return quillon::isStreamed(size_t{job.x.dstSize} * kPixelBytes, job.y.dstSize);
+}
+
 // The source rows that neighbouring destination rows share, already scaled.
 template <class Row>
 class RowCache {
@@ -35,7 +42,7 @@ public:
     RowCache(const ScaleJob &job, const Row &row, void *block)
         : job_(job), row_(row), slots_(static_cast<RasterScaleRowSlot *>(block)) {
         const ScaleCacheShape shape(job);
-        period_ = static_cast<uint32>(shape.slots - 1);
+        mask_ = static_cast<uint32>(shape.slots - 2);
         const auto behindSlots = reinterpret_cast<uintptr_t>(slots_ + shape.slots);
         auto *pixels = reinterpret_cast<uint8 *>((behindSlots + ScaleCacheShape::kAlignment - 1) &
                                                  -ScaleCacheShape::kAlignment);
@@ -45,7 +52,7 @@ public:
 
     HWY_INLINE const uint8 *fetch(uint32 position) const {
         const uint32 index = rowOf(job_.y, position);
-        RasterScaleRowSlot &slot = slots_[index == 0 ? 0 : 1 + index % period_];
+        RasterScaleRowSlot &slot = slots_[index == 0 ? 0 : 1 + (index & mask_)];
         if (slot.rowIndex != index) {
             slot.rowIndex = index;
             row_(slot.pixels, job_.src.row(index));
@@ -57,19 +64,19 @@ private:
     const ScaleJob &job_;
     const Row &row_;
     RasterScaleRowSlot *slots_;
-    uint32 period_;
+    uint32 mask_; // slots - 2
 };
 
 // Each destination row is one scaled source row.  No cache: a row that comes
-// again is copied from the destination row before.
-template <class Row>
+// again is copied from the destination row before, unless that is far away by now.
+template <bool kRereads, class Row>
 HWY_INLINE void walkDirect(const ScaleJob &job, const Row &row) {
     uint8 *dst = job.dst.first;
     uint32 y = job.y.start;
     uint32 previous = kScaleNoRow;
     for (uint32 i = 0; i < job.y.dstSize; ++i, y += job.y.step) {
         const uint32 index = rowOf(job.y, y);
-        if (index == previous)
+        if (kRereads && index == previous)
             std::memmove(dst, dst - job.dst.step, size_t{job.x.dstSize} * kPixelBytes);
         else
             row(dst, job.src.row(index));
@@ -78,6 +85,17 @@ HWY_INLINE void walkDirect(const ScaleJob &job, const Row &row) {
     }
 }
 
+// Mixes a row by one of two bodies, through the caches or around them.
+template <class Through, class Around>
+HWY_INLINE void mixRow(bool streams, const uint8 *dst, size_t count, const Through &throughCaches,
+                       const Around &aroundCaches) {
+    if (streams)
+        walkStreaming<uint32, kPixelBytes>(dst, count, throughCaches, aroundCaches);
+    else
+        walkAgain<uint32>(count, throughCaches);
+}
+
+template <class Store>
 struct BlendBody {
     uint8 *dst;
     const uint8 *upper, *lower;
@@ -87,10 +105,10 @@ struct BlendBody {
     HWY_INLINE void operator()(D d, size_t i) const {
         using Channels = ChannelPairs<D>;
         const size_t offset = i * kPixelBytes;
-        storePixels(Channels::blend(loadPixels(d, upper + offset),
-                                    Channels::weight(255 - lowerWeight),
-                                    loadPixels(d, lower + offset), Channels::weight(lowerWeight)),
-                    d, dst + offset);
+        storePixelsBy<Store>(
+            Channels::blend(loadPixels(d, upper + offset), Channels::weight(255 - lowerWeight),
+                            loadPixels(d, lower + offset), Channels::weight(lowerWeight)),
+            d, dst + offset);
     }
 };
 
@@ -99,12 +117,15 @@ struct BlendBody {
 template <class Row>
 HWY_INLINE void walkLinear(const ScaleJob &job, const Row &row, void *block) {
     const RowCache<Row> cache(job, row, block);
+    const bool streams = isStreamed(job);
     uint8 *dst = job.dst.first;
     uint32 y = job.y.start;
     for (uint32 i = 0; i < job.y.dstSize; ++i, y += job.y.step) {
         const uint8 *upper = cache.fetch(y);
         const uint8 *lower = cache.fetch(y + kScaleOne);
-        walkAgain<uint32>(job.x.dstSize, BlendBody{dst, upper, lower, (y & 0xFFFF) >> 8});
+        const uint32 weight = (y & 0xFFFF) >> 8;
+        mixRow(streams, dst, job.x.dstSize, BlendBody<ThroughCaches>{dst, upper, lower, weight},
+               BlendBody<AroundCaches>{dst, upper, lower, weight});
         dst += job.dst.step;
     }
 }
@@ -115,6 +136,7 @@ struct Tap {
     uint32 weight;
 };
 
+template <class Store>
 struct AverageBody {
     uint8 *dst;
     const Tap *taps;
@@ -127,7 +149,7 @@ struct AverageBody {
         ChannelSums<D> sums;
         for (const Tap *tap = taps; tap != taps + count; ++tap)
             sums.add(loadPixels(d, tap->row + offset), ChannelPairs<D>::weight(tap->weight));
-        storePixels(sums.average(normaliser), d, dst + offset);
+        storePixelsBy<Store>(sums.average(normaliser), d, dst + offset);
     }
 };
 
@@ -136,6 +158,7 @@ struct AverageBody {
 template <class Row>
 HWY_INLINE void walkBox(const ScaleJob &job, const Row &row, void *block) {
     const RowCache<Row> cache(job, row, block);
+    const bool streams = isStreamed(job);
     uint8 *dst = job.dst.first;
     uint32 y = job.y.start;
     for (uint32 i = 0; i < job.y.dstSize; ++i, y += job.y.step) {
@@ -151,7 +174,10 @@ HWY_INLINE void walkBox(const ScaleJob &job, const Row &row, void *block) {
             position += covered;
             remaining -= covered;
         }
-        walkAgain<uint32>(job.x.dstSize, AverageBody{dst, taps, count, job.y.normaliser});
+        const uint32 normaliser = job.y.normaliser;
+        mixRow(streams, dst, job.x.dstSize,
+               AverageBody<ThroughCaches>{dst, taps, count, normaliser},
+               AverageBody<AroundCaches>{dst, taps, count, normaliser});
         dst += job.dst.step;
     }
 }
@@ -160,7 +186,7 @@ template <class Row>
 void walkRows(const ScaleJob &job, const Row &row, void *block) {
     switch (job.y.method) {
     case ScaleMethod::kNearest:
-        return walkDirect(job, row);
+        return walkDirect<true>(job, row);
     case ScaleMethod::kLinear:
         return walkLinear(job, row, block);
     case ScaleMethod::kBox:
@@ -168,10 +194,71 @@ void walkRows(const ScaleJob &job, const Row &row, void *block) {
     }
 }
 
-void scaleRect(const ScaleJob &job, void *block) {
+template <template <class Store> class Row>
+void walkNearestBy(const ScaleJob &job) {
+    if (isStreamed(job))
+        walkDirect<false>(job, Row<AroundCaches>(job.x));
+    else
+        walkDirect<true>(job, Row<ThroughCaches>(job.x));
+}
+
+template <class Store>
+using RowCloseBy1 = RasterScaleRowClose<1, Store>;
+template <class Store>
+using RowCloseBy2 = RasterScaleRowClose<2, Store>;
+template <class Store>
+using RowCloseBy4 = RasterScaleRowClose<4, Store>;
+template <class Store>
+using RowWholeBy2 = RasterScaleRowWhole<1, Store>;
+template <class Store>
+using RowWholeBy4 = RasterScaleRowWhole<2, Store>;
+template <class Store>
+using RowWholeBy8 = RasterScaleRowWhole<3, Store>;
+
+// From here on reading a row in whole vectors to keep an eighth of it pays.
+constexpr uint32 kLongRow = 128;
+
+// Columns are nearest pixels; where rows are not, too, the columns' step is one.
+void walkNearest(const ScaleJob &job, void *block) {
+    const uint32 step = job.x.step, srcSize = job.x.srcSize;
+    if ((uint64_t{step} * (job.x.dstSize - 1) + job.x.start) >> 32 != 0)
+        walkRows(job, RasterScaleRowWrapping(job.x), block);
+    else if (step == kScaleOne)
+        walkRows(job, RasterScaleRowCopy(job.x), block);
+    else if (step < kScaleOne)
+        walkNearestBy<RowCloseBy1>(job);
+    else if (step == 2 * kScaleOne)
+        walkNearestBy<RowWholeBy2>(job);
+    else if (step == 4 * kScaleOne)
+        walkNearestBy<RowWholeBy4>(job);
+    else if (step == 8 * kScaleOne && job.x.dstSize >= kLongRow)
+        walkNearestBy<RowWholeBy8>(job);
+    else if (kVectorsAreWide && step <= 2 * kScaleOne && srcSize >= 2)
+        walkNearestBy<RowCloseBy2>(job);
+    else if (kVectorsAreWide && step <= 4 * kScaleOne && srcSize >= 4)
+        walkNearestBy<RowCloseBy4>(job);
+    else
+        walkNearestBy<RasterScaleRowSparse>(job);
+}
+
+template <class Store>
+void walkQuarters(const ScaleJob &job) {
+    const RasterScaleRowQuarter row(job.x);
+    uint8 *dst = job.dst.first;
+    uint32 y = job.y.start;
+    for (uint32 i = 0; i < job.y.dstSize; ++i, y += job.y.step) {
+        row.write<Store>(dst, job.src.row(rowOf(job.y, y)),
+                         job.src.row(rowOf(job.y, y + kScaleOne)));
+        dst += job.dst.step;
+    }
+}
+
+void walkAll(const ScaleJob &job, void *block) {
+    if (job.isQuarter())
+        return isStreamed(job) ? walkQuarters<AroundCaches>(job) : walkQuarters<ThroughCaches>(job);
     switch (job.x.method) {
     case ScaleMethod::kNearest:
-        return walkRows(job, RasterScaleRowNearest(job.x), block);
+        return walkNearest(job, block);
     case ScaleMethod::kLinear:
         return walkRows(job, RasterScaleRowLinear(job.x), block);
     case ScaleMethod::kBox:
@@ -179,6 +266,12 @@ void scaleRect(const ScaleJob &job, void *block) {
                    ? walkRows(job, RasterScaleRowBox<uint16>(job.x), block)
                    : walkRows(job, RasterScaleRowBox<uint32>(job.x), block);
     }
+}
+
+void scaleRect(const ScaleJob &job, void *block) {
+    walkAll(job, block);
+    if (isStreamed(job))
+        hwy::FlushStream();
 }
 
 } // namespace

@@ -8,6 +8,7 @@
 #include "core/surface.h"
 
 #include <algorithm>
+#include <bit>
 #include <cstddef>
 #include <cstdint>
 
@@ -32,12 +33,20 @@ struct ScaleAxis {
     // The position of the last source pixel.  What lies there or behind it is
     // always a copy of that pixel.
     uint32 lastPosition() const { return (srcSize - 1) << 16; }
+
+    // Whether the pixels are averages of two each.
+    bool isHalf() const {
+        return method == ScaleMethod::kBox && step == 2 * kScaleOne && normaliser == kScaleOne / 2;
+    }
 };
 
 struct ScaleJob {
     DstRows dst; // the first pixel to write
     SrcRows src; // the first pixel of the source
     ScaleAxis x, y;
+
+    // Averages of two by two pixels are made without rows between.
+    bool isQuarter() const { return x.isHalf() && y.isHalf(); }
 };
 
 // How many of the positions start, start + step, ... lie before end.
@@ -56,16 +65,17 @@ struct RasterScaleRowSlot {
 constexpr uint32 kScaleNoRow = 0xFFFFFFFF;
 
 // The row cache: a slot for every source row that one destination row can need,
-// so that none is made twice.  Row r goes to slot 1 + r % (slots - 1), row 0
-// to slot 0: a position that wraps comes back to row 0 in the midst of a span,
-// and must not take the place of a row of that span.
+// so that none is made twice.  Row r goes to slot 1 + r % (slots - 1), the divisor
+// being a power of two, row 0 to slot 0: a position that wraps comes back to row 0
+// in the midst of a span, and must not take the place of a row of that span.
 struct ScaleCacheShape {
     static constexpr size_t kAlignment = 64;
 
     explicit ScaleCacheShape(const ScaleJob &job)
-        : slots(job.y.method == ScaleMethod::kNearest
+        : slots(job.y.method == ScaleMethod::kNearest || job.isQuarter()
                     ? 0
-                    : 1 + std::min<size_t>(((job.y.step + 0xFFFF) >> 16) + 1, kScaleMaxTaps)),
+                    : 1 + std::bit_ceil(
+                              std::min<size_t>(((job.y.step + 0xFFFF) >> 16) + 1, kScaleMaxTaps))),
           rowBytes((size_t{job.x.dstSize} * 4 + kAlignment - 1) / kAlignment * kAlignment) {}
 
     // The slots and then, aligned, their rows.
