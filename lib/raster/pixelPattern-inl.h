@@ -18,6 +18,8 @@ HWY_BEFORE_NAMESPACE();
 namespace quillon::HWY_NAMESPACE {
 namespace hn = hwy::HWY_NAMESPACE;
 
+// By vectors of words.  What a pixel size leaves of a pixel repeats every 3 bytes or
+// every 4, so that from any byte on it is known what comes.
 class PixelPattern {
 public:
     PixelPattern(uint32_t pixel, int32_t bytesPerPixel) : period(bytesPerPixel == 3 ? 3 : 4) {
