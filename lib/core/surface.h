@@ -44,6 +44,23 @@ struct Rows {
 using DstRows = Rows<uint8>;
 using SrcRows = Rows<const uint8>;
 
+// The addresses of a rectangle, from its lowest byte up to behind its highest one.
+struct AddressRange {
+    uintptr_t begin, end;
+
+    bool overlaps(const AddressRange &other) const {
+        return begin < other.end && other.begin < end;
+    }
+};
+
+template <class Byte>
+AddressRange addressesOf(const Rows<Byte> &rows, size_t rowBytes, size_t height) {
+    const auto top = reinterpret_cast<uintptr_t>(rows.first);
+    const uintptr_t bottom = top + (height - 1) * static_cast<uintptr_t>(rows.step);
+    return rows.step < 0 ? AddressRange{bottom, top + rowBytes}
+                         : AddressRange{top, bottom + rowBytes};
+}
+
 // A line increment rounded down (towards minus infinity) to whole pixels of 2
 // or 4 bytes.  Pixels of 1 and 3 bytes step exactly.
 inline int64_t wholePixels(int64_t lineIncrement, int32 bytesPerPixel) {

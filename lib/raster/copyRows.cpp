@@ -8,22 +8,6 @@
 namespace quillon {
 namespace {
 
-// The lowest byte of a rectangle and the byte behind its highest one.
-struct Span {
-    uintptr_t begin;
-    uintptr_t end;
-};
-
-Span spanOf(const uint8 *first, ptrdiff_t step, Size size) {
-    const auto top = reinterpret_cast<uintptr_t>(first);
-    const uintptr_t bottom = top + (size.height - 1) * static_cast<uintptr_t>(step);
-    return step < 0 ? Span{bottom, top + size.width} : Span{top, bottom + size.width};
-}
-
-bool overlap(Span a, Span b) {
-    return a.begin < b.end && b.begin < a.end;
-}
-
 // Long rows, or the rows of a surface from end to end.
 void copyLongRows(DstRows dst, SrcRows src, Size size) {
     if (isStreamed(size.width, size.height)) {
@@ -41,7 +25,8 @@ void copyLongRows(DstRows dst, SrcRows src, Size size) {
 } // namespace
 
 bool rowsOverlap(DstRows dst, SrcRows src, Size size) {
-    return overlap(spanOf(dst.first, dst.step, size), spanOf(src.first, src.step, size));
+    const AddressRange written = addressesOf(dst, size.width, size.height);
+    return written.overlaps(addressesOf(src, size.width, size.height));
 }
 
 void copyRows(DstRows dst, SrcRows src, Size size, RowOrder order) {

@@ -9,8 +9,8 @@
 #include "hwy/foreach_target.h"
 #include "hwy/highway.h"
 
-#include "raster/pixelPattern-inl.h"
 #include "raster/kernels-inl.h"
+#include "raster/pixelPattern-inl.h"
 #include "raster/streaming-inl.h"
 
 HWY_BEFORE_NAMESPACE();
@@ -363,10 +363,24 @@ HWY_INLINE void stencilRow(const Stencil<kBytes> &stencil, uint8_t *dst, const u
         });
 }
 
+// Rows too short to be worth a block.
+template <size_t kBytes>
+void stencilFewPixels(DstRows dst, SrcRows bits, Size size, uint32 pixel) {
+    for (size_t y = 0; y < size.height; ++y) {
+        const uint32_t row = bits.row(y)[0];
+        for (size_t i = 0; i < size.width; ++i) {
+            if ((row << i & 0x80) != 0)
+                storePixel<kBytes>(dst.row(y) + i * kBytes, pixel);
+        }
+    }
+}
+
 template <size_t kBytes>
 void stencilRows(DstRows dst, SrcRows bits, Size size, uint32 pixel) {
-    const Stencil<kBytes> stencil(pixel);
     size = joinedBitRows(size, kBytes, dst.step, bits.step);
+    if (size.width < 4)
+        return stencilFewPixels<kBytes>(dst, bits, size, pixel);
+    const Stencil<kBytes> stencil(pixel);
     const bool isLarge = size.width * kBytes * size.height >= kStreamedBytes;
     for (size_t y = 0; y < size.height; ++y)
         stencilRow(stencil, dst.row(y), bits.row(y), size.width, isLarge);

@@ -42,19 +42,6 @@ struct ApplyKey {
     }
 };
 
-// From first up to behind last.
-struct Bytes {
-    uintptr_t first, last;
-
-    bool overlaps(const Bytes &other) const { return first < other.last && other.first < last; }
-};
-
-Bytes bytesOf(const uint8_t *row, ptrdiff_t step, size_t rowBytes, size_t rows) {
-    const auto first = reinterpret_cast<uintptr_t>(row);
-    const uintptr_t toLast = static_cast<uintptr_t>(step) * (rows - 1);
-    return {step < 0 ? first + toLast : first, (step < 0 ? first : first + toLast) + rowBytes};
-}
-
 template <class Pixel>
 struct KeyedSurfaces {
     KeyedRows rows;
@@ -79,18 +66,33 @@ struct KeyedSurfaces {
             return true;
         if constexpr (sizeof(Pixel) == 4)
             return catchesUp(keys);
-        return bytesOf(dst, 0, 4 * size.width, 1)
-            .overlaps(bytesOf(keys, 0, sizeof(Pixel) * size.width, 1));
+        return addressesOf(SrcRows{dst, 0}, 4 * size.width, 1)
+            .overlaps(addressesOf(SrcRows{keys, 0}, sizeof(Pixel) * size.width, 1));
     }
 
     // Whether nothing that is written is read.
     bool isApart() const {
         const auto all = [&](const auto &surface, size_t pixelBytes) {
-            return bytesOf(surface.row(0), surface.step, pixelBytes * size.width, size.height);
+            return addressesOf(surface, pixelBytes * size.width, size.height);
         };
-        const Bytes dst = all(rows.dst, 4);
+        const AddressRange dst = all(rows.dst, 4);
         return !dst.overlaps(all(rows.background, 4)) && !dst.overlaps(all(rows.overlay, 4)) &&
                !dst.overlaps(all(rows.key, sizeof(Pixel)));
+    }
+
+    // A row pixel by pixel: where their order counts, or where there are only few.
+    void applySingly(size_t y) const {
+        const auto body = this->template body<ThroughCaches>(y);
+        for (size_t x = 0; x < size.width; ++x) {
+            Pixel pixel;
+            hwy::CopyBytes<sizeof(Pixel)>(body.keys + sizeof(Pixel) * x, &pixel);
+            // As the key comes: without the top byte of 32 bits.
+            const uint32_t compared = sizeof(Pixel) == 4 ? uint32_t{pixel} << 8 : pixel;
+            const uint8_t *from = compared == key ? body.overlay : body.background;
+            uint32_t word;
+            hwy::CopyBytes<4>(from + 4 * x, &word);
+            hwy::CopyBytes<4>(&word, body.dst + 4 * x);
+        }
     }
 };
 
@@ -110,8 +112,8 @@ void applyKey(const KeyedRows &rows, Size size, uint32 key) {
         if (streams)
             walkStreaming<uint32_t, 4>(body.dst, size.width, body,
                                        surfaces.template body<AroundCaches>(y));
-        else if (surfaces.runsIntoItself(y))
-            walkSingly<uint32_t>(size.width, body);
+        else if (size.width < 4 || surfaces.runsIntoItself(y))
+            surfaces.applySingly(y);
         else
             walkOnce<uint32_t>(size.width, body);
     }

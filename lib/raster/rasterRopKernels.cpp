@@ -8,8 +8,8 @@
 #include "raster.h"
 #include "raster/copyRows.h"
 
-#include "raster/pixelPattern-inl.h"
 #include "raster/kernels-inl.h"
+#include "raster/pixelPattern-inl.h"
 #include "raster/streaming-inl.h"
 
 HWY_BEFORE_NAMESPACE();

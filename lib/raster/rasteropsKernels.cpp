@@ -5,8 +5,8 @@
 #include "hwy/foreach_target.h"
 #include "hwy/highway.h"
 
-#include "raster/pixelPattern-inl.h"
 #include "raster/kernels-inl.h"
+#include "raster/pixelPattern-inl.h"
 #include "raster/streaming-inl.h"
 
 HWY_BEFORE_NAMESPACE();
