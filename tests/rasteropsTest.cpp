@@ -129,7 +129,7 @@ TEST(Raster, invertsLargeSurfacesOverThemselves) {
     Random random(baseSeed());
     std::generate(before.begin(), before.end(), [&] { return random.word(); });
     forEachTarget([&] {
-        for (const size_t to : {0, 2}) {
+        for (const size_t to : {size_t{0}, size_t{2}}) {
             const size_t from = 2 - to;
             std::vector<uint32> pixels = before;
             const auto at = [&](size_t start) { return reinterpret_cast<uint8 *>(&pixels[start]); };
