@@ -366,12 +366,15 @@ HWY_INLINE void stencilRow(const Stencil<kBytes> &stencil, uint8_t *dst, const u
 // Rows too short to be worth a block.
 template <size_t kBytes>
 void stencilFewPixels(DstRows dst, SrcRows bits, Size size, uint32 pixel) {
+    uint8_t *row = dst.first;
+    const uint8_t *rowBits = bits.first;
     for (size_t y = 0; y < size.height; ++y) {
-        const uint32_t row = bits.row(y)[0];
         for (size_t i = 0; i < size.width; ++i) {
-            if ((row << i & 0x80) != 0)
-                storePixel<kBytes>(dst.row(y) + i * kBytes, pixel);
+            if ((rowBits[0] << i & 0x80) != 0)
+                storePixel<kBytes>(row + i * kBytes, pixel);
         }
+        row = advance(row, static_cast<uint64_t>(dst.step));
+        rowBits = advance(rowBits, static_cast<uint64_t>(bits.step));
     }
 }
 

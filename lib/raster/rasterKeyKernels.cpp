@@ -88,9 +88,10 @@ struct KeyedSurfaces {
             hwy::CopyBytes<sizeof(Pixel)>(body.keys + sizeof(Pixel) * x, &pixel);
             // As the key comes: without the top byte of 32 bits.
             const uint32_t compared = sizeof(Pixel) == 4 ? uint32_t{pixel} << 8 : pixel;
-            const uint8_t *from = compared == key ? body.overlay : body.background;
-            uint32_t word;
-            hwy::CopyBytes<4>(from + 4 * x, &word);
+            uint32_t over, under;
+            hwy::CopyBytes<4>(body.overlay + 4 * x, &over);
+            hwy::CopyBytes<4>(body.background + 4 * x, &under);
+            const uint32_t word = compared == key ? over : under;
             hwy::CopyBytes<4>(&word, body.dst + 4 * x);
         }
     }
@@ -108,11 +109,15 @@ void applyKey(const KeyedRows &rows, Size size, uint32 key) {
     const KeyedSurfaces<Pixel> surfaces = {rows, size, key};
     const bool streams = isStreamed(4 * size.width, size.height) && surfaces.isApart();
     for (size_t y = 0; y < size.height; ++y) {
+        if (size.width < 4) {
+            surfaces.applySingly(y);
+            continue;
+        }
         const auto body = surfaces.template body<ThroughCaches>(y);
         if (streams)
             walkStreaming<uint32_t, 4>(body.dst, size.width, body,
                                        surfaces.template body<AroundCaches>(y));
-        else if (size.width < 4 || surfaces.runsIntoItself(y))
+        else if (surfaces.runsIntoItself(y))
             surfaces.applySingly(y);
         else
             walkOnce<uint32_t>(size.width, body);
