@@ -68,7 +68,8 @@ private:
 };
 
 // Each destination row is one scaled source row.  No cache: a row that comes
-// again is copied from the destination row before, unless that is far away by now.
+// again is copied from the destination row before, unless that is far away by now,
+// or takes longer than to scale the row again.
 template <bool kRereads, class Row>
 HWY_INLINE void walkDirect(const ScaleJob &job, const Row &row) {
     uint8 *dst = job.dst.first;
@@ -225,6 +226,8 @@ void walkNearest(const ScaleJob &job, void *block) {
         walkRows(job, RasterScaleRowWrapping(job.x), block);
     else if (step == kScaleOne)
         walkRows(job, RasterScaleRowCopy(job.x), block);
+    else if (step == kScaleOne / 2 && job.x.start % kScaleOne == 0 && !isStreamed(job))
+        walkDirect<false>(job, RasterScaleRowDoubled(job.x));
     else if (step < kScaleOne)
         walkNearestBy<RowCloseBy1>(job);
     else if (step == 2 * kScaleOne)

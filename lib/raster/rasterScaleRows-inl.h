@@ -116,6 +116,49 @@ private:
     }
 };
 
+// Each pixel twice, from an even pixel of the row on.
+struct DoubledBody {
+    uint8 *dst;
+    const uint8 *src;
+
+    template <class D>
+    HWY_INLINE void operator()(D d, size_t i) const {
+        storePixels(doubled(d, src + i / 2 * kPixelBytes), d, dst + i * kPixelBytes);
+    }
+
+private:
+    template <class D>
+    static HWY_INLINE hn::Vec<D> doubled(D d, const uint8 *from) {
+        constexpr size_t n = kLanes<D>;
+        if constexpr (n <= 2) {
+            return hn::Set(d, hn::GetLane(loadPixels(hn::CappedTag<uint32, 1>(), from)));
+        } else {
+#if HWY_TARGET != HWY_SCALAR
+            HWY_ALIGN static constexpr uint32 kTwice[16] = {0, 0, 1, 1, 2, 2, 3, 3,
+                                                            4, 4, 5, 5, 6, 6, 7, 7};
+            const auto half = loadPixels(hn::Half<D>(), from);
+            return hn::TableLookupLanes(hn::ZeroExtendVector(d, half),
+                                        hn::SetTableIndices(d, kTwice));
+#endif
+        }
+    }
+};
+
+// Steps of half a pixel, from a whole one on.
+struct RasterScaleRowDoubled : NearestRow {
+    explicit RasterScaleRowDoubled(const ScaleAxis &axis)
+        : NearestRow(axis), first_(std::min(axis.start >> 16, axis.srcSize - 1)),
+          doubled_(std::min(2 * (axis.srcSize - first_), axis.dstSize)) {}
+
+    HWY_INLINE void operator()(uint8 *dst, const uint8 *src) const {
+        walkOnce<uint32>(doubled_, DoubledBody{dst, src + size_t{first_} * kPixelBytes});
+        fillPixels(dst + size_t{doubled_} * kPixelBytes, src, srcSize_ - 1, count_ - doubled_);
+    }
+
+private:
+    uint32 first_, doubled_;
+};
+
 // Of 2^kDoublings pixels the first.
 template <uint32 kDoublings, class Store>
 struct FirstOfEachBody {
