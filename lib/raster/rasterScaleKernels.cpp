@@ -221,7 +221,7 @@ constexpr uint32 kLongRow = 128;
 
 // Columns are nearest pixels; where rows are not, too, the columns' step is one.
 void walkNearest(const ScaleJob &job, void *block) {
-    const uint32 step = job.x.step, srcSize = job.x.srcSize;
+    const uint32 step = job.x.step;
     if ((uint64_t{step} * (job.x.dstSize - 1) + job.x.start) >> 32 != 0)
         walkRows(job, RasterScaleRowWrapping(job.x), block);
     else if (step == kScaleOne)
@@ -236,9 +236,9 @@ void walkNearest(const ScaleJob &job, void *block) {
         walkNearestBy<RowWholeBy4>(job);
     else if (step == 8 * kScaleOne && job.x.dstSize >= kLongRow)
         walkNearestBy<RowWholeBy8>(job);
-    else if (kVectorsAreWide && step <= 2 * kScaleOne && srcSize >= 2)
+    else if (kVectorsAreWide && step <= 2 * kScaleOne && job.x.srcSize >= 2)
         walkNearestBy<RowCloseBy2>(job);
-    else if (kVectorsAreWide && step <= 4 * kScaleOne && srcSize >= 4)
+    else if (kVectorsAreWide && step <= 4 * kScaleOne && job.x.srcSize >= 4)
         walkNearestBy<RowCloseBy4>(job);
     else
         walkNearestBy<RasterScaleRowSparse>(job);

@@ -279,7 +279,7 @@ HWY_INLINE hn::Vec<D> pick(D d, const uint8 *window, hn::Vec<D> offset) {
         return pickFromTwo(d, window, offset);
     } else {
         const auto low = pickFromTwo(d, window, offset);
-        window += 2 * n * kPixelBytes;
+        window += size_t{2} * n * kPixelBytes;
         auto rest = hn::Sub(offset, hn::Set(d, 2 * n));
         if constexpr (kWindows == 3)
             rest = hn::And(rest, hn::Set(d, n - 1));

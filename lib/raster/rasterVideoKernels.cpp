@@ -58,7 +58,7 @@ struct ConvertGroups {
     }
 
     template <class D>
-    HWY_INLINE auto sums(D, size_t i) const {
+    HWY_INLINE auto sums(D /*d*/, size_t i) const {
         const hn::Repartition<uint32_t, D> d32;
         const hn::Repartition<int16_t, D> d16;
         const auto groups =

@@ -106,7 +106,7 @@ HWY_INLINE hn::Vec<D> weighed(D d, hn::Vec<D> samples) {
 // Words as signed bytes, held to what those can be.  In each block of 16 bytes
 // come the words of the first vector's block, then those of the second one's.
 template <class D, class D16 = hn::Repartition<int16_t, D>>
-HWY_INLINE hn::Vec<D> narrowed(D, hn::Vec<D16> first, hn::Vec<D16> second) {
+HWY_INLINE hn::Vec<D> narrowed(D /*d*/, hn::Vec<D16> first, hn::Vec<D16> second) {
     return hn::Vec<D>{packWords(first.raw, second.raw)};
 }
 
@@ -171,7 +171,7 @@ HWY_INLINE hn::Vec<D> placed(D d, hn::Vec<D> field) {
 // Pixels of two bytes.  To take 128 off a field turns its top bit over; in the
 // end these are turned back.
 template <RasterVideoPixelLayout kLayout, class D16, class D = hn::RebindToUnsigned<D16>>
-HWY_INLINE hn::Vec<D> words(D16, const Sums<hn::Vec<D16>> &sums) {
+HWY_INLINE hn::Vec<D> words(D16 /*d16*/, const Sums<hn::Vec<D16>> &sums) {
     constexpr int kLowAt = kLayout.finalShift;
     constexpr int kMidAt = kLowAt + kLayout.lowBits;
     constexpr int kHighAt = kMidAt + kLayout.midBits;
@@ -427,7 +427,7 @@ HWY_INLINE hn::Vec<D> less128(D d, hn::Vec<D> groups) {
 
 // From samples less 128, a at byte kLow of each word and b at kHigh.
 template <uint8_t kLow, uint8_t kHigh, class D, class D16 = hn::Repartition<int16_t, D>>
-HWY_INLINE ChromaTerms<hn::Vec<D16>> chromaOf(D, hn::Vec<D> groups) {
+HWY_INLINE ChromaTerms<hn::Vec<D16>> chromaOf(D /*d*/, hn::Vec<D> groups) {
     const hn::Repartition<uint8_t, D> d8;
     const D16 d16;
     const auto both = [&](const std::array<uint8_t, 16> &sources) HWY_ATTR {
