@@ -66,6 +66,28 @@ void writeTable(std::ofstream &file, const std::vector<Result> &results, const c
     }
 }
 
+// The measurements that come out lowest beside the limits, or beside the peers.
+void writeLowest(std::ofstream &file, const std::vector<Result> &results, bool besideLimit) {
+    constexpr size_t kShown = 10;
+    const auto speed = [&](const Result *result) {
+        return besideLimit ? result->limitSpeed : result->peerSpeed;
+    };
+    std::vector<const Result *> sorted;
+    for (const Result &result : results) {
+        if (speed(&result) > 0)
+            sorted.push_back(&result);
+    }
+    std::sort(sorted.begin(), sorted.end(),
+              [&](const Result *a, const Result *b) { return speed(a) < speed(b); });
+    sorted.resize(std::min(sorted.size(), kShown));
+    file << "\nLowest beside the " << (besideLimit ? "limit" : "best peer") << ":\n\n";
+    for (const Result *result : sorted) {
+        file << "- " << result->operation << ", " << result->area.name << ": ";
+        writeStanding(file, result->best(besideLimit));
+        file << "\n";
+    }
+}
+
 std::vector<std::string> areaNames(const std::vector<Result> &results) {
     std::vector<std::string> names;
     for (const Result &result : results) {
@@ -179,6 +201,8 @@ void writeReport(const std::vector<Result> &results, const std::string &folder) 
             "Speed beside the best peer, geometric mean over each family:\n\n"
             "![chart](performance.svg)\n\n"
          << summaryText(results);
+    writeLowest(file, results, true);
+    writeLowest(file, results, false);
     for (const std::string &name : areaNames(results)) {
         file << "\n## " << (name.empty() ? "Lists of rectangles" : name) << "\n";
         writeTable(file, results, name.c_str());

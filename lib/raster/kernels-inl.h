@@ -160,7 +160,7 @@ HWY_INLINE void walkParts(const uint8_t *dst, size_t count, const Body &body) {
         return walkTail<T, 2>(0, count, whole);
     }
     size_t i = 0;
-    if (HWY_UNLIKELY(count >= 4 * n)) {
+    if (HWY_UNLIKELY(count >= 8 * n)) {
         const size_t ahead = reinterpret_cast<uintptr_t>(dst) % (n * sizeof(T));
         if (ahead != 0 && ahead % sizeof(T) == 0) {
             i = n - ahead / sizeof(T);

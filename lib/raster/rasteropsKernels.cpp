@@ -70,7 +70,8 @@ void fillVectors(D d, DstRows dst, Size bytes, const PixelPattern &pattern) {
         }
         ThroughCaches::store(d, first, row);
         fillFrom<Stores>(d, row, begin, bytes.width, between);
-        ThroughCaches::store(d, last, row + bytes.width - n);
+        if (bytes.width != n)
+            ThroughCaches::store(d, last, row + bytes.width - n);
     }
 }
 
