@@ -178,8 +178,9 @@ bool isShown(const std::string &operation) {
 // A row of the table: first a call that has nothing to do, then the squares.
 std::string growthRow(const std::string &name) {
     char text[32];
-    std::snprintf(text, sizeof(text), "| %.1f", timeOf(name, {"", 0, 1, 0, false}, kLongTry));
-    std::string row = "| " + name + " " + text;
+    const double empty = timeOf(name, {"", 0, 1, 0, false}, kLongTry);
+    std::snprintf(text, sizeof(text), " | %.1f", empty);
+    std::string row = "| " + name + (empty > 0 ? text : " | ");
     for (const uint32 side : kSides) {
         const double pixels = double{1} * side * side;
         const double time = timeOf(name, {"", side, side, 0, false}, kLongTry);

@@ -108,6 +108,44 @@ void copy(int32 depth, const Transfer &transfer) {
              transfer.srcY < transfer.dstY ? RowOrder::Upwards : RowOrder::Downwards);
 }
 
+// Line increments are taken as they come.
+void convertIndexTo32(const uint32 *palette, const Transfer &transfer) {
+    if (transfer.size().empty())
+        return;
+    convertRows(Layout::Rgb32, transfer.dst(transfer.dstLine, 4), Layout::Index,
+                transfer.src(transfer.srcLine, 1), palette, transfer.size());
+}
+
+void convertTo32(int32 srcDepth, bool pseudoColor, const uint32 *palette,
+                 const Transfer &transfer) {
+    if (pseudoColor) {
+        if (srcDepth > 8)
+            reject(kBadPseudoDepth, srcDepth);
+        else
+            convertIndexTo32(palette, transfer);
+        return;
+    }
+    switch (srcDepth) {
+    case 15:
+    case 16:
+    case 24:
+        convert(Layout::Rgb32, Layout{srcDepth}, nullptr, transfer);
+        return;
+    case 32:
+        copy(32, transfer);
+        return;
+    default:
+        reject(kBadSrcDepth, srcDepth);
+    }
+}
+
+void convertFrom32(int32 dstDepth, const Transfer &transfer) {
+    if (dstDepth == 32)
+        copy(32, transfer);
+    else
+        convertChecked(dstDepth, Layout::Rgb32, nullptr, transfer);
+}
+
 } // namespace
 } // namespace quillon
 
@@ -168,14 +206,13 @@ void Raster_ConvertPixels(uint8 *dstBuffer, uint32 dstLineIncrement, int32 dstDe
                           const uint8 *srcBuffer, uint32 srcLineIncrement, int32 srcDepth,
                           bool pseudoColor, const uint32 *palette, uint32 srcX, uint32 srcY,
                           uint32 dstX, uint32 dstY, uint32 width, uint32 height) {
-    if (dstDepth == 32) {
-        Raster_ConvertPixelsTo32(dstBuffer, dstLineIncrement, srcBuffer, srcLineIncrement, srcDepth,
-                                 pseudoColor, palette, srcX, srcY, dstX, dstY, width, height);
-        return;
-    }
     const Transfer transfer = {
         dstBuffer, dstLineIncrement, srcBuffer, srcLineIncrement, srcX, srcY, dstX, dstY, width,
         height};
+    if (dstDepth == 32) {
+        convertTo32(srcDepth, pseudoColor, palette, transfer);
+        return;
+    }
     if (pseudoColor) {
         if (srcDepth > 8)
             reject(kBadPseudoDepth, srcDepth);
@@ -198,8 +235,7 @@ void Raster_ConvertPixels(uint8 *dstBuffer, uint32 dstLineIncrement, int32 dstDe
         convertChecked(dstDepth, Layout::Rgb24, nullptr, transfer);
         return;
     case 32:
-        Raster_ConvertPixelsFrom32(dstBuffer, dstLineIncrement, dstDepth, srcBuffer,
-                                   srcLineIncrement, srcX, srcY, dstX, dstY, width, height);
+        convertFrom32(dstDepth, transfer);
         return;
     default:
         reject(kBadSrcDepth, srcDepth);
@@ -210,54 +246,24 @@ void Raster_ConvertPixelsTo32(uint8 *dstBuffer, uint32 dstLineIncrement, const u
                               uint32 srcLineIncrement, int32 srcDepth, bool pseudoColor,
                               const uint32 *palette, uint32 srcX, uint32 srcY, uint32 dstX,
                               uint32 dstY, uint32 width, uint32 height) {
-    if (pseudoColor) {
-        if (srcDepth > 8)
-            reject(kBadPseudoDepth, srcDepth);
-        else
-            Raster_ConvertIndexTo32(dstBuffer, dstLineIncrement, srcBuffer, srcLineIncrement,
-                                    palette, srcX, srcY, dstX, dstY, width, height);
-        return;
-    }
-    const Transfer transfer = {
-        dstBuffer, dstLineIncrement, srcBuffer, srcLineIncrement, srcX, srcY, dstX, dstY, width,
-        height};
-    switch (srcDepth) {
-    case 15:
-    case 16:
-    case 24:
-        convert(Layout::Rgb32, Layout{srcDepth}, nullptr, transfer);
-        return;
-    case 32:
-        copy(32, transfer);
-        return;
-    default:
-        reject(kBadSrcDepth, srcDepth);
-    }
+    convertTo32(srcDepth, pseudoColor, palette,
+                {dstBuffer, dstLineIncrement, srcBuffer, srcLineIncrement, srcX, srcY, dstX, dstY,
+                 width, height});
 }
 
 void Raster_ConvertPixelsFrom32(uint8 *dstBuffer, uint32 dstLineIncrement, int32 dstDepth,
                                 const uint8 *srcBuffer, uint32 srcLineIncrement, uint32 srcX,
                                 uint32 srcY, uint32 dstX, uint32 dstY, uint32 width,
                                 uint32 height) {
-    const Transfer transfer = {
-        dstBuffer, dstLineIncrement, srcBuffer, srcLineIncrement, srcX, srcY, dstX, dstY, width,
-        height};
-    if (dstDepth == 32)
-        copy(32, transfer);
-    else
-        convertChecked(dstDepth, Layout::Rgb32, nullptr, transfer);
+    convertFrom32(dstDepth, {dstBuffer, dstLineIncrement, srcBuffer, srcLineIncrement, srcX, srcY,
+                             dstX, dstY, width, height});
 }
 
 void Raster_ConvertIndexTo32(uint8 *dstBuffer, uint32 dstLineIncrement, const uint8 *srcBuffer,
                              uint32 srcLineIncrement, const uint32 *palette, uint32 srcX,
                              uint32 srcY, uint32 dstX, uint32 dstY, uint32 width, uint32 height) {
-    const Transfer transfer = {
-        dstBuffer, dstLineIncrement, srcBuffer, srcLineIncrement, srcX, srcY, dstX, dstY, width,
-        height};
-    if (transfer.size().empty())
-        return;
-    convertRows(Layout::Rgb32, transfer.dst(dstLineIncrement, 4), Layout::Index,
-                transfer.src(srcLineIncrement, 1), palette, transfer.size());
+    convertIndexTo32(palette, {dstBuffer, dstLineIncrement, srcBuffer, srcLineIncrement, srcX, srcY,
+                               dstX, dstY, width, height});
 }
 
 void RasterCopyPixels(uint8 *dstBuffer, uint32 dstLineIncrement, const uint8 *srcBuffer,

@@ -70,7 +70,9 @@ void Raster_YUVtoRGB(const uint8 *srcBuffer, uint8 *dstBuffer, uint32 width, uin
     if (format != RASTER_VIDEO_YV12) {
         const auto order =
             format == RASTER_VIDEO_YUY2 ? VideoGroupOrder::Yuy2 : VideoGroupOrder::Uyvy;
-        convertPackedFrame(dstBuffer, bppdepth, srcBuffer, order, uint64_t{width} * height / 2);
+        const uint64_t groups = uint64_t{width} * height / 2;
+        if (groups != 0)
+            convertPackedFrame(dstBuffer, bppdepth, srcBuffer, order, groups);
         return;
     }
     const Size pairs = {width / 2, height / 2};
