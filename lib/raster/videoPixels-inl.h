@@ -319,7 +319,7 @@ HWY_INLINE void storeParts(D d, hn::Vec<D> part0, hn::Vec<D> part1, hn::Vec<D> p
     } else {
 #if HWY_TARGET == HWY_AVX3
         // The 16 bytes that come c-th in memory are of part c % 3.  The order of
-        // the blocks has them at c % 4 in part 0, to which the others are turned.
+        // the blocks has them at c % 4 in the first part, to which the others are turned.
         const hn::Repartition<uint64_t, D> d64;
         const auto a = hn::BitCast(d64, part0);
         const hn::Vec<decltype(d64)> b{_mm512_shuffle_i64x2(part1.raw, part1.raw, 0x93)};
