@@ -7,6 +7,7 @@
 #include <memory>
 
 extern "C" {
+#include <libavutil/log.h>
 #include <libswscale/swscale.h>
 }
 
@@ -65,6 +66,7 @@ void offer(Offers &offers, const std::string &operation, const Ends &ends) {
 } // namespace
 
 void offerSwscale(Offers &offers) {
+    av_log_set_level(AV_LOG_ERROR);
     constexpr struct {
         int32 depth;
         AVPixelFormat format;

@@ -198,11 +198,14 @@ constexpr Weights weightsOfSmall(size_t depth) {
     return weights;
 }
 
-template <int kShift, class D>
-HWY_INLINE hn::Vec<D> narrowed(D d, hn::Vec<D> v, const Weights &weights) {
-    const auto bits = masked(d, v, weights.mask);
-    const auto sum = weighed(d, bits, weights.bytes, weights.pairs);
-    return hn::ShiftRight<kShift>(sum);
+template <int kShift, class D, size_t kVectors>
+HWY_INLINE void narrow(D d, const hn::Vec<D> (&words)[kVectors], const Weights &weights,
+                       hn::Vec<D> (&pixels)[kVectors]) {
+    for (size_t v = 0; v < kVectors; ++v) {
+        const auto bits = masked(d, words[v], weights.mask);
+        const auto sum = weighed(d, bits, weights.bytes, weights.pairs);
+        pixels[v] = hn::ShiftRight<kShift>(sum);
+    }
 }
 
 struct ToSmall {
@@ -213,8 +216,7 @@ struct ToSmall {
     HWY_INLINE static void store(D d, const hn::Vec<D> (&words)[kVectors], uint8_t *dst,
                                  const Weights &weights) {
         hn::Vec<D> pixels[kVectors];
-        for (size_t v = 0; v < kVectors; ++v)
-            pixels[v] = narrowed<kShiftToSmall>(d, words[v], weights);
+        narrow<kShiftToSmall>(d, words, weights, pixels);
         if constexpr (kVectors == 4) {
             const hn::Repartition<uint8_t, D> d8;
             Stores::store(d8, packed8(d8, pixels), dst);
@@ -238,8 +240,7 @@ struct To16Bits {
     HWY_INLINE static void store(D d, const hn::Vec<D> (&words)[kVectors], uint8_t *dst,
                                  const Weights &weights) {
         hn::Vec<D> pixels[kVectors];
-        for (size_t v = 0; v < kVectors; ++v)
-            pixels[v] = narrowed<kShiftTo16Bits>(d, words[v], weights);
+        narrow<kShiftTo16Bits>(d, words, weights, pixels);
         if constexpr (kVectors == 1) {
             const hn::Rebind<uint16_t, D> d16;
             Stores::store(d16, hn::TruncateTo(d16, pixels[0]), dst);

@@ -139,7 +139,7 @@ inline constexpr size_t kLongRow = 512;
 struct Ahead {
     ptrdiff_t src, dst;
 };
-inline constexpr Ahead kAheadInCaches = {768, 768};
+inline constexpr Ahead kAheadOfBlocks = {kAheadInCaches, kAheadInCaches};
 inline constexpr Ahead kAheadOfCaches = {3072, 0};
 
 // Asks for the lines of so many bytes.
@@ -224,7 +224,7 @@ HWY_NOINLINE void convertLongRows(const Job &job) {
             }
         } else {
             for (; width - i >= n; i += n) {
-                row.prefetch(i, n, kAheadInCaches);
+                row.prefetch(i, n, kAheadOfBlocks);
                 row.template convert<ToWholeLines>(d, i);
             }
         }

@@ -176,7 +176,6 @@ HWY_INLINE V blendOver(D d, V src, V dst) {
 
 // Bytes to ask for ahead of the vector at hand.  Rows of some length ask for the
 // same place of the next row, which the processor does not do of itself.
-constexpr ptrdiff_t kAheadInCaches = 768;
 constexpr ptrdiff_t kAheadOfCaches = 2048;
 constexpr size_t kLongRow = 1024; // pixels
 

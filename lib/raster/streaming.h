@@ -15,4 +15,8 @@ constexpr bool isStreamed(size_t rowBytes, size_t height) {
     return rowBytes >= 256 && rowBytes * height >= kStreamedBytes;
 }
 
+// Bytes to ask for ahead of those at hand in long rows of a surface that is in some
+// cache.  The processor asks ahead itself, but only inside a page.
+inline constexpr ptrdiff_t kAheadInCaches = 768;
+
 } // namespace quillon
