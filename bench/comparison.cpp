@@ -43,16 +43,16 @@ double timed(const Runner &runner, size_t calls, size_t &place) {
     return elapsed.count() / static_cast<double>(calls);
 }
 
-std::vector<uint8> rowsOf(const Buffer &buffer) {
-    std::vector<uint8> bytes;
+std::vector<uint8_t> rowsOf(const Buffer &buffer) {
+    std::vector<uint8_t> bytes;
     for (size_t y = 0; y < buffer.height; ++y) {
-        const uint8 *row = buffer.data + y * buffer.step;
+        const uint8_t *row = buffer.data + y * buffer.step;
         bytes.insert(bytes.end(), row, row + buffer.rowBytes);
     }
     return bytes;
 }
 
-bool agree(Agreement agreement, const std::vector<uint8> &ours, const std::vector<uint8> &theirs) {
+bool agree(Agreement agreement, const std::vector<uint8_t> &ours, const std::vector<uint8_t> &theirs) {
     if (agreement == Agreement::Exact)
         return ours == theirs;
     for (size_t i = 0; i < ours.size(); ++i) {
@@ -74,7 +74,7 @@ void compareBytes(std::vector<Runner> &runners, Places &places) {
     };
     if (std::none_of(runners.begin() + 1, runners.end(), mustAgree))
         return;
-    const std::vector<uint8> ours = bytesOf(runners.front());
+    const std::vector<uint8_t> ours = bytesOf(runners.front());
     for (auto runner = runners.begin() + 1; runner != runners.end(); ++runner)
         runner->bytesDiffer =
             mustAgree(*runner) && !agree(runner->contender->agreement, ours, bytesOf(*runner));

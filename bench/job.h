@@ -1,7 +1,7 @@
 // What is measured: an operation, the pixels it works on, and who does it.
 #pragma once
 
-#include "quillonTypes.h"
+#include <cstdint>
 
 #include <array>
 #include <functional>
@@ -12,11 +12,11 @@ namespace quillon::bench {
 
 struct Area {
     const char *name;
-    uint32 width, height;
-    uint32 surfaceWidth;  // pixels from one row to the next; 0: the rows lie end to end
+    uint32_t width, height;
+    uint32_t surfaceWidth;  // pixels from one row to the next; 0: the rows lie end to end
     bool uncached;        // each call works on memory that has left every cache
-    uint32 offset = 0;    // bytes by which every buffer starts later
-    uint32 extraStep = 0; // bytes that rows lie further apart
+    uint32_t offset = 0;    // bytes by which every buffer starts later
+    uint32_t extraStep = 0; // bytes that rows lie further apart
 };
 
 // The sizes that everything is measured at.
@@ -28,15 +28,15 @@ inline constexpr Area kAreas[] = {
 };
 
 // Fills memory with what an operation is to find in it.
-using Content = std::function<void(uint8 *bytes, size_t count)>;
+using Content = std::function<void(uint8_t *bytes, size_t count)>;
 
 // The description of one buffer.
 struct Plane {
-    uint32 width, height;
-    uint32 bitsPerPixel;
-    uint32 surfaceWidth;
+    uint32_t width, height;
+    uint32_t bitsPerPixel;
+    uint32_t surfaceWidth;
     Content content;
-    uint32 offset, extraStep; // as in Area
+    uint32_t offset, extraStep; // as in Area
 
     size_t rowBytes() const { return (size_t{width} * bitsPerPixel + 7) / 8; }
     size_t step() const {
@@ -46,16 +46,16 @@ struct Plane {
     size_t bytes() const { return step() * (height - 1) + rowBytes(); }
 };
 
-Plane plane(const Area &area, uint32 bitsPerPixel, const Content &content);
+Plane plane(const Area &area, uint32_t bitsPerPixel, const Content &content);
 
 // The buffer itself.
 struct Buffer {
-    uint8 *data;
+    uint8_t *data;
     size_t step; // bytes from one row to the next
-    uint32 width, height;
+    uint32_t width, height;
     size_t rowBytes;
 
-    int32 line() const { return static_cast<int32>(step); }
+    int32_t line() const { return static_cast<int32_t>(step); }
 };
 
 // One call's worth of buffers: the destination and up to three sources.

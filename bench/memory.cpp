@@ -19,21 +19,21 @@ constexpr size_t kLeft = 100;
 constexpr size_t kSlack = 1024;
 
 // The memory that all operations share, one after the other.
-uint8 *arena() {
-    static uint8 *const memory = [] {
+uint8_t *arena() {
+    static uint8_t *const memory = [] {
         void *mapped =
             mmap(nullptr, arenaBytes(), PROT_READ | PROT_WRITE, MAP_PRIVATE | MAP_ANONYMOUS, -1, 0);
         if (mapped == MAP_FAILED)
             throw std::runtime_error("no memory to rotate through");
         madvise(mapped, arenaBytes(), MADV_HUGEPAGE);
-        return static_cast<uint8 *>(mapped);
+        return static_cast<uint8_t *>(mapped);
     }();
     return memory;
 }
 
 } // namespace
 
-Plane plane(const Area &area, uint32 bitsPerPixel, const Content &content) {
+Plane plane(const Area &area, uint32_t bitsPerPixel, const Content &content) {
     return {area.width, area.height, bitsPerPixel,  area.surfaceWidth,
             content,    area.offset, area.extraStep};
 }
@@ -58,7 +58,7 @@ Places::Places(const Operation &operation) : dstPlane(operation.planes.front()) 
         throw std::runtime_error(operation.name + " is larger than the memory for it");
     const size_t places = operation.area.uncached ? arenaBytes() / bytes : 1;
 
-    uint8 *next = arena();
+    uint8_t *next = arena();
     for (size_t place = 0; place < places; ++place) {
         Job job = {};
         job.sourceCount = operation.planes.size() - 1;

@@ -18,13 +18,13 @@ namespace hn = hwy::HWY_NAMESPACE;
 using Words = hn::ScalableTag<uint32_t>;
 using Vector = hn::Vec<Words>;
 
-Vector load(const uint8 *from) {
+Vector load(const uint8_t *from) {
     return hn::LoadU(Words(), reinterpret_cast<const uint32_t *>(from));
 }
 
 // All bytes, in whole vectors of which the last may overlap; rows shorter than a
 // vector byte by byte.
-Vector readAll(const uint8 *from, size_t bytes, Vector seen) {
+Vector readAll(const uint8_t *from, size_t bytes, Vector seen) {
     const size_t n = hn::Lanes(Words()) * 4;
     if (bytes < n) {
         for (size_t i = 0; i < bytes; ++i)
@@ -37,7 +37,7 @@ Vector readAll(const uint8 *from, size_t bytes, Vector seen) {
 }
 
 template <bool kReads>
-void writePlain(uint8 *to, size_t bytes, Vector v) {
+void writePlain(uint8_t *to, size_t bytes, Vector v) {
     const Words d;
     const size_t n = hn::Lanes(d) * 4;
     const auto write = [&](size_t i) HWY_ATTR {
@@ -54,7 +54,7 @@ void writePlain(uint8 *to, size_t bytes, Vector v) {
 }
 
 template <bool kReads>
-void writeStreaming(uint8 *to, size_t bytes, Vector v) {
+void writeStreaming(uint8_t *to, size_t bytes, Vector v) {
     const Words d;
     const size_t n = hn::Lanes(d) * 4;
     size_t i = (n - reinterpret_cast<uintptr_t>(to) % n) % n;
@@ -77,7 +77,7 @@ void moveRows(const Job &job) {
     Vector v = hn::Set(Words(), 0x01020304);
     for (size_t y = 0; y < job.dst.height; ++y) {
         const auto share = [turns](size_t bytes, size_t turn) { return bytes * turn / turns; };
-        uint8 *row = job.dst.data + y * job.dst.step;
+        uint8_t *row = job.dst.data + y * job.dst.step;
         for (size_t turn = 0; turn < turns; ++turn) {
             for (size_t s = 0; s < job.sourceCount; ++s) {
                 const Buffer &src = job.sources[s];

@@ -34,8 +34,8 @@ double nanoseconds(const Work &work, double tryNanoseconds) {
 
 // ---- Sweep ----------------------------------------------------------------
 
-constexpr uint32 kWidths = 300;
-constexpr uint32 kHeight = 16;
+constexpr uint32_t kWidths = 300;
+constexpr uint32_t kHeight = 16;
 constexpr double kTry = 4000;
 
 // Nanoseconds of a call for every width, those of one operation and one layout.
@@ -51,10 +51,10 @@ double median(std::vector<double> values) {
 }
 
 // The time for a pixel of widths up to a quarter smaller or larger.
-double neighbours(const std::vector<double> &times, uint32 width) {
-    const uint32 reach = std::min(width / 4, 16U);
+double neighbours(const std::vector<double> &times, uint32_t width) {
+    const uint32_t reach = std::min(width / 4, 16U);
     std::vector<double> pixelTimes;
-    for (uint32 near = width - reach; near <= std::min(width + reach, kWidths); ++near) {
+    for (uint32_t near = width - reach; near <= std::min(width + reach, kWidths); ++near) {
         if (near != width)
             pixelTimes.push_back(times[near] / near);
     }
@@ -95,9 +95,9 @@ double timeOf(const std::string &name, const Area &area, double tryNanoseconds) 
 
 struct Layout {
     const char *name;
-    uint32 surfaceWidth, extraStep;
+    uint32_t surfaceWidth, extraStep;
 
-    Area area(uint32 width, uint32 offset = 0) const {
+    Area area(uint32_t width, uint32_t offset = 0) const {
         return {"", width, kHeight, surfaceWidth, false, offset, extraStep};
     }
 };
@@ -116,7 +116,7 @@ struct Finding {
 
 void findSlow(const std::string &operation, const Layout &layout, const Series &series,
               std::vector<Finding> &findings) {
-    const auto judge = [&](uint32 width, double bound, const char *whose) {
+    const auto judge = [&](uint32_t width, double bound, const char *whose) {
         double ours = series.ours[width];
         if (bound > 0 && ours > bound)
             ours = looked(operation, layout.area(width), ours);
@@ -127,7 +127,7 @@ void findSlow(const std::string &operation, const Layout &layout, const Series &
                       layout.name, width, ours, whose, bound);
         findings.push_back({ours / bound, text});
     };
-    for (uint32 width = 1; width <= kWidths; ++width) {
+    for (uint32_t width = 1; width <= kWidths; ++width) {
         if (width >= 4)
             judge(width, 2 * width * neighbours(series.ours, width), "twice its neighbours");
         judge(width, series.plain[width], "a plain loop");
@@ -136,9 +136,9 @@ void findSlow(const std::string &operation, const Layout &layout, const Series &
 
 // Each alignment, against the others of the same width.
 void sweepAlignments(const Layout &layout, std::vector<Finding> &findings) {
-    for (const uint32 width : {16U, 61U, 250U}) {
+    for (const uint32_t width : {16U, 61U, 250U}) {
         std::map<std::string, std::vector<double>> times;
-        for (uint32 offset = 0; offset < 64; ++offset) {
+        for (uint32_t offset = 0; offset < 64; ++offset) {
             AllSeries series;
             measureWidth(layout.area(width, offset), series);
             for (const auto &[operation, at] : series)
@@ -146,7 +146,7 @@ void sweepAlignments(const Layout &layout, std::vector<Finding> &findings) {
         }
         for (const auto &[operation, at] : times) {
             const double bound = 2 * median(at);
-            for (uint32 offset = 0; offset < 64; ++offset) {
+            for (uint32_t offset = 0; offset < 64; ++offset) {
                 if (at[offset] <= bound)
                     continue;
                 const double ours = looked(operation, layout.area(width, offset), at[offset]);
@@ -164,7 +164,7 @@ void sweepAlignments(const Layout &layout, std::vector<Finding> &findings) {
 // ---- Growth ---------------------------------------------------------------
 
 constexpr double kLongTry = 1e6;
-constexpr uint32 kSides[] = {16, 32, 64, 128, 256, 512, 1024, 2048, 4096, 8192};
+constexpr uint32_t kSides[] = {16, 32, 64, 128, 256, 512, 1024, 2048, 4096, 8192};
 
 bool isShown(const std::string &operation) {
     constexpr const char *kShown[] = {
@@ -181,7 +181,7 @@ std::string growthRow(const std::string &name) {
     const double empty = timeOf(name, {"", 0, 1, 0, false}, kLongTry);
     std::snprintf(text, sizeof(text), " | %.1f", empty);
     std::string row = "| " + name + (empty > 0 ? text : " | ");
-    for (const uint32 side : kSides) {
+    for (const uint32_t side : kSides) {
         const double pixels = double{1} * side * side;
         const double time = timeOf(name, {"", side, side, 0, false}, kLongTry);
         std::snprintf(text, sizeof(text), " | %.3f", time / pixels);
@@ -199,7 +199,7 @@ int sweep() {
     std::vector<Finding> findings;
     for (const Layout &layout : kLayouts) {
         AllSeries series;
-        for (uint32 width = 1; width <= kWidths; ++width) {
+        for (uint32_t width = 1; width <= kWidths; ++width) {
             if (width % 10 == 0) {
                 std::fprintf(stderr, "\r%s: width %u of %u ", layout.name, width, kWidths);
                 std::fflush(stderr);
@@ -228,7 +228,7 @@ int growth(const std::string &folder) {
         "on the same memory, so that the steps are those from one cache to the "
         "next; the first number is the nanoseconds of a call that has nothing to "
         "do, its width being 0.\n\n| Operation | empty call";
-    for (const uint32 side : kSides)
+    for (const uint32_t side : kSides)
         page += " | " + std::to_string(side);
     page += " |\n|---|--:";
     for (size_t i = 0; i < std::size(kSides); ++i)

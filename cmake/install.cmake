@@ -16,7 +16,6 @@ foreach(library IN ITEMS hearth quillon)
 endforeach()
 
 install(DIRECTORY include/ DESTINATION ${CMAKE_INSTALL_INCLUDEDIR}/quillon-1)
-install(FILES hearth/hearth.h DESTINATION ${CMAKE_INSTALL_INCLUDEDIR}/quillon-1)
 
 write_basic_package_version_file(${PROJECT_BINARY_DIR}/quillonConfigVersion.cmake
     COMPATIBILITY SameMajorVersion)

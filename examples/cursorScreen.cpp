@@ -3,8 +3,8 @@
 //
 //     c++ -std=c++17 cursorScreen.cpp $(pkg-config --cflags --libs quillon)
 //     ./a.out SHEET.png
-#include "imageUtil.h"
-#include "raster.h"
+#include <quillon/imageUtil.h>
+#include <quillon/raster.h>
 
 #include <algorithm>
 #include <array>
@@ -16,16 +16,16 @@ namespace {
 
 // A surface of 32-bit pixels whose rows lie end to end.
 struct Surface {
-    Surface(uint32 w, uint32 h) : width(w), height(h), pixels(size_t{w} * h * 4) {}
-    uint8 *data() { return pixels.data(); }
-    int32 step() const { return static_cast<int32>(width * 4); }
+    Surface(uint32_t w, uint32_t h) : width(w), height(h), pixels(size_t{w} * h * 4) {}
+    uint8_t *data() { return pixels.data(); }
+    int32_t step() const { return static_cast<int32_t>(width * 4); }
 
-    uint32 width, height;
-    std::vector<uint8> pixels;
+    uint32_t width, height;
+    std::vector<uint8_t> pixels;
 };
 
 // A glowing disc, in memory of the caller's.
-RasterCursor makeDisc(std::vector<uint8> &image) {
+RasterCursor makeDisc(std::vector<uint8_t> &image) {
     constexpr int kSize = 32;
     for (int i = 0; i < kSize * kSize; ++i) {
         // Twice the way from the centre, which lies between four pixels.
@@ -33,7 +33,7 @@ RasterCursor makeDisc(std::vector<uint8> &image) {
         const int alpha = std::clamp((kSize * kSize - dx * dx - dy * dy) / 4, 0, 255);
         // B G R A, colours multiplied by alpha: the blend adds them as they are.
         for (const int byte : {0, 224 * alpha / 255, alpha, alpha})
-            image.push_back(static_cast<uint8>(byte));
+            image.push_back(static_cast<uint8_t>(byte));
     }
     RasterCursor disc = {RASTER_CURSOR_ALPHA, kSize / 2, kSize / 2, kSize, kSize, {}};
     disc.alphaImage = image.data();
@@ -41,7 +41,7 @@ RasterCursor makeDisc(std::vector<uint8> &image) {
 }
 
 // An arrow that comes as two planes of one bit per pixel.
-RasterCursor makeArrow(std::vector<uint8> &images) {
+RasterCursor makeArrow(std::vector<uint8_t> &images) {
     // '#' black: AND 0, XOR 0       '.' white: AND 0, XOR 1
     // ' ' the screen: AND 1, XOR 0  '~' the screen inverted: AND 1, XOR 1
     constexpr std::array<std::string_view, 17> kArrow = {
@@ -50,19 +50,19 @@ RasterCursor makeArrow(std::vector<uint8> &images) {
         "#.......#       ", "#........#      ", "#.....#####     ", "#..#..#   ~~~~~~",
         "#.# #..#  ~~~~~~", "##  #..#  ~~~~~~", "#    #..# ~~~~~~", "     #..# ~~~~~~",
         "      ##  ~~~~~~"};
-    constexpr uint32 kWidth = kArrow[0].size(), kHeight = kArrow.size();
-    const uint32 rowBytes = Raster_CalculateCursorSize(kWidth, 1, 1); // whole words
-    std::vector<uint8> andPlane(size_t{rowBytes} * kHeight), xorPlane(andPlane.size());
+    constexpr uint32_t kWidth = kArrow[0].size(), kHeight = kArrow.size();
+    const uint32_t rowBytes = Raster_CalculateCursorSize(kWidth, 1, 1); // whole words
+    std::vector<uint8_t> andPlane(size_t{rowBytes} * kHeight), xorPlane(andPlane.size());
     for (size_t y = 0; y < kHeight; ++y) {
         for (size_t x = 0; x < kWidth; ++x) {
             const char c = kArrow[y][x];
             const int bit = 0x80 >> x % 8; // the leftmost pixel is the top bit
-            andPlane[y * rowBytes + x / 8] |= static_cast<uint8>(c == ' ' || c == '~' ? bit : 0);
-            xorPlane[y * rowBytes + x / 8] |= static_cast<uint8>(c == '.' || c == '~' ? bit : 0);
+            andPlane[y * rowBytes + x / 8] |= static_cast<uint8_t>(c == ' ' || c == '~' ? bit : 0);
+            xorPlane[y * rowBytes + x / 8] |= static_cast<uint8_t>(c == '.' || c == '~' ? bit : 0);
         }
     }
     // Drawing takes 32 bits per pixel: the AND plane, and behind it the XOR plane.
-    const uint32 planeSize = Raster_CalculateCursorSize(kWidth, kHeight, 32);
+    const uint32_t planeSize = Raster_CalculateCursorSize(kWidth, kHeight, 32);
     images.resize(size_t{planeSize} * 2);
     Raster_ExpandPlanarCursorData(kWidth, kHeight, 1, andPlane.data(), 1, xorPlane.data(), 32,
                                   images.data(), planeSize * 2);
@@ -97,22 +97,22 @@ void moveCursor(Surface &screen, const RasterCursor &cursor, const RectPoint &po
 
 int main(int argc, char **argv) {
     Surface screen(128, 96);
-    for (uint32 x = 0; x < screen.width; x += 16) { // stripes, from blue to orange
-        const uint32 pixel = (0x20 + x * 3 / 2) << 16 | 0x60 << 8 | (0x90 - x);
+    for (uint32_t x = 0; x < screen.width; x += 16) { // stripes, from blue to orange
+        const uint32_t pixel = (0x20 + x * 3 / 2) << 16 | 0x60 << 8 | (0x90 - x);
         Raster_RectFill(screen.data(), screen.step(), 4, pixel, x, 0, 16, screen.height);
     }
-    const std::vector<uint8> before = screen.pixels;
+    const std::vector<uint8_t> before = screen.pixels;
 
     // Over a corner, inside, over two edges, and away, which takes the cursor off.
     constexpr std::array<RectPoint, 5> kStops = {
         {{2, 3}, {60, 43}, {122, 30}, {50, 90}, {200, -40}}};
     Surface sheet(136 * kStops.size() + 8, 104 * 2 + 8);
-    std::vector<uint8> discImage, arrowImages;
-    uint32 top = 8;
+    std::vector<uint8_t> discImage, arrowImages;
+    uint32_t top = 8;
     for (const RasterCursor &cursor : {makeDisc(discImage), makeArrow(arrowImages)}) {
         Surface display = screen;
         RasterCursorBox covered = {};
-        uint32 left = 8;
+        uint32_t left = 8;
         for (const RectPoint &stop : kStops) {
             moveCursor(screen, cursor, stop, display, covered);
             std::printf("(%d, %d): %u by %u pixels at (%u, %u)\n", stop.x, stop.y, covered.width,

@@ -2,7 +2,7 @@
 // client, converting only what has changed.
 //
 //     c++ -std=c++17 damage.cpp $(pkg-config --cflags --libs quillon)
-#include "raster.h"
+#include <quillon/raster.h>
 
 #include <algorithm>
 #include <cstdio>
@@ -11,39 +11,39 @@
 
 namespace {
 
-constexpr int32 kWidth = 640, kHeight = 400;
-constexpr int32 kClientStep = kWidth * 2, kScreenStep = kWidth * 4;
+constexpr int32_t kWidth = 640, kHeight = 400;
+constexpr int32_t kClientStep = kWidth * 2, kScreenStep = kWidth * 4;
 
 // Columns and rows, within the screen.
 struct Part {
-    uint32 x, y, width, height;
+    uint32_t x, y, width, height;
 };
 
 struct DamagedScreen {
-    std::vector<uint8> client = std::vector<uint8>(size_t{kClientStep} * kHeight);
-    std::vector<uint8> screen = std::vector<uint8>(size_t{kScreenStep} * kHeight);
+    std::vector<uint8_t> client = std::vector<uint8_t>(size_t{kClientStep} * kHeight);
+    std::vector<uint8_t> screen = std::vector<uint8_t>(size_t{kScreenStep} * kHeight);
     RasterRectList stale = {}; // where the two differ, and perhaps more
-    uint32 staleArea = 0;
+    uint32_t staleArea = 0;
     // To be told in the end.
     uint64_t converted = 0;
     int outside = 0, boxes = 0, uncut = 0;
 };
 
 // Nothing in the library clips.  A part with nothing on the screen gets a side of 0.
-Part clipped(int32 x, int32 y, int32 width, int32 height) {
-    const int32 left = std::clamp(x, 0, kWidth), right = std::clamp(x + width, 0, kWidth);
-    const int32 top = std::clamp(y, 0, kHeight), bottom = std::clamp(y + height, 0, kHeight);
-    return {static_cast<uint32>(left), static_cast<uint32>(top), static_cast<uint32>(right - left),
-            static_cast<uint32>(bottom - top)};
+Part clipped(int32_t x, int32_t y, int32_t width, int32_t height) {
+    const int32_t left = std::clamp(x, 0, kWidth), right = std::clamp(x + width, 0, kWidth);
+    const int32_t top = std::clamp(y, 0, kHeight), bottom = std::clamp(y + height, 0, kHeight);
+    return {static_cast<uint32_t>(left), static_cast<uint32_t>(top), static_cast<uint32_t>(right - left),
+            static_cast<uint32_t>(bottom - top)};
 }
 
 // The client fills a part of its frame buffer.
-void draw(DamagedScreen &s, const Part &part, uint32 color) {
+void draw(DamagedScreen &s, const Part &part, uint32_t color) {
     Raster_RectFill(s.client.data(), kClientStep, 2, color, part.x, part.y, part.width,
                     part.height);
-    const uint32 area =
-        Raster_AddRect(&s.stale, static_cast<int32>(part.x), static_cast<int32>(part.y),
-                       static_cast<int32>(part.width), static_cast<int32>(part.height));
+    const uint32_t area =
+        Raster_AddRect(&s.stale, static_cast<int32_t>(part.x), static_cast<int32_t>(part.y),
+                       static_cast<int32_t>(part.width), static_cast<int32_t>(part.height));
     if (area == 0) {
         // Does not say that nothing is stale, but that there was nothing to add:
         // the list is what it was before.
@@ -67,9 +67,9 @@ void convert(DamagedScreen &s, const Part &part) {
 // Shows a part at once, ahead of the rest: a line that is being typed, say.
 void refreshPart(DamagedScreen &s, const Part &part) {
     convert(s, part);
-    const uint32 area =
-        Raster_SubRect(&s.stale, static_cast<int32>(part.x), static_cast<int32>(part.y),
-                       static_cast<int32>(part.width), static_cast<int32>(part.height));
+    const uint32_t area =
+        Raster_SubRect(&s.stale, static_cast<int32_t>(part.x), static_cast<int32_t>(part.y),
+                       static_cast<int32_t>(part.width), static_cast<int32_t>(part.height));
     if (area == 0 && s.stale.entries[0].width > 0)
         ++s.uncut; // not a cut that fits: the part stays listed, and is converted again
     else
@@ -94,23 +94,23 @@ int main() {
     DamagedScreen s;
     convert(s, {0, 0, kWidth, kHeight}); // from here on the screen is true
     std::minstd_rand random;             // gives the same numbers everywhere
-    const auto below = [&random](int32 limit) {
-        return static_cast<int32>(random() % static_cast<uint32>(limit));
+    const auto below = [&random](int32_t limit) {
+        return static_cast<int32_t>(random() % static_cast<uint32_t>(limit));
     };
 
     for (int i = 0; i < kRefreshes; ++i) {
         // Little things in one neighbourhood, which may lie over an edge.
-        const int32 x = below(kWidth) - 40, y = below(kHeight) - 40;
+        const int32_t x = below(kWidth) - 40, y = below(kHeight) - 40;
         for (int count = below(16); count > 0; --count) {
-            const int32 left = x + below(80), top = y + below(80);
-            const int32 width = 1 + below(20), height = 1 + below(20);
-            draw(s, clipped(left, top, width, height), static_cast<uint32>(below(0x10000)));
+            const int32_t left = x + below(80), top = y + below(80);
+            const int32_t width = 1 + below(20), height = 1 + below(20);
+            draw(s, clipped(left, top, width, height), static_cast<uint32_t>(below(0x10000)));
         }
         refreshPart(s, clipped(x + 20, y + 35, 40, 10));
         refresh(s);
     }
 
-    const std::vector<uint8> shown = s.screen;
+    const std::vector<uint8_t> shown = s.screen;
     const uint64_t converted = s.converted;
     convert(s, {0, 0, kWidth, kHeight});
     if (s.screen != shown) {

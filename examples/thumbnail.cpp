@@ -6,8 +6,8 @@
 //
 //     c++ -std=c++20 thumbnail.cpp $(pkg-config --cflags --libs quillon)
 
-#include "imageUtil.h"
-#include "raster.h"
+#include <quillon/imageUtil.h>
+#include <quillon/raster.h>
 
 #include <array>
 #include <cerrno>
@@ -44,19 +44,19 @@ constexpr char kUsage[] =
     "A PNG output has alpha when any pixel of the input is not opaque.\n"
     "Colour and palette files are read, grey ones are not.\n";
 
-constexpr int32 kMaxSide = 32767; // what the scaler takes
-constexpr int32 kNotGiven = -1;   // as the library has it
+constexpr int32_t kMaxSide = 32767; // what the scaler takes
+constexpr int32_t kNotGiven = -1;   // as the library has it
 
 struct Crop {
-    int32 x, y, width, height;
+    int32_t x, y, width, height;
 };
 
 struct Request {
     std::string input;
     std::string output;
     bool isBmp = false;
-    int32 width = kNotGiven;
-    int32 height = kNotGiven;
+    int32_t width = kNotGiven;
+    int32_t height = kNotGiven;
     std::optional<Crop> crop;
 };
 
@@ -69,7 +69,7 @@ struct Image : ImageInfo {
 };
 
 // Takes a decimal number off the front of text.
-bool takeNumber(std::string_view &text, int32 low, int32 &value) {
+bool takeNumber(std::string_view &text, int32_t low, int32_t &value) {
     const auto [end, error] = std::from_chars(text.data(), text.data() + text.size(), value);
     text.remove_prefix(static_cast<size_t>(end - text.data()));
     return error == std::errc{} && value >= low && value <= kMaxSide;
@@ -81,8 +81,8 @@ bool takeMark(std::string_view &text, char mark) {
     return isThere;
 }
 
-int32 parseSide(const char *option, std::string_view text) {
-    int32 side = 0;
+int32_t parseSide(const char *option, std::string_view text) {
+    int32_t side = 0;
     if (!takeNumber(text, 1, side) || !text.empty()) {
         throw std::runtime_error(std::string(option) + " takes a whole number from 1 to " +
                                  std::to_string(kMaxSide));
@@ -148,17 +148,17 @@ std::optional<Request> parseArguments(int argc, char **argv) {
 
 // Expands a palette image to opaque 32-bit pixels.
 void expandPalette(const Image &indexed, Image &colored) {
-    std::array<uint32, 256> palette = {};
+    std::array<uint32_t, 256> palette = {};
     for (size_t i = 0; i < palette.size(); ++i) {
         const ImageUtilColor &color = indexed.palette[i];
-        palette[i] = 0xFF000000u | uint32{color.red} << 16 | uint32{color.green} << 8 | color.blue;
+        palette[i] = 0xFF000000u | uint32_t{color.red} << 16 | uint32_t{color.green} << 8 | color.blue;
     }
     colored.width = indexed.width;
     colored.height = indexed.height;
     colored.depth = 24;
     colored.bpp = 32;
     colored.bytesPerLine = indexed.width * 4;
-    colored.data = static_cast<uint8 *>(std::calloc(indexed.height, colored.bytesPerLine));
+    colored.data = static_cast<uint8_t *>(std::calloc(indexed.height, colored.bytesPerLine));
     if (colored.data == nullptr) {
         throw std::bad_alloc();
     }
@@ -184,9 +184,9 @@ void readInput(const Request &request, Image &picture) {
 }
 
 bool isOpaque(const Image &picture) {
-    for (uint32 y = 0; y < picture.height; ++y) {
-        const uint8 *const row = picture.data + size_t{y} * picture.bytesPerLine;
-        for (uint32 x = 0; x < picture.width; ++x) {
+    for (uint32_t y = 0; y < picture.height; ++y) {
+        const uint8_t *const row = picture.data + size_t{y} * picture.bytesPerLine;
+        for (uint32_t x = 0; x < picture.width; ++x) {
             if (row[size_t{x} * 4 + 3] != 255) {
                 return false;
             }

@@ -3,8 +3,8 @@
 //     yuvToPng IN.yuv WIDTH HEIGHT {YUY2|UYVY|YV12} OUT.png
 //
 //     c++ -std=c++17 yuvToPng.cpp $(pkg-config --cflags --libs quillon)
-#include "imageUtil.h"
-#include "raster.h"
+#include <quillon/imageUtil.h>
+#include <quillon/raster.h>
 
 #include <algorithm>
 #include <charconv>
@@ -21,9 +21,9 @@
 
 namespace {
 
-uint32 parseSide(const char *what, std::string_view text) {
-    constexpr uint32 kMaxSide = 16384; // so that no count of bytes passes 32 bits
-    uint32 side = 0;
+uint32_t parseSide(const char *what, std::string_view text) {
+    constexpr uint32_t kMaxSide = 16384; // so that no count of bytes passes 32 bits
+    uint32_t side = 0;
     const char *const last = text.data() + text.size();
     const auto [end, error] = std::from_chars(text.data(), last, side);
     if (error != std::errc{} || end != last || side < 1 || side > kMaxSide)
@@ -32,7 +32,7 @@ uint32 parseSide(const char *what, std::string_view text) {
     return side;
 }
 
-uint32 parseFormat(std::string_view text) {
+uint32_t parseFormat(std::string_view text) {
     if (text == "YUY2")
         return RASTER_VIDEO_YUY2;
     if (text == "UYVY")
@@ -45,7 +45,7 @@ uint32 parseFormat(std::string_view text) {
 
 // Reads a file that must have just the given size: a raw frame does not tell its
 // own, so this is the only sign of a wrong width, height or format.
-std::vector<uint8> readFrame(const std::string &fileName, size_t size) {
+std::vector<uint8_t> readFrame(const std::string &fileName, size_t size) {
     std::error_code error;
     const auto found = std::filesystem::file_size(fileName, error);
     if (error)
@@ -53,7 +53,7 @@ std::vector<uint8> readFrame(const std::string &fileName, size_t size) {
     if (found != size)
         throw std::runtime_error(fileName + ": has " + std::to_string(found) +
                                  " bytes, but such a frame has " + std::to_string(size));
-    std::vector<uint8> frame(size);
+    std::vector<uint8_t> frame(size);
     std::ifstream file(fileName, std::ios::binary);
     if (!file.read(reinterpret_cast<char *>(frame.data()), static_cast<std::streamsize>(size)))
         throw std::runtime_error(fileName + ": cannot be read");
@@ -62,7 +62,7 @@ std::vector<uint8> readFrame(const std::string &fileName, size_t size) {
 
 // The conversion takes U for V and V for U.  So it is given them exchanged, and
 // then has the right colours, with red in the place of blue.
-void exchangeChroma(std::vector<uint8> &frame, uint32 format, size_t pixels) {
+void exchangeChroma(std::vector<uint8_t> &frame, uint32_t format, size_t pixels) {
     if (format == RASTER_VIDEO_YV12) {
         const auto v = frame.begin() + static_cast<std::ptrdiff_t>(pixels);
         const auto u = v + static_cast<std::ptrdiff_t>(pixels / 4);
@@ -75,22 +75,22 @@ void exchangeChroma(std::vector<uint8> &frame, uint32 format, size_t pixels) {
 }
 
 void run(char **arguments) {
-    const uint32 width = parseSide("the width", arguments[1]);
-    const uint32 height = parseSide("the height", arguments[2]);
-    const uint32 format = parseFormat(arguments[3]);
+    const uint32_t width = parseSide("the width", arguments[1]);
+    const uint32_t height = parseSide("the height", arguments[2]);
+    const uint32_t format = parseFormat(arguments[3]);
 
     // Frames are stored with even sides, but for the height of the packed formats.
     // All of what is stored is converted, and the picture cut from it: told an odd
     // width, the conversion would leave out the last column of YV12, and take the
     // padding of a packed row for the first pixel of the next one.
-    const uint32 storedWidth = width + width % 2;
-    const uint32 storedHeight = format == RASTER_VIDEO_YV12 ? height + height % 2 : height;
+    const uint32_t storedWidth = width + width % 2;
+    const uint32_t storedHeight = format == RASTER_VIDEO_YV12 ? height + height % 2 : height;
     const size_t pixels = size_t{storedWidth} * storedHeight;
-    std::vector<uint8> frame =
+    std::vector<uint8_t> frame =
         readFrame(arguments[0], format == RASTER_VIDEO_YV12 ? pixels / 2 * 3 : pixels * 2);
 
     exchangeChroma(frame, format, pixels);
-    std::vector<uint8> colors(pixels * 3);
+    std::vector<uint8_t> colors(pixels * 3);
     Raster_YUVtoRGB(frame.data(), colors.data(), storedWidth, storedHeight, format, 24);
     for (size_t i = 0; i < colors.size(); i += 3)
         std::swap(colors[i], colors[i + 2]);

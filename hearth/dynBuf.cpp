@@ -1,6 +1,6 @@
 // The growable byte buffer.
 
-#include "hearth.h"
+#include <hearth/hearth.h>
 
 #include <algorithm>
 #include <cstdint>

@@ -1,6 +1,6 @@
 // Files, on the system's descriptors.
 
-#include "hearth.h"
+#include <hearth/hearth.h>
 
 #include <cerrno>
 #include <cstring>

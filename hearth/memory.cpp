@@ -1,6 +1,6 @@
 // Allocation that answers with null instead of anything cleverer.
 
-#include "hearth.h"
+#include <hearth/hearth.h>
 
 #include <cstdlib>
 

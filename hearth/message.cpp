@@ -1,6 +1,6 @@
 // Messages to standard error.
 
-#include "hearth.h"
+#include <hearth/hearth.h>
 
 #include <cstdarg>
 #include <cstdio>

@@ -1,7 +1,7 @@
 // Cursors: planes, boxes and drawing against models that go pixel by pixel,
 // scaling against its composition from a padded image and the scaler.
 
-#include "raster.h"
+#include <quillon/raster.h>
 #include "reference/pixels.h"
 #include "support/faults.h"
 #include "support/fence.h"
@@ -20,10 +20,10 @@
 namespace quillon::test {
 namespace {
 
-constexpr uint32 kNoSize = 0xFFFFFFFF;
+constexpr uint32_t kNoSize = 0xFFFFFFFF;
 constexpr size_t kAlphaRecordSize = 32;
 
-using Bytes = std::vector<uint8>;
+using Bytes = std::vector<uint8_t>;
 
 Bytes bytesOf(const FencedBuffer &buffer) {
     return {buffer.data(), buffer.end()};
@@ -31,16 +31,16 @@ Bytes bytesOf(const FencedBuffer &buffer) {
 
 // --- Planes
 
-uint32 modelSize(uint32 width, uint32 height, uint32 depth) {
+uint32_t modelSize(uint32_t width, uint32_t height, uint32_t depth) {
     const uint64_t bits = uint64_t{width} * depth + 31, row = bits / 32 * 4;
     const bool hasSize = bits <= kNoSize && (height == 0 || row <= kNoSize / height);
-    return hasSize ? static_cast<uint32>(row * height) : kNoSize;
+    return hasSize ? static_cast<uint32_t>(row * height) : kNoSize;
 }
 
 TEST(CursorPlanes, haveASize) {
     forEachCase(300000, [](Random &random) {
         const auto draw = [&] { return random.word() >> random.below(32); };
-        const uint32 width = draw(), height = draw(), depth = draw();
+        const uint32_t width = draw(), height = draw(), depth = draw();
         ASSERT_EQ(Raster_CalculateCursorSize(width, height, depth),
                   modelSize(width, height, depth));
     });
@@ -49,17 +49,17 @@ TEST(CursorPlanes, haveASize) {
 // Padding is left alone by an expansion, and goes along in a copy.
 TEST(CursorPlanes, areExpandedOrCopied) {
     forEachCase(20000, [](Random &random) {
-        const uint32 width = random.below(80), height = random.below(6);
-        const uint32 depth = random.oneOf({1u, 8u, 15u, 16u, 24u, 32u, random.below(50)});
-        const uint32 size = modelSize(width, height, depth);
+        const uint32_t width = random.below(80), height = random.below(6);
+        const uint32_t depth = random.oneOf({1u, 8u, 15u, 16u, 24u, 32u, random.below(50)});
+        const uint32_t size = modelSize(width, height, depth);
         const FencedBuffer bits(modelSize(width, height, 1)), plane(size), dst(size_t{size} * 2);
         for (const FencedBuffer *buffer : {&bits, &plane, &dst})
             random.fill(buffer->data(), buffer->size());
         Bytes expected = bytesOf(dst);
-        const auto expand = [&](uint8 *part) {
-            Raster_BitsToPixels(bits.data(), static_cast<int32>(modelSize(width, 1, 1)), part,
-                                static_cast<int32>(modelSize(width, 1, depth)),
-                                static_cast<int32>(depth / 8), static_cast<int32>(width), height,
+        const auto expand = [&](uint8_t *part) {
+            Raster_BitsToPixels(bits.data(), static_cast<int32_t>(modelSize(width, 1, 1)), part,
+                                static_cast<int32_t>(modelSize(width, 1, depth)),
+                                static_cast<int32_t>(depth / 8), static_cast<int32_t>(width), height,
                                 0xFFFFFFFF, 0);
         };
         expand(expected.data());
@@ -68,7 +68,7 @@ TEST(CursorPlanes, areExpandedOrCopied) {
 
         const bool areBits[] = {random.oneIn(2), random.oneIn(2)};
         for (const size_t i : {0u, 1u}) {
-            uint8 *const part = expected.data() + i * size;
+            uint8_t *const part = expected.data() + i * size;
             if (areBits[i] && depth != 1)
                 expand(part);
             else
@@ -85,7 +85,7 @@ TEST(CursorPlanes, areExpandedOrCopied) {
 TEST(CursorPlanes, panics) {
     const Bytes bits(8, 0xFF);
     Bytes dst(64, 0xAB);
-    const auto expand = [&](const char *start, uint32 andDepth, uint32 size) {
+    const auto expand = [&](const char *start, uint32_t andDepth, uint32_t size) {
         expectPanic(start, [&] {
             Raster_ExpandPlanarCursorData(4, 2, andDepth, bits.data(), 8, bits.data(), 32,
                                           dst.data(), size);
@@ -102,10 +102,10 @@ TEST(CursorPlanes, panics) {
 // Such planes would reach beyond any dstSize, one of them or only both together.
 // Null pointers, as nothing may be read either.
 TEST(CursorPlanes, whatNoSizeTellsIsNotWritten) {
-    const uint32 planes[][3] = {
+    const uint32_t planes[][3] = {
         {32, 0x10000000, 32}, {kNoSize, 1, 32}, {0x20000000, 1, 8}, {kNoSize, 1, 1}};
     for (const auto &[width, height, depth] : planes)
-        for (const uint32 data : {uint32{1}, depth}) {
+        for (const uint32_t data : {uint32_t{1}, depth}) {
             Raster_ExpandCursorBitPlane(width, height, depth, nullptr, nullptr, kNoSize);
             Raster_ExpandPlanarCursorData(width, height, data, nullptr, data, nullptr, depth,
                                           nullptr, kNoSize);
@@ -117,7 +117,7 @@ TEST(CursorPlanes, whatNoSizeTellsIsNotWritten) {
 
 // A cursor with random images, the record and both images fenced.
 struct TestCursor {
-    TestCursor(Random &random, uint32 type, uint32 width, uint32 height)
+    TestCursor(Random &random, uint32_t type, uint32_t width, uint32_t height)
         : memory(type == RASTER_CURSOR_ALPHA ? kAlphaRecordSize : sizeof(RasterCursor)),
           first(size_t{4} * width * height), second(first.size()),
           record(*reinterpret_cast<RasterCursor *>(memory.data())) {
@@ -142,16 +142,16 @@ struct TestCursor {
 
 // One axis, at 64 bits.
 struct ModelRange {
-    ModelRange(int32 position, uint32 hotspot, uint32 size, uint32 screen)
-        : start(static_cast<int32>(static_cast<uint32>(position) - hotspot)),
+    ModelRange(int32_t position, uint32_t hotspot, uint32_t size, uint32_t screen)
+        : start(static_cast<int32_t>(static_cast<uint32_t>(position) - hotspot)),
           first(std::max<int64_t>(start, 0)), end(start + int64_t{size}),
           isVisible(first < std::min<int64_t>(end, screen) && end - first <= INT32_MAX),
-          dst(static_cast<uint32>(first)),
-          visible(static_cast<uint32>(std::min<int64_t>(end, screen) - first)),
-          src(static_cast<uint32>(first - start)) {}
+          dst(static_cast<uint32_t>(first)),
+          visible(static_cast<uint32_t>(std::min<int64_t>(end, screen) - first)),
+          src(static_cast<uint32_t>(first - start)) {}
     int64_t start, first, end;
     bool isVisible;
-    uint32 dst, visible, src;
+    uint32_t dst, visible, src;
 };
 
 TEST(CursorDrawing, boxesEqualTheirModel) {
@@ -164,7 +164,7 @@ TEST(CursorDrawing, boxesEqualTheirModel) {
         cursor.hotspotX = draw(), cursor.hotspotY = draw();
         cursor.width = draw(), cursor.height = draw();
         const RasterCursorScreen screen = {draw(), draw()};
-        const auto x = static_cast<int32>(draw()), y = static_cast<int32>(draw());
+        const auto x = static_cast<int32_t>(draw()), y = static_cast<int32_t>(draw());
         const ModelRange columns(x, cursor.hotspotX, cursor.width, screen.width);
         const ModelRange rows(y, cursor.hotspotY, cursor.height, screen.height);
         const bool isVisible = columns.isVisible && rows.isVisible;
@@ -177,8 +177,8 @@ TEST(CursorDrawing, boxesEqualTheirModel) {
     });
 }
 
-uint32 &pixelAt(const FencedBuffer &image, uint32 width, uint32 x, uint32 y) {
-    return reinterpret_cast<uint32 *>(image.data())[size_t{y} * width + x];
+uint32_t &pixelAt(const FencedBuffer &image, uint32_t width, uint32_t x, uint32_t y) {
+    return reinterpret_cast<uint32_t *>(image.data())[size_t{y} * width + x];
 }
 
 TEST(CursorDrawing, equalsItsModelAtEveryEdge) {
@@ -186,7 +186,7 @@ TEST(CursorDrawing, equalsItsModelAtEveryEdge) {
         const TestCursor source(random, random.below(2), 1 + random.below(40), 1 + random.below(9));
         RasterCursor &cursor = source.record;
         const RasterCursorScreen screen = {1 + random.below(50), 1 + random.below(12)};
-        const int32 x = random.between(-50, 100), y = random.between(-12, 24);
+        const int32_t x = random.between(-50, 100), y = random.between(-12, 24);
         RasterCursorBox box{};
         if (Raster_ComputeCursorBox(&screen, &cursor, x, y, &box) == 0)
             return;
@@ -198,11 +198,11 @@ TEST(CursorDrawing, equalsItsModelAtEveryEdge) {
         const FencedBuffer composed(size_t{4} * box.width * box.height), compose(composed.size());
         random.fill(frame.data(), frame.size());
         std::copy_n(frame.data(), frame.size(), drawn.data());
-        for (uint32 row = 0; row < box.height; ++row)
-            for (uint32 column = 0; column < box.width; ++column) {
-                const uint32 fromX = box.srcX + column, fromY = box.srcY + row;
-                uint32 &pixel = pixelAt(drawn, screen.width, box.dstX + column, box.dstY + row);
-                const uint32 over = pixelAt(source.first, cursor.width, fromX, fromY);
+        for (uint32_t row = 0; row < box.height; ++row)
+            for (uint32_t column = 0; column < box.width; ++column) {
+                const uint32_t fromX = box.srcX + column, fromY = box.srcY + row;
+                uint32_t &pixel = pixelAt(drawn, screen.width, box.dstX + column, box.dstY + row);
+                const uint32_t over = pixelAt(source.first, cursor.width, fromX, fromY);
                 pixel = isAlpha
                             ? reference::blended(over, pixel)
                             : (pixel & over) ^ pixelAt(source.second, cursor.width, fromX, fromY);
@@ -210,8 +210,8 @@ TEST(CursorDrawing, equalsItsModelAtEveryEdge) {
             }
 
         const Bytes before = bytesOf(frame);
-        const int32 line = 4 * static_cast<int32>(screen.width);
-        Raster_DrawCursor(frame.data(), line, compose.data(), 4 * static_cast<int32>(box.width),
+        const int32_t line = 4 * static_cast<int32_t>(screen.width);
+        Raster_DrawCursor(frame.data(), line, compose.data(), 4 * static_cast<int32_t>(box.width),
                           &cursor, &box);
         ASSERT_EQ(bytesOf(frame), before);
         ASSERT_EQ(bytesOf(compose), bytesOf(composed));
@@ -223,8 +223,8 @@ TEST(CursorDrawing, equalsItsModelAtEveryEdge) {
 // Row 1 of such an image is further than a line increment reaches.
 TEST(CursorDrawing, imagesTooWideAreNotDrawn) {
     const RasterCursorBox box = {0, 0, 1, 2, 0, 0};
-    for (const uint32 type : {0u, 1u})
-        for (const uint32 width : {0x20000000u, 0x40000001u, 0xFFFFFFFFu}) {
+    for (const uint32_t type : {0u, 1u})
+        for (const uint32_t width : {0x20000000u, 0x40000001u, 0xFFFFFFFFu}) {
             RasterCursor cursor{};
             cursor.type = type;
             cursor.width = width;
@@ -249,16 +249,16 @@ Scaled scaled(const TestCursor &source, double scaleX, double scaleY) {
 
 // One axis of the result, for a long double of 64 significant bits.
 struct ModelAxis {
-    ModelAxis(uint32 srcSize, uint32 srcHotspot, double scale)
-        : border(static_cast<uint32>(std::max(1.0L / scale, 1.0L * scale)) + 1),
+    ModelAxis(uint32_t srcSize, uint32_t srcHotspot, double scale)
+        : border(static_cast<uint32_t>(std::max(1.0L / scale, 1.0L * scale)) + 1),
           padded(srcSize + 2 * border),
           // rounded up from the product as a double
-          size(static_cast<uint32>(std::ceil(static_cast<double>(1.0L * padded * scale)))),
-          hotspot(static_cast<uint32>(1.0L * (srcHotspot + border) * scale)) {}
-    uint32 border, padded, size, hotspot;
+          size(static_cast<uint32_t>(std::ceil(static_cast<double>(1.0L * padded * scale)))),
+          hotspot(static_cast<uint32_t>(1.0L * (srcHotspot + border) * scale)) {}
+    uint32_t border, padded, size, hotspot;
 };
 
-void expectScaled(Random &random, uint32 type, uint32 width, uint32 height, double scaleX,
+void expectScaled(Random &random, uint32_t type, uint32_t width, uint32_t height, double scaleX,
                   double scaleY) {
     const TestCursor source(random, type, width, height);
     RasterCursor &from = source.record;
@@ -275,16 +275,16 @@ void expectScaled(Random &random, uint32 type, uint32 width, uint32 height, doub
 
     // The source with its border, through the scaler; where that refuses, what
     // changes nothing on the screen.
-    const auto expectImage = [&](const FencedBuffer &image, uint8 fill, uint32 filter,
-                                 const uint8 *scaledImage) {
+    const auto expectImage = [&](const FencedBuffer &image, uint8_t fill, uint32_t filter,
+                                 const uint8_t *scaledImage) {
         Bytes padded(size_t{4} * x.padded * y.padded, fill);
         for (size_t row = 0; row < height; ++row)
             std::copy_n(image.data() + 4 * width * row, 4 * width,
                         &padded[4 * ((y.border + row) * x.padded + x.border)]);
         Bytes expected(size_t{4} * x.size * y.size, fill);
-        Raster_Scale(expected.data(), static_cast<int32>(4 * x.size), x.size, y.size, 0, 0,
-                     static_cast<int32>(x.size), static_cast<int32>(y.size), padded.data(),
-                     static_cast<int32>(4 * x.padded), x.padded, y.padded, scaleX, scaleY, filter);
+        Raster_Scale(expected.data(), static_cast<int32_t>(4 * x.size), x.size, y.size, 0, 0,
+                     static_cast<int32_t>(x.size), static_cast<int32_t>(y.size), padded.data(),
+                     static_cast<int32_t>(4 * x.padded), x.padded, y.padded, scaleX, scaleY, filter);
         ASSERT_EQ(std::memcmp(scaledImage, expected.data(), expected.size()), 0);
     };
     if (type == RASTER_CURSOR_ALPHA)
@@ -308,8 +308,8 @@ TEST(CursorScaling, isAPaddedImageScaled) {
     });
     // Around the scaler's largest size and factors.
     Random random(1);
-    for (const uint32 type : {0u, 1u}) {
-        for (const uint32 size : {32763u, 32764u}) {
+    for (const uint32_t type : {0u, 1u}) {
+        for (const uint32_t size : {32763u, 32764u}) {
             expectScaled(random, type, size, 1, 1, 1);
             expectScaled(random, type, 1, size, 1, 1);
         }
@@ -319,12 +319,12 @@ TEST(CursorScaling, isAPaddedImageScaled) {
 }
 
 TEST(CursorScaling, withoutASizeThereIsNoCursor) {
-    const std::pair<uint32, double> cases[] = {
+    const std::pair<uint32_t, double> cases[] = {
         {8, 0},     {8, -1},      {8, HUGE_VAL}, {8, DBL_MAX},   {8, std::nan("")},
         {8, 1e10},  {8, 1e-10},   {8, DBL_MIN},  {8, 65536},     {8, 2e9},
         {8, -1e-9}, {kNoSize, 1}, {kNoSize, .5}, {0x20000000, 1}};
     Random random(1);
-    for (const uint32 type : {0u, 1u})
+    for (const uint32_t type : {0u, 1u})
         for (const auto &[size, scale] : cases)
             for (const bool isColumns : {true, false}) {
                 const TestCursor source(random, type, 8, 8);
@@ -337,7 +337,7 @@ TEST(CursorScaling, withoutASizeThereIsNoCursor) {
 
 TEST(CursorScaling, withoutMemory) {
     Random random(1);
-    for (const uint32 type : {0u, 1u}) {
+    for (const uint32_t type : {0u, 1u}) {
         const TestCursor source(random, type, 8, 8);
         forEachMemoryFault([&] { return scaled(source, 0.75, 2) != nullptr; });
     }

@@ -36,15 +36,15 @@ void expectSame(Extended actual, long double expected) {
     EXPECT_EQ((actual - Extended(high)).toDouble(), low);
     EXPECT_EQ(actual.isNegative(), expected < 0);
     if (std::fabs(expected) < 0x1p63L) {
-        EXPECT_EQ(actual.truncated(), static_cast<uint32>(static_cast<int64_t>(expected)));
+        EXPECT_EQ(actual.truncated(), static_cast<uint32_t>(static_cast<int64_t>(expected)));
     }
 }
 
 TEST(Extended, equalsTheHardware) {
     forEachCase(200000, [](Random &random) {
         const double a = hardDouble(random), b = hardDouble(random), c = hardDouble(random);
-        const uint32 m = random.word() >> random.below(32), n = 1 + (m >> random.below(32));
-        const auto i = static_cast<int32>(random.word()) >> random.below(32);
+        const uint32_t m = random.word() >> random.below(32), n = 1 + (m >> random.below(32));
+        const auto i = static_cast<int32_t>(random.word()) >> random.below(32);
         const long double wideA = a, wideB = b;
         expectSame(Extended(a), wideA);
         expectSame(Extended(a) + Extended(b), wideA + wideB);

@@ -1,6 +1,6 @@
 // libhearth's own functions, with nothing in their place.
 
-#include "hearth.h"
+#include <hearth/hearth.h>
 
 #include <gtest/gtest.h>
 

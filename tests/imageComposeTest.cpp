@@ -1,7 +1,7 @@
 // Images made out of others, against a plain painter.
 
-#include "imageUtil.h"
-#include "raster.h"
+#include <quillon/imageUtil.h>
+#include <quillon/raster.h>
 #include "support/faults.h"
 #include "support/messages.h"
 #include "support/testImage.h"
@@ -17,8 +17,8 @@ using namespace quillon::test;
 
 namespace {
 
-constexpr int32 kMin = std::numeric_limits<int32>::min();
-constexpr int32 kMax = std::numeric_limits<int32>::max();
+constexpr int32_t kMin = std::numeric_limits<int32_t>::min();
+constexpr int32_t kMax = std::numeric_limits<int32_t>::max();
 
 // An image that gives its pixels back.
 struct Result : ImageInfo {
@@ -39,14 +39,14 @@ struct Result : ImageInfo {
 
 // Images and where they go on a canvas.
 struct Collage {
-    void add(Random &random, Format format, uint32 width, uint32 height, RectPoint at) {
+    void add(Random &random, Format format, uint32_t width, uint32_t height, RectPoint at) {
         blocks.emplace_back(random, format, width, height, 4 * random.below(3));
         images.push_back(blocks.back().info);
         positions.push_back(at);
     }
     bool combine(Result &canvas) const {
         return canvas.made(ImageUtil_Combine(images.data(), positions.data(),
-                                             static_cast<uint32>(images.size()), &canvas));
+                                             static_cast<uint32_t>(images.size()), &canvas));
     }
     std::deque<TestImage> blocks;
     std::vector<ImageInfo> images;
@@ -57,11 +57,11 @@ TEST(Combine, LikeAPainter) {
     forEachCase(600, [](Random &random) {
         const Format format = kFormats[random.below(std::size(kFormats))];
         Collage collage;
-        int32 left = kMax, top = kMax, right = kMin, bottom = kMin, nextX = -7;
-        uint32 area = 0;
+        int32_t left = kMax, top = kMax, right = kMin, bottom = kMin, nextX = -7;
+        uint32_t area = 0;
         const bool isTight = random.oneIn(3); // side by side, which leaves no gap
-        for (uint32 i = 0, count = 1 + random.below(4); i < count; ++i) {
-            const uint32 width = 1 + random.below(12), height = isTight ? 6 : 1 + random.below(12);
+        for (uint32_t i = 0, count = 1 + random.below(4); i < count; ++i) {
+            const uint32_t width = 1 + random.below(12), height = isTight ? 6 : 1 + random.below(12);
             const RectPoint at = {isTight ? nextX : random.between(-15, 15),
                                   isTight ? 3 : random.between(-15, 15)};
             collage.add(random, format, width, height, at);
@@ -69,30 +69,30 @@ TEST(Combine, LikeAPainter) {
                 collage.images[i].data = nullptr;
             left = std::min(left, at.x);
             top = std::min(top, at.y);
-            right = std::max(right, nextX = at.x + static_cast<int32>(width));
-            bottom = std::max(bottom, at.y + static_cast<int32>(height));
+            right = std::max(right, nextX = at.x + static_cast<int32_t>(width));
+            bottom = std::max(bottom, at.y + static_cast<int32_t>(height));
             area += width * height;
         }
         Result canvas;
         ASSERT_TRUE(collage.combine(canvas));
-        ASSERT_EQ(canvas.width, static_cast<uint32>(right - left));
-        ASSERT_EQ(canvas.height, static_cast<uint32>(bottom - top));
+        ASSERT_EQ(canvas.width, static_cast<uint32_t>(right - left));
+        ASSERT_EQ(canvas.height, static_cast<uint32_t>(bottom - top));
         const bool needsAlpha = area != canvas.width * canvas.height && format.bpp != 32;
         EXPECT_EQ(canvas.bpp, needsAlpha ? 32 : format.bpp);
         EXPECT_EQ(canvas.depth, needsAlpha ? 24 : format.depth);
         EXPECT_EQ(canvas.flags, 0u);
         EXPECT_EQ(canvas.numColors, 0u);
-        const uint32 pixelBytes = canvas.bpp / 8;
+        const uint32_t pixelBytes = canvas.bpp / 8;
         ASSERT_EQ(canvas.bytesPerLine, (canvas.width * pixelBytes + 3) / 4 * 4);
 
-        std::vector<uint8> expected(size_t{canvas.bytesPerLine} * canvas.height);
+        std::vector<uint8_t> expected(size_t{canvas.bytesPerLine} * canvas.height);
         for (size_t i = 0; i < collage.images.size(); ++i) {
             const ImageInfo &image = collage.images[i];
-            const auto atX = static_cast<uint32>(collage.positions[i].x - left);
-            const auto atY = static_cast<uint32>(collage.positions[i].y - top);
-            for (uint32 y = 0; y < image.height && image.data != nullptr; ++y)
-                for (uint32 x = 0; x < image.width; ++x) {
-                    const uint8 *pixel = image.data + y * image.bytesPerLine + x * pixelBytes;
+            const auto atX = static_cast<uint32_t>(collage.positions[i].x - left);
+            const auto atY = static_cast<uint32_t>(collage.positions[i].y - top);
+            for (uint32_t y = 0; y < image.height && image.data != nullptr; ++y)
+                for (uint32_t x = 0; x < image.width; ++x) {
+                    const uint8_t *pixel = image.data + y * image.bytesPerLine + x * pixelBytes;
                     const Color opaque = colorAt(image, x, y);
                     std::memcpy(&expected[(atY + y) * canvas.bytesPerLine + (atX + x) * pixelBytes],
                                 needsAlpha ? &opaque.blue : pixel, pixelBytes);
@@ -111,7 +111,7 @@ TEST(Combine, NeverReadsOrWritesOutside) {
             return random.oneOf({0u, 1u, 7u, 0x7FFFFFFFu, 0x80000000u, 0xFFFFFFF9u, 0xFFFFFFFFu});
         };
         Collage collage;
-        for (uint32 i = 0, count = 1 + random.below(3); i < count; ++i) {
+        for (uint32_t i = 0, count = 1 + random.below(3); i < count; ++i) {
             const Format format = kFormats[random.below(std::size(kFormats))];
             collage.add(random, format, 6, 5, {coordinate(), coordinate()});
             // Widths beyond the rows, and formats that differ: rows bound both.
@@ -129,7 +129,7 @@ TEST(Combine, NeverReadsOrWritesOutside) {
 TEST(Combine, AtTheLimits) {
     Random random(1);
     Collage collage;
-    for (const int32 x : {0, 5})
+    for (const int32_t x : {0, 5})
         collage.add(random, {24, 32}, 10, 4, {x, 0});
     forEachMemoryFault([&] {
         Result canvas;
@@ -165,8 +165,8 @@ TEST(Combine, AtTheLimits) {
 
 // The arguments of a crop, all of the image and its own size by default.
 struct Request {
-    int32 left = 0, top = 0, right = -1, bottom = -1;
-    int32 dstLeft = 0, dstTop = 0, width = -1, height = -1;
+    int32_t left = 0, top = 0, right = -1, bottom = -1;
+    int32_t dstLeft = 0, dstTop = 0, width = -1, height = -1;
 
     bool run(const ImageInfo &image, Result &result) const {
         return result.made(ImageUtil_CropAndScaleImage(&image, left, top, right, bottom, dstLeft,
@@ -180,46 +180,46 @@ TEST(CropAndScale, CutsAndScales) {
     if (LDBL_MANT_DIG != 64)
         GTEST_SKIP() << "the factors need a 64-bit significand";
     forEachCase(600, [](Random &random) {
-        const int32 imageWidth = random.between(2, 41), imageHeight = random.between(2, 41);
-        const uint32 padding = 4 * random.below(3);
-        const TestImage image(random, {24, 32}, static_cast<uint32>(imageWidth),
-                              static_cast<uint32>(imageHeight), padding);
+        const int32_t imageWidth = random.between(2, 41), imageHeight = random.between(2, 41);
+        const uint32_t padding = 4 * random.below(3);
+        const TestImage image(random, {24, 32}, static_cast<uint32_t>(imageWidth),
+                              static_cast<uint32_t>(imageHeight), padding);
         Request request;
         request.right = random.between(1, imageWidth - (padding == 0 ? 0 : 1));
         request.left = random.between(0, request.right - 1);
         request.bottom = random.between(1, imageHeight);
         request.top = random.between(0, request.bottom - 1);
-        const int32 cropWidth = request.right - request.left;
-        const int32 cropHeight = request.bottom - request.top;
+        const int32_t cropWidth = request.right - request.left;
+        const int32_t cropHeight = request.bottom - request.top;
         if (request.bottom == imageHeight && random.oneIn(2))
             request.bottom = -1;
         if (request.right == imageWidth && random.oneIn(2))
             request.right = -1;
         // One side follows the other by proportion.
-        const int32 width = request.width = random.oneOf({-1, cropWidth, random.between(1, 90)});
-        const int32 height = request.height = random.oneOf({-1, cropHeight, random.between(1, 90)});
-        const int32 endWidth = width != -1    ? width
+        const int32_t width = request.width = random.oneOf({-1, cropWidth, random.between(1, 90)});
+        const int32_t height = request.height = random.oneOf({-1, cropHeight, random.between(1, 90)});
+        const int32_t endWidth = width != -1    ? width
                                : height != -1 ? height * cropWidth / cropHeight
                                               : cropWidth;
-        const int32 endHeight = height != -1  ? height
+        const int32_t endHeight = height != -1  ? height
                                 : width != -1 ? cropHeight * width / cropWidth
                                               : cropHeight;
         Result made;
         ASSERT_EQ(request.run(image.info, made), endWidth > 0 && endHeight > 0);
         if (!made.isMade)
             return;
-        ASSERT_EQ(made.width, static_cast<uint32>(endWidth));
-        ASSERT_EQ(made.height, static_cast<uint32>(endHeight));
+        ASSERT_EQ(made.width, static_cast<uint32_t>(endWidth));
+        ASSERT_EQ(made.height, static_cast<uint32_t>(endHeight));
         ASSERT_EQ(made.bytesPerLine, made.width * 4);
         EXPECT_TRUE(made.depth == 24 && made.bpp == 32 && made.flags == 0 && made.numColors == 0);
 
-        std::vector<uint8> expected(made.bytesPerLine * made.height);
+        std::vector<uint8_t> expected(made.bytesPerLine * made.height);
         const ImageInfo &info = image.info;
-        const uint8 *const first =
+        const uint8_t *const first =
             info.data + request.top * static_cast<ptrdiff_t>(info.bytesPerLine) + request.left * 4;
         ASSERT_EQ(Raster_Scale(expected.data(), endWidth * 4, made.width, made.height, 0, 0,
-                               endWidth, endHeight, first, static_cast<int32>(info.bytesPerLine),
-                               static_cast<uint32>(cropWidth), static_cast<uint32>(cropHeight),
+                               endWidth, endHeight, first, static_cast<int32_t>(info.bytesPerLine),
+                               static_cast<uint32_t>(cropWidth), static_cast<uint32_t>(cropHeight),
                                static_cast<double>(1.0L * endWidth / cropWidth),
                                static_cast<double>(1.0L * endHeight / cropHeight), 2),
                   1u);

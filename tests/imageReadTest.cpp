@@ -1,7 +1,7 @@
 // PNG files of every kind, whole and broken, into image records.
 
-#include "hearth.h"
-#include "imageUtil.h"
+#include <hearth/hearth.h>
+#include <quillon/imageUtil.h>
 #include "support/faults.h"
 #include "support/testImage.h"
 
@@ -15,7 +15,7 @@ using namespace quillon::test;
 
 namespace {
 
-using Bytes = std::vector<uint8>;
+using Bytes = std::vector<uint8_t>;
 
 int64_t toldSize = 0;
 
@@ -29,14 +29,14 @@ int64_t FileIO_GetSize(const FileIODescriptor * /*file*/) {
 namespace {
 
 // A record as a test begins with it, to be overwritten or not.
-ImageInfo recordOf(uint8 byte) {
+ImageInfo recordOf(uint8_t byte) {
     ImageInfo image;
     std::memset(&image, byte, sizeof image);
     return image;
 }
-constexpr uint8 kUntouched = 0x5A;
+constexpr uint8_t kUntouched = 0x5A;
 
-bool isRecordOf(const ImageInfo &image, uint8 byte) {
+bool isRecordOf(const ImageInfo &image, uint8_t byte) {
     const ImageInfo expected = recordOf(byte);
     return std::memcmp(&image, &expected, sizeof image) == 0;
 }
@@ -45,7 +45,7 @@ bool isRecordOf(const ImageInfo &image, uint8 byte) {
 
 struct PngPicture {
     int colorType, bitDepth;
-    uint32 width, height;
+    uint32_t width, height;
     std::vector<png_color> palette = {};
     Bytes samples = {}; // as stored, but for a byte each at least
 
@@ -58,7 +58,7 @@ struct PngPicture {
     }
 };
 
-PngPicture randomPicture(Random &random, std::pair<int, int> kind, uint32 width, uint32 height) {
+PngPicture randomPicture(Random &random, std::pair<int, int> kind, uint32_t width, uint32_t height) {
     PngPicture picture = {kind.first, kind.second, width, height};
     if (picture.isIndexed())
         picture.palette.resize(2 + random.below((1u << picture.bitDepth) - 1));
@@ -68,9 +68,9 @@ PngPicture randomPicture(Random &random, std::pair<int, int> kind, uint32 width,
     picture.samples.resize(width * height * picture.pixelBytes());
     random.fill(picture.samples.data(), picture.samples.size());
     if (picture.isIndexed() || picture.bitDepth < 8)
-        for (uint8 &sample : picture.samples)
+        for (uint8_t &sample : picture.samples)
             sample =
-                static_cast<uint8>(sample % (picture.isIndexed() ? picture.palette.size() : 2));
+                static_cast<uint8_t>(sample % (picture.isIndexed() ? picture.palette.size() : 2));
     return picture;
 }
 
@@ -98,7 +98,7 @@ Bytes encode(Random &random, const PngPicture &picture) {
         rows.push_back(&picture.samples[i]);
     png_set_rows(png, info, const_cast<png_bytepp>(rows.data()));
     if (rows.empty()) {
-        const uint8 pixels[] = {'I', 'D', 'A', 'T', 0x78, 0x9C};
+        const uint8_t pixels[] = {'I', 'D', 'A', 'T', 0x78, 0x9C};
         png_write_info(png, info);
         png_write_chunk(png, pixels, pixels + 4, 2);
     } else {
@@ -115,39 +115,39 @@ size_t pixelStream(const Bytes &file) {
     return static_cast<size_t>(found - file.begin()) + 4;
 }
 
-bool readBuffer(ImageInfo *image, const Bytes &file, uint32 flags) {
+bool readBuffer(ImageInfo *image, const Bytes &file, uint32_t flags) {
     *image = recordOf(kUntouched);
     const FencedBuffer fenced(file.size());
     std::copy(file.begin(), file.end(), fenced.data());
-    return ImageUtil_ReadPNGBuffer(image, fenced.data(), static_cast<uint32>(file.size()), flags);
+    return ImageUtil_ReadPNGBuffer(image, fenced.data(), static_cast<uint32_t>(file.size()), flags);
 }
 
-void expectRecord(const ImageInfo &image, const PngPicture &picture, uint32 flags) {
+void expectRecord(const ImageInfo &image, const PngPicture &picture, uint32_t flags) {
     const bool hasAlpha =
         (flags & (picture.hasAlpha() ? IMAGEUTIL_READ_KEEP_ALPHA : IMAGEUTIL_READ_ADD_ALPHA)) != 0;
     ASSERT_TRUE(image.width == picture.width && image.height == picture.height);
     EXPECT_EQ(image.depth, picture.isIndexed() ? 8u : 24u);
     ASSERT_EQ(image.bpp, picture.isIndexed() ? 8u : hasAlpha ? 32u : 24u);
     EXPECT_EQ(image.flags, 0u);
-    const uint32 rowBytes = picture.width * image.bpp / 8;
+    const uint32_t rowBytes = picture.width * image.bpp / 8;
     ASSERT_EQ(image.bytesPerLine, (rowBytes + 3) / 4 * 4);
     ASSERT_EQ(image.numColors, picture.isIndexed() ? picture.palette.size() : 0);
     for (const ImageUtilColor &color : image.palette)
         EXPECT_EQ(color.reserved, 0);
-    expectColors(image, (flags & IMAGEUTIL_READ_BOTTOM_UP) != 0, [&](uint32 x, uint32 y) {
-        const uint8 *s = &picture.samples[(size_t{y} * picture.width + x) * picture.pixelBytes()];
+    expectColors(image, (flags & IMAGEUTIL_READ_BOTTOM_UP) != 0, [&](uint32_t x, uint32_t y) {
+        const uint8_t *s = &picture.samples[(size_t{y} * picture.width + x) * picture.pixelBytes()];
         if (picture.isIndexed())
             return Color{picture.palette[s[0]].blue, picture.palette[s[0]].green,
                          picture.palette[s[0]].red, 255};
         // To the nearest, as v / 65535 = r / 255 has it.
         const auto at8Bits = [&](size_t c) {
-            return static_cast<uint8>(
+            return static_cast<uint8_t>(
                 picture.bitDepth == 16 ? (s[2 * c] * 256 + s[2 * c + 1] + 128) / 257 : s[c]);
         };
         return Color{at8Bits(2), at8Bits(1), at8Bits(0),
-                     picture.hasAlpha() ? at8Bits(3) : uint8{255}};
+                     picture.hasAlpha() ? at8Bits(3) : uint8_t{255}};
     });
-    for (uint32 i = 0; i < image.height * image.bytesPerLine; ++i)
+    for (uint32_t i = 0; i < image.height * image.bytesPerLine; ++i)
         EXPECT_TRUE(i % image.bytesPerLine < rowBytes || image.data[i] == kStale) << "padding";
 }
 
@@ -171,7 +171,7 @@ TEST(PngRead, EveryFormatAndFlag) {
     forEachCase(600, [](Random &random) {
         const PngPicture picture = randomPicture(random, kKinds[random.below(std::size(kKinds))],
                                                  1 + random.below(20), 1 + random.below(20));
-        const uint32 flags = random.below(8) | (random.oneIn(2) ? 0xFFFFFFF8u : 0);
+        const uint32_t flags = random.below(8) | (random.oneIn(2) ? 0xFFFFFFF8u : 0);
         ImageInfo image;
         ASSERT_NE(readBuffer(&image, encode(random, picture), flags), picture.isGrey());
         if (picture.isGrey()) {
@@ -190,7 +190,7 @@ TEST(PngRead, EveryFormatAndFlag) {
 TEST(PngRead, PicturesTooLarge) {
     Random random(10);
     PngPicture large = {PNG_COLOR_TYPE_RGB_ALPHA, 8, 65536 / 4, 0};
-    for (const uint32 height : {65536u, 999999u}) {
+    for (const uint32_t height : {65536u, 999999u}) {
         large.height = height;
         ImageInfo image;
         EXPECT_FALSE(readBuffer(&image, encode(random, large), IMAGEUTIL_READ_KEEP_ALPHA));

@@ -1,7 +1,7 @@
 // Images of every format into BMP and PNG streams and files.
 
-#include "hearth.h"
-#include "imageUtil.h"
+#include <hearth/hearth.h>
+#include <quillon/imageUtil.h>
 #include "support/faults.h"
 #include "support/messages.h"
 #include "support/testImage.h"
@@ -21,7 +21,7 @@ using namespace quillon::test;
 
 namespace {
 
-using Bytes = std::vector<uint8>;
+using Bytes = std::vector<uint8_t>;
 
 bool writesShort = false;
 
@@ -36,7 +36,7 @@ int FileIO_Write(FileIODescriptor *file, const void *source, size_t count, size_
 
 namespace {
 
-bool encode(const ImageInfo &image, uint32 format, DynBuf *buffer) {
+bool encode(const ImageInfo &image, uint32_t format, DynBuf *buffer) {
     return format == IMAGEUTIL_FORMAT_PNG ? ImageUtil_ConstructPNGBuffer(&image, nullptr, buffer)
                                           : ImageUtil_ConstructBMPBuffer(&image, buffer);
 }
@@ -52,44 +52,44 @@ Bytes written(const Call &call) {
     return bytes;
 }
 
-Bytes fileOf(const ImageInfo &image, uint32 format) {
+Bytes fileOf(const ImageInfo &image, uint32_t format) {
     return written([&](DynBuf *buffer) { return encode(image, format, buffer); });
 }
 
 TEST(ImageWrite, BmpOfEveryFormat) {
     forEachCase(600, [](Random &random) {
         const Format format = kFormats[random.below(std::size(kFormats))];
-        const uint32 inRow = 1 + random.below(40), height = 1 + random.below(20);
+        const uint32_t inRow = 1 + random.below(40), height = 1 + random.below(20);
         const TestImage image(random, format, inRow, height, random.below(5)); // odd distances too
         ImageInfo info = image.info;
         // Of rows that lie closer than they are long, what there is comes first.
-        const uint32 width = info.width = inRow + (random.oneIn(4) ? 4 + random.below(9) : 0);
+        const uint32_t width = info.width = inRow + (random.oneIn(4) ? 4 + random.below(9) : 0);
         const bool isIndexed = format.bpp == 8;
-        const uint32 numColors = info.numColors =
+        const uint32_t numColors = info.numColors =
             isIndexed ? random.oneOf({256u, 257u, 0xFFFFFFFFu}) : 0;
         const Bytes file = fileOf(info, IMAGEUTIL_FORMAT_BMP);
 
-        const uint32 offset = 54 + std::min(numColors, 256u) * 4;
-        const uint32 rowBytes = (width * (isIndexed ? 1 : 3) + 3) / 4 * 4;
+        const uint32_t offset = 54 + std::min(numColors, 256u) * 4;
+        const uint32_t rowBytes = (width * (isIndexed ? 1 : 3) + 3) / 4 * 4;
         ASSERT_EQ(file.size(), offset + rowBytes * height);
-        const uint32 imageBytes = rowBytes * height;
-        const uint32 planesAndBits = isIndexed ? 8u << 16 | 1 : 24u << 16 | 1;
-        const uint32 sizes[] = {offset + imageBytes, 0, offset, 40, width, height, planesAndBits};
-        const uint32 rest[] = {0, imageBytes, 0, 0, std::min(numColors, 256u), 0};
+        const uint32_t imageBytes = rowBytes * height;
+        const uint32_t planesAndBits = isIndexed ? 8u << 16 | 1 : 24u << 16 | 1;
+        const uint32_t sizes[] = {offset + imageBytes, 0, offset, 40, width, height, planesAndBits};
+        const uint32_t rest[] = {0, imageBytes, 0, 0, std::min(numColors, 256u), 0};
         EXPECT_EQ(Bytes(&file[0], &file[2]), (Bytes{'B', 'M'}));
         EXPECT_EQ(std::memcmp(&file[2], sizes, sizeof sizes), 0);
         EXPECT_EQ(std::memcmp(&file[30], rest, sizeof rest), 0);
-        for (uint32 y = 0; y < height; ++y) {
-            const uint8 *const row = &file[offset + (height - 1 - y) * rowBytes];
-            for (uint32 x = 0; x < inRow; ++x) {
-                const uint8 *const p = isIndexed ? &file[54 + 4 * row[x]] : row + x * 3;
+        for (uint32_t y = 0; y < height; ++y) {
+            const uint8_t *const row = &file[offset + (height - 1 - y) * rowBytes];
+            for (uint32_t x = 0; x < inRow; ++x) {
+                const uint8_t *const p = isIndexed ? &file[54 + 4 * row[x]] : row + x * 3;
                 const Color expected = pictureColorAt(info, x, y);
                 ASSERT_EQ((Color{p[0], p[1], p[2], expected.alpha}), expected) << x << ", " << y;
             }
             // Behind them: padding of the image where rows are copied, then zeros.
             const bool isCopied = isIndexed || format.bpp == 24;
-            const uint32 converted = std::min(width, info.bytesPerLine / (format.bpp / 8));
-            for (uint32 i = isCopied ? info.bytesPerLine : converted * 3; i < rowBytes; ++i)
+            const uint32_t converted = std::min(width, info.bytesPerLine / (format.bpp / 8));
+            for (uint32_t i = isCopied ? info.bytesPerLine : converted * 3; i < rowBytes; ++i)
                 EXPECT_EQ(row[i], 0);
         }
     });
@@ -105,7 +105,7 @@ TEST(ImageWrite, PngOfEveryFormat) {
             std::memset(info.data, 0, image.pixels.size());
             info.numColors = random.oneOf({1u, 16u, 257u, 0xFFFFFFFFu});
         }
-        const int32 level = random.between(-2, 12);
+        const int32_t level = random.between(-2, 12);
         const ImageUtilPngOptions options = {level, random.oneIn(2)};
         const bool isDefault = random.oneIn(3);
         const Bytes file = written([&](DynBuf *buffer) {
@@ -116,14 +116,14 @@ TEST(ImageWrite, PngOfEveryFormat) {
                               : hasAlpha      ? PNG_COLOR_TYPE_RGB_ALPHA
                                               : PNG_COLOR_TYPE_RGB;
         ASSERT_GT(file.size(), 40u);
-        EXPECT_EQ(Bytes(&file[24], &file[29]), (Bytes{8, static_cast<uint8>(colorType), 0, 0, 0}));
+        EXPECT_EQ(Bytes(&file[24], &file[29]), (Bytes{8, static_cast<uint8_t>(colorType), 0, 0, 0}));
         info.bytesPerLine -= format.bpp == 16 ? info.bytesPerLine % 2 : 0; // counts as even
         ImageInfo read;
-        ASSERT_TRUE(ImageUtil_ReadPNGBuffer(&read, file.data(), static_cast<uint32>(file.size()),
+        ASSERT_TRUE(ImageUtil_ReadPNGBuffer(&read, file.data(), static_cast<uint32_t>(file.size()),
                                             IMAGEUTIL_READ_KEEP_ALPHA));
         ASSERT_TRUE(read.width == info.width && read.height == info.height);
         ASSERT_EQ(read.numColors, std::min(info.numColors, 256u));
-        expectColors(read, false, [&](uint32 x, uint32 y) { return pictureColorAt(info, x, y); });
+        expectColors(read, false, [&](uint32_t x, uint32_t y) { return pictureColorAt(info, x, y); });
         ImageUtil_FreeImageData(&read);
 
         // Bits 6 and 7 of the second byte of a zlib stream tell the effort made.
@@ -140,7 +140,7 @@ TEST(ImageWrite, WhatCannotBeWritten) {
     TestImage image(random, {24, 24}, 4, 4);
     image.info.data[0] = 3;
     const struct {
-        uint32 format, width, height, depth, bpp, bytesPerLine, numColors;
+        uint32_t format, width, height, depth, bpp, bytesPerLine, numColors;
     } cases[] = {
         {IMAGEUTIL_FORMAT_BMP, 0x55555556, 4, 24, 24, 12, 0}, // rows of 2^32 + 2 bytes
         {IMAGEUTIL_FORMAT_BMP, 0xFFFFFFFF, 4, 24, 24, 12, 0},
@@ -161,7 +161,7 @@ TEST(ImageWrite, WhatCannotBeWritten) {
         info.bytesPerLine = c.bytesPerLine, info.numColors = c.numColors;
         EXPECT_TRUE(fileOf(info, c.format).empty()) << "number " << &c - cases;
     }
-    for (const uint32 format : {IMAGEUTIL_FORMAT_PNG, IMAGEUTIL_FORMAT_BMP}) {
+    for (const uint32_t format : {IMAGEUTIL_FORMAT_PNG, IMAGEUTIL_FORMAT_BMP}) {
         // The exception must find nothing held; the leak sanitizer would tell.
         ImageInfo info = image.info;
         info.depth = 12, info.bpp = 16;
@@ -175,7 +175,7 @@ TEST(ImageWrite, WhatCannotBeWritten) {
 TEST(ImageWrite, PngStreamBeyond4GiB) {
     png_structp png = png_create_write_struct(PNG_LIBPNG_VER_STRING, nullptr, nullptr, nullptr);
     const ImageUtilMemOps noMemory = {};
-    uint8 block[4] = {};
+    uint8_t block[4] = {};
     for (const size_t length : {size_t{16}, ~size_t{0}}) {
         ImageUtilPngBuffer buffer = {block, 0xFFFFFFF8u, 0xFFFFFFF8u, &noMemory};
         png_set_write_fn(png, &buffer, ImageUtilBufferWriteCallback, nullptr);
@@ -193,9 +193,9 @@ size_t kAhead = 64; // its address is their context
 
 void *resizeBlock(void *context, void *block, size_t size) {
     EXPECT_EQ(context, &kAhead);
-    void *whole = block == nullptr ? nullptr : static_cast<uint8 *>(block) - kAhead;
+    void *whole = block == nullptr ? nullptr : static_cast<uint8_t *>(block) - kAhead;
     whole = std::realloc(whole, size + kAhead);
-    return whole == nullptr ? nullptr : static_cast<uint8 *>(whole) + kAhead;
+    return whole == nullptr ? nullptr : static_cast<uint8_t *>(whole) + kAhead;
 }
 
 void *takeBlock(void *context, size_t size) {
@@ -204,7 +204,7 @@ void *takeBlock(void *context, size_t size) {
 
 void releaseBlock(void *context, void *block) {
     EXPECT_EQ(context, &kAhead);
-    std::free(block == nullptr ? nullptr : static_cast<uint8 *>(block) - kAhead);
+    std::free(block == nullptr ? nullptr : static_cast<uint8_t *>(block) - kAhead);
 }
 
 TEST(ImageWrite, WithoutMemoryOrWithThatOfTheCaller) {
@@ -212,7 +212,7 @@ TEST(ImageWrite, WithoutMemoryOrWithThatOfTheCaller) {
     for (const Format format : {Format{8, 8}, Format{15, 16}, Format{24, 32}}) {
         const TestImage image(random, format, 50, 40);
         const Bytes file = fileOf(image.info, IMAGEUTIL_FORMAT_PNG);
-        for (const uint32 kind : {IMAGEUTIL_FORMAT_PNG, IMAGEUTIL_FORMAT_BMP})
+        for (const uint32_t kind : {IMAGEUTIL_FORMAT_PNG, IMAGEUTIL_FORMAT_BMP})
             forEachMemoryFault([&] {
                 DynBuf buffer = {};
                 const bool isWritten = encode(image.info, kind, &buffer);
@@ -221,8 +221,8 @@ TEST(ImageWrite, WithoutMemoryOrWithThatOfTheCaller) {
             });
         forEachMemoryFault([&] {
             const ImageUtilMemOps ops = {&kAhead, takeBlock, releaseBlock, resizeBlock};
-            uint8 *data = image.info.data;
-            uint32 size = 77;
+            uint8_t *data = image.info.data;
+            uint32_t size = 77;
             const bool isWritten =
                 ImageUtil_ConstructPNGBufferWithMemOps(&image.info, nullptr, &data, &size, &ops);
             EXPECT_TRUE(isWritten ? std::equal(file.begin(), file.end(), data, data + size)
@@ -242,7 +242,7 @@ TEST(ImageWrite, FilesOrALoggedFailure) {
     };
     Random random(6);
     const TestImage image(random, {24, 32}, 9, 5);
-    const auto write = [&](uint32 format, const std::string &name) {
+    const auto write = [&](uint32_t format, const std::string &name) {
         return ImageUtil_WriteImage(&image.info, name.c_str(), format);
     };
     expectPanic("NOT_IMPLEMENTED lib/image/imageUtil", [&] { write(2, path); });

@@ -1,6 +1,6 @@
 // Bit and stencil expansion against their reference.
 
-#include "raster.h"
+#include <quillon/raster.h>
 #include "support/messages.h"
 #include "support/surfaces.h"
 
@@ -19,10 +19,10 @@ constexpr Stencil kStencil[] = {RasterBitsToPixelsStencil8, RasterBitsToPixelsSt
 
 // By the general function, or the one that has the pixel size in its name.
 Operation expansion(Random &random, bool isStencil) {
-    const uint32 member = random.below(4), pixel = random.word(), background = random.word();
-    const auto bytes = static_cast<int32>(member + 1);
+    const uint32_t member = random.below(4), pixel = random.word(), background = random.word();
+    const auto bytes = static_cast<int32_t>(member + 1);
     const bool isNamed = random.oneIn(2);
-    const uint32 low = random.oneOf({0u, 0u, 0u, 0xFFu}), count = low == 0 ? 256 : 1;
+    const uint32_t low = random.oneOf({0u, 0u, 0u, 0xFFu}), count = low == 0 ? 256 : 1;
     return {(isStencil ? "stencil " : "opaque ") + std::to_string(bytes),
             {{.bytes = member + 1}, {.bytes = 0, .low = low, .count = count}},
             [=](const Surfaces &at, Size size) {
@@ -30,7 +30,7 @@ Operation expansion(Random &random, bool isStencil) {
                     function(at[1].first, at[1].signedLine(), at[0].first, at[0].signedLine(),
                              rest...);
                 };
-                const auto width = static_cast<int32>(size.width);
+                const auto width = static_cast<int32_t>(size.width);
                 if (isStencil && isNamed)
                     expand(kStencil[member], width, size.height, pixel);
                 else if (isStencil)
@@ -41,7 +41,7 @@ Operation expansion(Random &random, bool isStencil) {
                     expand(Raster_BitsToPixels, bytes, width, size.height, pixel, background);
             },
             [=](const Pixels &old) {
-                const uint32 clear = isStencil ? old[0] : background;
+                const uint32_t clear = isStencil ? old[0] : background;
                 return old[1] != 0 ? pixel : clear;
             },
             Walk::kForwards,
@@ -58,30 +58,30 @@ TEST(BitsToPixels, matchesReference) {
 // all bits are clear.
 TEST(BitsToPixelsStencil, touchesNoPageWhereAllBitsAreClear) {
     const FencedBuffer page(pageSize());
-    const auto end = static_cast<int32>(page.size());
+    const auto end = static_cast<int32_t>(page.size());
     forEachTarget([&] {
         forEachCase(6000, [&](Random &random) {
             const Operation call = expansion(random, true);
-            const auto bytes = static_cast<int32>(call.parts[0].bytes);
+            const auto bytes = static_cast<int32_t>(call.parts[0].bytes);
             const auto width = random.between(1, 300);
             // The first byte's place in the page, across one of its ends.
-            const int32 start = random.oneOf({0, end}) - random.between(0, width * bytes);
-            std::vector<uint8> bitmap(64);
+            const int32_t start = random.oneOf({0, end}) - random.between(0, width * bytes);
+            std::vector<uint8_t> bitmap(64);
             random.fill(bitmap.data(), bitmap.size());
             random.fill(page.data(), page.size());
-            std::vector<uint8> expected(page.data(), page.end());
-            for (int32 x = 0, at = start; x < width; ++x, at += bytes) {
-                uint8 &bits = bitmap[static_cast<size_t>(x / 8)];
-                const auto bit = static_cast<uint8>(0x80 >> x % 8);
+            std::vector<uint8_t> expected(page.data(), page.end());
+            for (int32_t x = 0, at = start; x < width; ++x, at += bytes) {
+                uint8_t &bits = bitmap[static_cast<size_t>(x / 8)];
+                const auto bit = static_cast<uint8_t>(0x80 >> x % 8);
                 if (at < 0 || at + bytes > end)
-                    bits &= static_cast<uint8>(~bit);
-                const uint32 pixel = call.reference({0, 1});
+                    bits &= static_cast<uint8_t>(~bit);
+                const uint32_t pixel = call.reference({0, 1});
                 if ((bits & bit) != 0)
                     std::memcpy(&expected[static_cast<size_t>(at)], &pixel, call.parts[0].bytes);
             }
             call.library(
                 {{nullptr, page.data() + start, 0, 0, 0}, {nullptr, bitmap.data(), 0, 0, 0}},
-                {static_cast<uint32>(width), 1});
+                {static_cast<uint32_t>(width), 1});
             EXPECT_TRUE(std::equal(page.data(), page.end(), expected.begin()))
                 << call.name << ", from byte " << start << " of the page";
         });
@@ -91,21 +91,21 @@ TEST(BitsToPixelsStencil, touchesNoPageWhereAllBitsAreClear) {
 // Pixels under clear bits belong to others: what another thread writes there is
 // never lost to a pixel that is read and written back.
 TEST(BitsToPixelsStencil, leavesClearPixelsToAnotherThread) {
-    constexpr uint32 kWidth = 64;
+    constexpr uint32_t kWidth = 64;
     constexpr int kRounds = 1000; // of the other thread
-    const auto check = [&](size_t bytes, uint8 pattern) {
-        std::vector<uint8> bitmap(kWidth / 8, pattern), surface(kWidth * bytes);
-        std::vector<uint8 *> others;
+    const auto check = [&](size_t bytes, uint8_t pattern) {
+        std::vector<uint8_t> bitmap(kWidth / 8, pattern), surface(kWidth * bytes);
+        std::vector<uint8_t *> others;
         for (size_t i = 0; i < surface.size(); ++i)
             if ((pattern << (i / bytes % 8) & 0x80) == 0)
                 others.push_back(&surface[i]);
         std::atomic<int> rounds = -1, lost = 0; // -1: not yet started
         std::thread other([&] {
             for (rounds = 0; rounds < kRounds; ++rounds) {
-                const auto value = static_cast<uint8>(rounds);
-                for (uint8 *byte : others)
+                const auto value = static_cast<uint8_t>(rounds);
+                for (uint8_t *byte : others)
                     std::atomic_ref(*byte).store(value, std::memory_order_relaxed);
-                for (uint8 *byte : others)
+                for (uint8_t *byte : others)
                     lost += std::atomic_ref(*byte).load(std::memory_order_relaxed) != value;
             }
         });
@@ -118,7 +118,7 @@ TEST(BitsToPixelsStencil, leavesClearPixelsToAnotherThread) {
     };
     forEachTarget([&] {
         for (const size_t bytes : {1u, 2u, 3u, 4u})
-            for (const uint8 pattern : {uint8{0x00}, uint8{0x55}, uint8{0x7E}})
+            for (const uint8_t pattern : {uint8_t{0x00}, uint8_t{0x55}, uint8_t{0x7E}})
                 check(bytes, pattern);
     });
 }
@@ -126,16 +126,16 @@ TEST(BitsToPixelsStencil, leavesClearPixelsToAnotherThread) {
 // Widths below 1 and unknown pixel sizes: nothing is looked at, or said.
 TEST(BitsToPixels, touchesNothingWhereThereIsNothingToDo) {
     const FencedBuffer fence(1);
-    uint8 *nowhere = fence.end();
+    uint8_t *nowhere = fence.end();
     warnings.clear();
-    const auto call = [&](int32 bytes, int32 width) {
+    const auto call = [&](int32_t bytes, int32_t width) {
         Raster_BitsToPixels(nowhere, 8, nowhere, 64, bytes, width, 9, 1, 2);
         Raster_BitsToPixelsStencil(nowhere, 8, nowhere, 64, bytes, width, 9, 1);
     };
-    for (const int32 bytes : {1, 2, 3, 4})
-        for (const int32 width : {-1, -8, INT32_MIN})
+    for (const int32_t bytes : {1, 2, 3, 4})
+        for (const int32_t width : {-1, -8, INT32_MIN})
             call(bytes, width);
-    for (const int32 bytes : {0, 5, -1, 8, 0x101, INT32_MIN, INT32_MAX})
+    for (const int32_t bytes : {0, 5, -1, 8, 0x101, INT32_MIN, INT32_MAX})
         call(bytes, 9);
     EXPECT_TRUE(warnings.empty());
 }

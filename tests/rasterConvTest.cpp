@@ -1,6 +1,6 @@
 // Conversions between pixel layouts against their reference.
 
-#include "raster.h"
+#include <quillon/raster.h>
 #include "reference/pixels.h"
 #include "support/messages.h"
 #include "support/surfaces.h"
@@ -10,22 +10,22 @@
 namespace quillon::test {
 namespace {
 
-constexpr int32 kLayouts[] = {3, 6, 8, 15, 16, 24, 32};
-constexpr int32 kSources[] = {15, 16, 24, 32};
+constexpr int32_t kLayouts[] = {3, 6, 8, 15, 16, 24, 32};
+constexpr int32_t kSources[] = {15, 16, 24, 32};
 
-uint32 bytesOf(int32 depth) {
-    return depth <= 8 ? 1 : static_cast<uint32>(depth + 1) / 8;
+uint32_t bytesOf(int32_t depth) {
+    return depth <= 8 ? 1 : static_cast<uint32_t>(depth + 1) / 8;
 }
 
 // From a layout, or a palette, to a layout.
 struct Pair {
-    int32 srcDepth, dstDepth;
+    int32_t srcDepth, dstDepth;
     bool pseudoColor;
-    const uint32 *palette;
+    const uint32_t *palette;
 };
 
 // By one of the functions that do the pair.
-void convert(const Pair &pair, uint32 way, const Surfaces &at, Size size) {
+void convert(const Pair &pair, uint32_t way, const Surfaces &at, Size size) {
     const auto &[src, dst, pseudo, palette] = pair;
     const Surface &to = at[0], &from = at[1];
     const auto call = [&](auto function, auto... depths) {
@@ -48,7 +48,7 @@ void convert(const Pair &pair, uint32 way, const Surfaces &at, Size size) {
                              size.height);
 }
 
-uint32 convertedByReference(const Pair &pair, uint32 pixel) {
+uint32_t convertedByReference(const Pair &pair, uint32_t pixel) {
     const auto &[src, dst, pseudo, palette] = pair;
     if (pseudo)
         return reference::converted(palette[pixel], 32, dst);
@@ -56,8 +56,8 @@ uint32 convertedByReference(const Pair &pair, uint32 pixel) {
 }
 
 TEST(ConvertPixels, matchesReference) {
-    const FencedBuffer colors(256 * sizeof(uint32));
-    const FencedBuffer highColors(256 * sizeof(uint32), FencedBuffer::Flush::kBefore);
+    const FencedBuffer colors(256 * sizeof(uint32_t));
+    const FencedBuffer highColors(256 * sizeof(uint32_t), FencedBuffer::Flush::kBefore);
     holdToReference(20000, [&](Random &random) {
         Pair pair = {kSources[random.below(4)], kLayouts[random.below(7)], random.oneIn(4),
                      nullptr};
@@ -67,19 +67,19 @@ TEST(ConvertPixels, matchesReference) {
         if (pair.pseudoColor) {
             pair.srcDepth = random.oneOf({8, 4, 0, -15, INT32_MIN}); // all mean one byte
             // There are no entries but those that pixels use, on one side at least.
-            const uint32 edge = random.below(256);
+            const uint32_t edge = random.below(256);
             const bool isLow = random.oneIn(2);
             src.low = isLow ? 0 : edge;
             src.count = isLow ? edge + 1 : 256 - edge;
             random.fill(colors.data(), colors.size());
             random.fill(highColors.data(), highColors.size());
-            const uint8 *first = isLow ? colors.end() - 4 * size_t{src.count} : highColors.data();
-            pair.palette = reinterpret_cast<const uint32 *>(first) - src.low;
+            const uint8_t *first = isLow ? colors.end() - 4 * size_t{src.count} : highColors.data();
+            pair.palette = reinterpret_cast<const uint32_t *>(first) - src.low;
         }
         const bool isCopy = !pair.pseudoColor && pair.srcDepth == pair.dstDepth;
         const bool isExact = isCopy || (pair.pseudoColor && pair.dstDepth == 32);
         src.rule = isExact ? RowRule::kExact : RowRule::kRounded;
-        const uint32 way = random.below(3);
+        const uint32_t way = random.below(3);
         return Operation{std::to_string(pair.srcDepth) + " to " + std::to_string(pair.dstDepth),
                          {{bytesOf(pair.dstDepth), src.rule}, src},
                          [=](const Surfaces &at, Size size) { convert(pair, way, at, size); },
@@ -93,32 +93,32 @@ TEST(ConvertPixels, matchesReference) {
 // Beyond the caches there are other stores, which need aligned addresses: rows that
 // begin everywhere in a line, and pixels that never begin one.
 TEST(ConvertPixels, matchesReferenceOnLargeSurfaces) {
-    constexpr uint32 kWidth = 1037, kLeast = 2 << 20;
+    constexpr uint32_t kWidth = 1037, kLeast = 2 << 20;
     Random random(baseSeed());
-    std::vector<uint32> palette(256);
-    random.fill(reinterpret_cast<uint8 *>(palette.data()), 256 * sizeof(uint32));
-    for (const int32 srcDepth : {8, 15, 16, 24, 32})
-        for (const int32 dstDepth : {8, 16, 24, 32}) {
+    std::vector<uint32_t> palette(256);
+    random.fill(reinterpret_cast<uint8_t *>(palette.data()), 256 * sizeof(uint32_t));
+    for (const int32_t srcDepth : {8, 15, 16, 24, 32})
+        for (const int32_t dstDepth : {8, 16, 24, 32}) {
             const Pair pair = {srcDepth, dstDepth, srcDepth == 8, palette.data()};
-            const uint32 height = kLeast / (kWidth * bytesOf(dstDepth)) + 1;
-            const auto lineOf = [](int32 depth) { return (kWidth + 3) * bytesOf(depth); };
+            const uint32_t height = kLeast / (kWidth * bytesOf(dstDepth)) + 1;
+            const auto lineOf = [](int32_t depth) { return (kWidth + 3) * bytesOf(depth); };
             const FencedBuffer src(size_t{height} * lineOf(srcDepth));
             random.fill(src.data(), src.size());
-            const uint32 odd = srcDepth == 24 ? 1 : 0;
+            const uint32_t odd = srcDepth == 24 ? 1 : 0;
             const FencedBuffer dst(size_t{height} * lineOf(dstDepth) + odd);
-            std::vector<uint8> expected(dst.size(), 0x5A);
-            for (uint32 y = 0; y < height; ++y)
-                for (uint32 x = 0; x < kWidth; ++x) {
-                    uint32 pixel = 0;
+            std::vector<uint8_t> expected(dst.size(), 0x5A);
+            for (uint32_t y = 0; y < height; ++y)
+                for (uint32_t x = 0; x < kWidth; ++x) {
+                    uint32_t pixel = 0;
                     std::memcpy(&pixel,
                                 src.data() + y * lineOf(srcDepth) + (x + 3) * bytesOf(srcDepth),
                                 bytesOf(srcDepth));
-                    const uint32 wanted = convertedByReference(pair, pixel);
+                    const uint32_t wanted = convertedByReference(pair, pixel);
                     std::memcpy(&expected[y * lineOf(dstDepth) + x * bytesOf(dstDepth)], &wanted,
                                 bytesOf(dstDepth));
                 }
             forEachTarget([&] {
-                std::fill(dst.data(), dst.end(), uint8{0x5A});
+                std::fill(dst.data(), dst.end(), uint8_t{0x5A});
                 convert(pair, 0,
                         {{dst.data(), nullptr, lineOf(dstDepth), 0, 0},
                          {src.data(), nullptr, lineOf(srcDepth), 3, 0}},
@@ -131,16 +131,16 @@ TEST(ConvertPixels, matchesReferenceOnLargeSurfaces) {
 
 // All there is in 16 bits, as a rectangle and one by one.
 TEST(ConvertPixels, every16BitPixel) {
-    constexpr uint32 kSide = 256;
-    std::vector<uint16> pixels(kSide * kSide);
-    std::iota(pixels.begin(), pixels.end(), uint16{0});
-    for (const int32 srcDepth : {15, 16})
-        for (const int32 dstDepth : kLayouts) {
+    constexpr uint32_t kSide = 256;
+    std::vector<uint16_t> pixels(kSide * kSide);
+    std::iota(pixels.begin(), pixels.end(), uint16_t{0});
+    for (const int32_t srcDepth : {15, 16})
+        for (const int32_t dstDepth : kLayouts) {
             const Pair pair = {srcDepth, dstDepth, false, nullptr};
-            const uint32 bytes = bytesOf(dstDepth), line = kSide * bytes;
-            std::vector<uint8> expected(size_t{kSide} * line), dst(expected.size());
-            for (uint32 pixel = 0; pixel <= 0xFFFF; ++pixel) {
-                const uint32 wanted = convertedByReference(pair, pixel);
+            const uint32_t bytes = bytesOf(dstDepth), line = kSide * bytes;
+            std::vector<uint8_t> expected(size_t{kSide} * line), dst(expected.size());
+            for (uint32_t pixel = 0; pixel <= 0xFFFF; ++pixel) {
+                const uint32_t wanted = convertedByReference(pair, pixel);
                 std::memcpy(&expected[size_t{pixel} * bytes], &wanted, bytes);
                 ASSERT_EQ(Raster_ConvertOnePixel(pixel, srcDepth, dstDepth, false, nullptr),
                           reference::convertedAlone(pixel, srcDepth, dstDepth));
@@ -148,7 +148,7 @@ TEST(ConvertPixels, every16BitPixel) {
             forEachTarget([&] {
                 convert(pair, 0,
                         {{dst.data(), nullptr, line, 0, 0},
-                         {reinterpret_cast<uint8 *>(pixels.data()), nullptr, 2 * kSide, 0, 0}},
+                         {reinterpret_cast<uint8_t *>(pixels.data()), nullptr, 2 * kSide, 0, 0}},
                         {kSide, kSide});
                 EXPECT_TRUE(dst == expected) << srcDepth << " to " << dstDepth;
             });
@@ -156,10 +156,10 @@ TEST(ConvertPixels, every16BitPixel) {
 }
 
 TEST(ConvertOnePixel, matchesReference) {
-    uint32 palette[300]; // an index is not cut to a byte
+    uint32_t palette[300]; // an index is not cut to a byte
     forEachCase(20000, [&](Random &random) {
-        const uint32 pixel = random.word(), index = random.below(300);
-        const int32 dst = kLayouts[random.below(7)], src = kSources[random.below(4)];
+        const uint32_t pixel = random.word(), index = random.below(300);
+        const int32_t dst = kLayouts[random.below(7)], src = kSources[random.below(4)];
         palette[index] = pixel;
         EXPECT_EQ(Raster_ConvertOnePixel(pixel, src, dst, false, nullptr),
                   reference::convertedAlone(pixel, src, dst));
@@ -167,16 +167,16 @@ TEST(ConvertOnePixel, matchesReference) {
                   reference::convertedAlone(pixel, 32, dst));
     });
     // And it is unsigned.
-    const uint32 entry = 0x12345678, index = 0xC0000001;
-    const auto *far = reinterpret_cast<const uint32 *>(reinterpret_cast<uintptr_t>(&entry) -
-                                                       uint64_t{index} * sizeof(uint32));
+    const uint32_t entry = 0x12345678, index = 0xC0000001;
+    const auto *far = reinterpret_cast<const uint32_t *>(reinterpret_cast<uintptr_t>(&entry) -
+                                                       uint64_t{index} * sizeof(uint32_t));
     EXPECT_EQ(Raster_ConvertOnePixel(index, 8, 32, true, far), entry);
 }
 
 TEST(IsModeReasonable, isTrueForNoOtherMode) {
-    int32 reasonable = 0;
-    for (int32 depth = -2; depth <= 40; ++depth)
-        for (int32 bits = -2; bits <= 40; ++bits)
+    int32_t reasonable = 0;
+    for (int32_t depth = -2; depth <= 40; ++depth)
+        for (int32_t bits = -2; bits <= 40; ++bits)
             reasonable += Raster_IsModeReasonable(depth, bits, false) ? depth * 100 + bits : 0;
     EXPECT_EQ(reasonable, 1516 + 1616 + 2424 + 2432);
     EXPECT_TRUE(Raster_IsModeReasonable(99, 8, true) && !Raster_IsModeReasonable(8, 16, true));
@@ -186,22 +186,22 @@ TEST(IsModeReasonable, isTrueForNoOtherMode) {
 // component over and over.
 TEST(MakeRGBParam, placesEveryComponent) {
     Random random(baseSeed());
-    for (uint32 bits = 1; bits <= 31; ++bits)
-        for (uint32 width = 1; (width + bits - 1) / bits * bits <= 31; ++width)
-            for (uint32 low = 0; low + width <= 32; ++low) {
-                const auto run = static_cast<uint32>(((uint64_t{1} << width) - 1) << low);
+    for (uint32_t bits = 1; bits <= 31; ++bits)
+        for (uint32_t width = 1; (width + bits - 1) / bits * bits <= 31; ++width)
+            for (uint32_t low = 0; low + width <= 32; ++low) {
+                const auto run = static_cast<uint32_t>(((uint64_t{1} << width) - 1) << low);
                 // Further bits, not next to the run, are no part of the channel.
-                const uint32 above = ~static_cast<uint32>((uint64_t{2} << (low + width)) - 1);
-                const uint32 mask = run | (random.word() & above);
+                const uint32_t above = ~static_cast<uint32_t>((uint64_t{2} << (low + width)) - 1);
+                const uint32_t mask = run | (random.word() & above);
                 RasterRGBParam param = {};
-                RasterRGB_MakeRGBParam(&param, static_cast<int32>(bits), mask);
+                RasterRGB_MakeRGBParam(&param, static_cast<int32_t>(bits), mask);
                 ASSERT_EQ(param.mask, mask);
                 ASSERT_LT(param.shift, 32u);
                 ASSERT_TRUE(param.shift == 0 || param.multiplier % 2 == 1) << "not least";
-                const uint32 most = (1u << bits) - 1;
-                for (const uint32 component : {1u, most, 1u << (bits - 1), random.word() & most}) {
-                    uint32 expected = 0;
-                    for (uint32 i = 0; i < width; ++i)
+                const uint32_t most = (1u << bits) - 1;
+                for (const uint32_t component : {1u, most, 1u << (bits - 1), random.word() & most}) {
+                    uint32_t expected = 0;
+                    for (uint32_t i = 0; i < width; ++i)
                         expected |= (component >> (bits - 1 - i % bits) & 1)
                                     << (low + width - 1 - i);
                     ASSERT_EQ(((component * param.multiplier) >> param.shift) & run, expected)
@@ -215,7 +215,7 @@ TEST(MakeRGBParam, placesEveryComponent) {
 TEST(Conversions, refuseUnknownDepths) {
     const FencedBuffer fence(1);
     const Surface nowhere = {fence.end(), fence.end(), 4, 0, 0};
-    const uint32 palette[] = {0};
+    const uint32_t palette[] = {0};
     const auto refuses = [&](const std::string &text, const auto &call) {
         if (text.empty())
             return call();
@@ -223,7 +223,7 @@ TEST(Conversions, refuseUnknownDepths) {
         EXPECT_EQ(warnings, std::vector<std::string>{"Raster convert " + text + '\n'});
     };
     const struct {
-        int32 src, dst;
+        int32_t src, dst;
         bool isPseudo;
         std::string alone, rectangle;
     } cases[] = {
@@ -241,8 +241,8 @@ TEST(Conversions, refuseUnknownDepths) {
     };
     for (const auto &c : cases) {
         refuses(c.alone, [&] { Raster_ConvertOnePixel(0, c.src, c.dst, c.isPseudo, palette); });
-        for (const uint32 way : {0u, 1u})
-            for (const uint32 side : {0u, 1u})
+        for (const uint32_t way : {0u, 1u})
+            for (const uint32_t side : {0u, 1u})
                 refuses(c.rectangle, [&] {
                     convert({c.src, c.dst, c.isPseudo, palette}, way, {nowhere, nowhere},
                             {side, side});

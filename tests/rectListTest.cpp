@@ -1,5 +1,5 @@
 // Rectangle lists, held to a bitmap.
-#include "raster.h"
+#include <quillon/raster.h>
 
 #include "support/messages.h"
 #include "support/random.h"
@@ -20,8 +20,8 @@ namespace {
 
 using Entry = RasterRectListEntry;
 
-constexpr int32 kMin = std::numeric_limits<int32>::min();
-constexpr int32 kMax = std::numeric_limits<int32>::max();
+constexpr int32_t kMin = std::numeric_limits<int32_t>::min();
+constexpr int32_t kMax = std::numeric_limits<int32_t>::max();
 
 RasterRectList listOf(const std::vector<Entry> &entries) {
     RasterRectList list = {};
@@ -35,18 +35,18 @@ std::vector<Entry> used(const RasterRectList &list) {
     return {std::begin(list.entries), end};
 }
 
-uint32 add(RasterRectList &list, const Entry &e) {
+uint32_t add(RasterRectList &list, const Entry &e) {
     return Raster_AddRect(&list, e.x, e.y, e.width, e.height);
 }
 
-uint32 subtract(RasterRectList &list, const Entry &e) {
+uint32_t subtract(RasterRectList &list, const Entry &e) {
     return Raster_SubRect(&list, e.x, e.y, e.width, e.height);
 }
 
-uint32 areaOf(const std::vector<Entry> &entries) {
-    uint32 area = 0;
+uint32_t areaOf(const std::vector<Entry> &entries) {
+    uint32_t area = 0;
     for (const Entry &e : entries)
-        area += uint32(e.width) * uint32(e.height);
+        area += uint32_t(e.width) * uint32_t(e.height);
     return area;
 }
 
@@ -83,7 +83,7 @@ struct Bitmap {
     }
 };
 
-uint32 model(RasterRectList &list, const Entry &rect, bool isAdding) {
+uint32_t model(RasterRectList &list, const Entry &rect, bool isAdding) {
     const bool isEmpty = list.entries[0].width < 1 || list.entries[0].height < 1;
     if (rect.width == 0 || rect.height == 0 || (isEmpty && !isAdding))
         return 0;
@@ -113,8 +113,8 @@ uint32 model(RasterRectList &list, const Entry &rect, bool isAdding) {
 // --- Random lists of cells
 
 Entry randomRect(Random &random) {
-    const int32 largest = random.oneOf({3, 6, kCells});
-    const int32 width = random.between(1, largest), height = random.between(1, largest);
+    const int32_t largest = random.oneOf({3, 6, kCells});
+    const int32_t width = random.between(1, largest), height = random.between(1, largest);
     return {random.between(0, kCells - width), random.between(0, kCells - height), width, height};
 }
 
@@ -123,8 +123,8 @@ Entry randomRect(Random &random) {
 RasterRectList randomList(Random &random) {
     RasterRectList list;
     random.fill(&list, sizeof(list));
-    const uint32 count = 1 + random.below(16);
-    for (uint32 i = 0; i < count; ++i) {
+    const uint32_t count = 1 + random.below(16);
+    for (uint32_t i = 0; i < count; ++i) {
         list.entries[i] = randomRect(random);
         if (random.oneIn(16))
             list.entries[i].height = 0;
@@ -139,7 +139,7 @@ void disturb(Random &random, RasterRectList &list) {
     const size_t count = used(list).size();
     if (count == 0)
         return;
-    Entry &entry = list.entries[random.below(uint32(count))], moved = entry;
+    Entry &entry = list.entries[random.below(uint32_t(count))], moved = entry;
     moved.*random.oneOf({&Entry::x, &Entry::y, &Entry::width, &Entry::height}) +=
         random.oneOf({-1, 1});
     if (moved.width > 0 && std::min({moved.x, moved.y, moved.height}) >= 0 &&
@@ -153,12 +153,12 @@ struct Placement {
     explicit Placement(Random &random) {
         for (const int axis : {0, 1}) {
             size[axis] = random.oneOf({1, 1, 3, 1000, kMax / kCells});
-            origin[axis] = random.oneOf({0, -7, kMin, int32(kMax - int64_t{size[axis]} * kCells)});
+            origin[axis] = random.oneOf({0, -7, kMin, int32_t(kMax - int64_t{size[axis]} * kCells)});
         }
     }
     Entry operator()(const Entry &e) const {
-        const auto place = [&](int axis, int32 cells, int32 start) {
-            return int32(uint32(start) + uint32(cells) * uint32(size[axis]));
+        const auto place = [&](int axis, int32_t cells, int32_t start) {
+            return int32_t(uint32_t(start) + uint32_t(cells) * uint32_t(size[axis]));
         };
         return {place(0, e.x, origin[0]), place(1, e.y, origin[1]), place(0, e.width, 0),
                 place(1, e.height, 0)};
@@ -168,7 +168,7 @@ struct Placement {
         std::transform(list.entries, list.entries + used(list).size(), list.entries, *this);
         return list;
     }
-    int32 size[2], origin[2];
+    int32_t size[2], origin[2];
 };
 
 TEST(RectList, agreesWithABitmap) {
@@ -186,10 +186,10 @@ TEST(RectList, agreesWithABitmap) {
                 (random.oneIn(2) ? rect.width : rect.height) = isAdding ? 0 : random.between(-1, 0);
             }
             RasterRectList list = placement(cells);
-            const uint32 expected = model(cells, rect, isAdding);
+            const uint32_t expected = model(cells, rect, isAdding);
             const Entry placed = placement(rect);
             EXPECT_EQ(isAdding ? add(list, placed) : subtract(list, placed),
-                      expected * uint32(placement.size[0]) * uint32(placement.size[1]));
+                      expected * uint32_t(placement.size[0]) * uint32_t(placement.size[1]));
             EXPECT_EQ(list, placement(cells));
         }
     });
@@ -207,8 +207,8 @@ TEST(RectList, refusesWhatHasNoSize) {
         const RasterRectList before = list;
         EXPECT_EQ(add(list, turned({-1, 0, 100, 1})), 0u);
         // Whose edge wraps covers nothing.
-        EXPECT_EQ(add(list, turned({kMax - 5, 0, 10, 10})), uint32(kMax));
-        EXPECT_EQ(subtract(list, turned({kMax - 5, 0, 10, 10})), uint32(kMax));
+        EXPECT_EQ(add(list, turned({kMax - 5, 0, 10, 10})), uint32_t(kMax));
+        EXPECT_EQ(subtract(list, turned({kMax - 5, 0, 10, 10})), uint32_t(kMax));
         for (const Entry &e : {Entry{0, 0, -1, 5}, Entry{0, 0, 5, kMin}, Entry{0, 0, -1, -1}})
             expectPanic(
                 "VERIFY lib/raster/rasterRect", [&] { add(list, turned(e)); }, " bugNr=15740");
@@ -226,7 +226,7 @@ TEST(RectList, survivesAnyNumbers) {
                                  random.between(kMin, kMax)});
         };
         RasterRectList list = {};
-        for (uint32 i = 0, count = random.below(17); i < count; ++i)
+        for (uint32_t i = 0, count = random.below(17); i < count; ++i)
             list.entries[i] = {number(), number(), random.between(1, kMax), number()};
         const Entry rect = {number(), number(), random.between(0, kMax), random.between(0, kMax)};
         const Entry nothing = {0, 0, -1, -1};

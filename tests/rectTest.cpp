@@ -1,6 +1,6 @@
 // Rectangle geometry at small coordinates and at the limits, against integers
 // wide enough for every result.
-#include "rect.h"
+#include <quillon/rect.h>
 
 #include "support/random.h"
 
@@ -19,8 +19,8 @@ namespace {
 
 using Wide = __int128;
 
-constexpr int32 kMin = std::numeric_limits<int32>::min();
-constexpr int32 kMax = std::numeric_limits<int32>::max();
+constexpr int32_t kMin = std::numeric_limits<int32_t>::min();
+constexpr int32_t kMax = std::numeric_limits<int32_t>::max();
 
 Rect randomRect(Random &random) {
     const bool isSmall = random.oneIn(2);
@@ -41,7 +41,7 @@ bool isEmpty(const Rect &rect) {
 }
 
 Wide wrapped(Wide value) {
-    return static_cast<int32>(static_cast<uint32>(value));
+    return static_cast<int32_t>(static_cast<uint32_t>(value));
 }
 
 // --- The model: the same for both axes
@@ -62,7 +62,7 @@ Result modelled(const Model &model, const Rects &...rects) {
     const Axis x = model(Axis{rects.left, rects.right}...);
     const Axis y = model(Axis{rects.top, rects.bottom}...);
     const auto kept = [](Wide value) {
-        return static_cast<int32>(std::clamp<Wide>(value, kMin, kMax));
+        return static_cast<int32_t>(std::clamp<Wide>(value, kMin, kMax));
     };
     const Rect rect = {kept(x.low), kept(y.low), kept(x.high), kept(y.high)};
     return {rect, rect.left == x.low && rect.top == y.low && rect.right == x.high &&
@@ -121,7 +121,7 @@ TEST(Rect, knowsWhereAPointLies) {
         EXPECT_EQ(Rect_ContainsPoint(&rect, &point), isWithin(0));
         if (std::min(point.x, point.y) == kMin || std::min(rect.right, rect.bottom) <= kMin + 1)
             return; // what has no negation is below
-        const int32 distance = Rect_PointDistance(&rect, &point);
+        const int32_t distance = Rect_PointDistance(&rect, &point);
         EXPECT_TRUE(isWithin(distance) || distance == kMax);
         EXPECT_TRUE(!isWithin(Wide{distance} - 1) || distance == kMin);
     });

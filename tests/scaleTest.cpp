@@ -2,8 +2,8 @@
 // values that a caller can rely on.
 
 #include "reference/scale.h"
-#include "hearth.h"
-#include "raster.h"
+#include <hearth/hearth.h>
+#include <quillon/raster.h>
 #include "support/fence.h"
 #include "support/random.h"
 #include "support/targets.h"
@@ -33,8 +33,8 @@ constexpr double kNan = std::numeric_limits<double>::quiet_NaN();
 
 // How rows lie in memory: any increment, also 0, negative, or less than a row.
 struct Rows {
-    uint32 width, height;
-    int32 increment;
+    uint32_t width, height;
+    int32_t increment;
 
     size_t toLast() const { return static_cast<size_t>(std::abs(increment)) * (height - 1); }
     size_t bytes() const { return toLast() + size_t{4} * width; }
@@ -44,18 +44,18 @@ struct Rows {
 
 struct ScaleCase {
     Rows src, dst; // dst: of the rectangle alone
-    int32 left, top;
+    int32_t left, top;
     double scaleX, scaleY;
-    uint32 filter;
+    uint32_t filter;
 };
 
-uint32 run(const ScaleCase &c, uint8 *dst, const uint8 *src, decltype(Raster_Scale) scale) {
+uint32_t run(const ScaleCase &c, uint8_t *dst, const uint8_t *src, decltype(Raster_Scale) scale) {
     // Pixel (0, 0) may be an address outside of memory.
     const int64_t offset = int64_t{c.dst.increment} * c.top + int64_t{4} * c.left;
-    auto *origin = reinterpret_cast<uint8 *>(reinterpret_cast<uintptr_t>(dst + c.dst.first()) -
+    auto *origin = reinterpret_cast<uint8_t *>(reinterpret_cast<uintptr_t>(dst + c.dst.first()) -
                                              static_cast<uintptr_t>(offset));
     return scale(origin, c.dst.increment, 32767, 32767, c.left, c.top,
-                 c.left + static_cast<int32>(c.dst.width), c.top + static_cast<int32>(c.dst.height),
+                 c.left + static_cast<int32_t>(c.dst.width), c.top + static_cast<int32_t>(c.dst.height),
                  src + c.src.first(), c.src.increment, c.src.width, c.src.height, c.scaleX,
                  c.scaleY, c.filter);
 }
@@ -68,8 +68,8 @@ void expectAsStated(const ScaleCase &c, Random &random) {
     random.fill(src.data(), src.size());
     random.fill(dst.data(), dst.size());
     if (random.oneIn(4)) // all the same, and as bright as can be
-        std::fill(src.data(), src.end(), uint8{255});
-    std::vector<uint8> expected(dst.data(), dst.end());
+        std::fill(src.data(), src.end(), uint8_t{255});
+    std::vector<uint8_t> expected(dst.data(), dst.end());
     run(c, expected.data(), src.data(), reference::scale);
     EXPECT_EQ(run(c, dst.data(), src.data(), Raster_Scale), 1u);
     EXPECT_TRUE(std::equal(dst.data(), dst.end(), expected.begin()))
@@ -97,21 +97,21 @@ double drawScale(Random &random) {
     }
 }
 
-Rows drawRows(Random &random, uint32 width, uint32 height) {
-    const int32 row = static_cast<int32>(4 * width);
-    const int32 increment =
+Rows drawRows(Random &random, uint32_t width, uint32_t height) {
+    const int32_t row = static_cast<int32_t>(4 * width);
+    const int32_t increment =
         random.oneOf({row, row, row + 4, row + random.between(0, 99), random.between(0, row)});
     return {width, height, random.oneIn(4) ? -increment : increment};
 }
 
 // Where the rectangle starts: mostly near the source, else anywhere, so that
 // positions pass every limit.
-int32 drawCorner(Random &random, double scale, uint32 srcSize) {
+int32_t drawCorner(Random &random, double scale, uint32_t srcSize) {
     if (random.oneIn(3))
         return 0;
     if (random.oneIn(6))
         return random.between(-100, 32767);
-    return random.between(0, static_cast<int32>(std::fmin(srcSize * scale, 32700)));
+    return random.between(0, static_cast<int32_t>(std::fmin(srcSize * scale, 32700)));
 }
 
 TEST(Scale, equalsItsStatement) {
@@ -131,12 +131,12 @@ TEST(Scale, equalsItsStatement) {
         Random random(baseSeed());
         // Vertical positions that wrap in the midst of a span, from the last
         // row, which the cache must still hold, to the first.
-        for (const uint32 height : {21u, 22u, 23u, 43u})
+        for (const uint32_t height : {21u, 22u, 23u, 43u})
             expectAsStated({{5, height, 20}, {5, 3, 20}, 0, 1637, 1, 0.05, 2}, random);
         // The whole of a source that is as wide as can be.
         for (const double scale : {std::nextafter(kMinScale, 1), 0.5, 1.0 / 3000, 1.0 / 257, 1.0})
-            for (const uint32 width : {1u, 40u, 32767u})
-                for (const uint32 filter : {0u, 2u})
+            for (const uint32_t width : {1u, 40u, 32767u})
+                for (const uint32_t filter : {0u, 2u})
                     expectAsStated(
                         {{32767, 2, 4 * 32767}, {width, 2, 4 * 32767}, 0, 0, scale, scale, filter},
                         random);
@@ -148,10 +148,10 @@ TEST(Scale, largeSurfacesEqualTheirStatement) {
     forEachTarget([] {
         Random random(baseSeed());
         for (const double scale : {3.0, 0.9, 0.5, 0.3, 0.25, 0.125, 0.0625})
-            for (const uint32 filter : {0u, 2u}) {
-                const auto srcWidth = static_cast<uint32>(1200 / scale) - 1;
-                const int32 increment = 4 * 1200 + random.oneOf({0, 4, 13, 64});
-                expectAsStated({{srcWidth, 20, static_cast<int32>(4 * srcWidth)},
+            for (const uint32_t filter : {0u, 2u}) {
+                const auto srcWidth = static_cast<uint32_t>(1200 / scale) - 1;
+                const int32_t increment = 4 * 1200 + random.oneOf({0, 4, 13, 64});
+                expectAsStated({{srcWidth, 20, static_cast<int32_t>(4 * srcWidth)},
                                 {1200, 340, increment},
                                 random.oneIn(4) ? 7 : 0,
                                 0,
@@ -166,10 +166,10 @@ TEST(Scale, largeSurfacesEqualTheirStatement) {
 // Sizes are looked at first, then factors, then what is empty.
 TEST(Scale, refusals) {
     struct {
-        uint32 dstWidth, dstHeight, srcWidth, srcHeight;
+        uint32_t dstWidth, dstHeight, srcWidth, srcHeight;
         double scaleX, scaleY;
-        int32 right;
-        uint32 result;
+        int32_t right;
+        uint32_t result;
         bool isWritten;
     } const cases[] = {
         {32768, 4, 4, 4, 1, 1, 4, 0, false},
@@ -185,7 +185,7 @@ TEST(Scale, refusals) {
         {4, 4, 4, 4, kNan, 1, 4, 0, false},
     };
     for (const auto &c : cases) {
-        uint8 src[64] = {1}, dst[64] = {};
+        uint8_t src[64] = {1}, dst[64] = {};
         EXPECT_EQ(Raster_Scale(dst, 16, c.dstWidth, c.dstHeight, 0, 0, c.right, 4, src, 16,
                                c.srcWidth, c.srcHeight, c.scaleX, c.scaleY, 0),
                   c.result)
@@ -198,9 +198,9 @@ TEST(Scale, refusals) {
 TEST(Scale, withoutMemory) {
     memoryIsOut = true;
     for (const double scaleY : {0.5, 1.0, 2.0})
-        for (const uint32 filter : {0u, 2u}) {
+        for (const uint32_t filter : {0u, 2u}) {
             const bool isMixed = filter != 0 && scaleY != 1;
-            uint8 src[64] = {1}, dst[64] = {};
+            uint8_t src[64] = {1}, dst[64] = {};
             EXPECT_EQ(Raster_Scale(dst, 16, 4, 4, 0, 0, 4, 4, src, 16, 4, 4, 2, scaleY, filter),
                       isMixed ? 0u : 1u);
             EXPECT_EQ(dst[0], isMixed ? 0 : 1);
@@ -208,22 +208,22 @@ TEST(Scale, withoutMemory) {
     memoryIsOut = false;
 }
 
-std::vector<int32> mapped(Rect rect, uint32 width, uint32 height, double scaleX, double scaleY) {
+std::vector<int32_t> mapped(Rect rect, uint32_t width, uint32_t height, double scaleX, double scaleY) {
     Raster_ScaleSrcCoordinates(&rect, width, height, scaleX, scaleY);
     return {rect.left, rect.top, rect.right, rect.bottom};
 }
 
 // One axis in a processor's own 80 bits.
-std::pair<int32, int32> modelRange(int32 first, int32 end, uint32 size, long double scale) {
+std::pair<int32_t, int32_t> modelRange(int32_t first, int32_t end, uint32_t size, long double scale) {
     const long double margin = std::max(scale, 1.0L), low = first * scale - margin;
-    const auto most = static_cast<uint32>(static_cast<int64_t>(size * scale));
+    const auto most = static_cast<uint32_t>(static_cast<int64_t>(size * scale));
     const double high = std::ceil(static_cast<double>(end * scale + margin));
-    return {low < 0 ? 0 : static_cast<int32>(static_cast<int64_t>(low)),
-            static_cast<int32>(high > most ? most : static_cast<int64_t>(high))};
+    return {low < 0 ? 0 : static_cast<int32_t>(static_cast<int64_t>(low)),
+            static_cast<int32_t>(high > most ? most : static_cast<int64_t>(high))};
 }
 
 TEST(ScaleSrcCoordinates, equalsItsModel) {
-    using Fields = std::vector<int32>;
+    using Fields = std::vector<int32_t>;
     // Factors that are no numbers leave the rectangle alone; huge ones are cut at
     // the scaled image, whose size wraps.
     EXPECT_EQ(mapped({10, 11, 20, 21}, 100, 50, kNan, 1), (Fields{10, 11, 20, 21}));
@@ -233,11 +233,11 @@ TEST(ScaleSrcCoordinates, equalsItsModel) {
         GTEST_SKIP() << "the model needs a 64-bit significand";
     forEachCase(100000, [](Random &random) {
         const auto coordinate = [&] {
-            return random.oneIn(3) ? static_cast<int32>(random.word()) >> random.below(31)
+            return random.oneIn(3) ? static_cast<int32_t>(random.word()) >> random.below(31)
                                    : random.between(-20, 2000);
         };
         const Rect old{coordinate(), coordinate(), coordinate(), coordinate()};
-        const uint32 width = random.below(3000), height = random.below(3000);
+        const uint32_t width = random.below(3000), height = random.below(3000);
         // Also negative; but no coordinate leaves 64 bits.
         const double scaleX = drawScale(random) * random.oneOf({1, 1, 1, -1});
         const double scaleY = drawScale(random);

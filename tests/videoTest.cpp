@@ -1,20 +1,20 @@
 // YUV frames and the colour key against their reference.
 
 #include "reference/video.h"
-#include "raster.h"
-#include "raster/videoAttributes.h"
+#include <quillon/raster.h>
+#include "video/frameLayout.h"
 #include "support/messages.h"
 #include "support/surfaces.h"
 
 namespace quillon::test {
 namespace {
 
-constexpr uint32 kFormats[] = {RASTER_VIDEO_YUY2, RASTER_VIDEO_UYVY, RASTER_VIDEO_YV12};
-constexpr int32 kDepths[] = {15, 16, 24, 32};
+constexpr uint32_t kFormats[] = {RASTER_VIDEO_YUY2, RASTER_VIDEO_UYVY, RASTER_VIDEO_YV12};
+constexpr int32_t kDepths[] = {15, 16, 24, 32};
 
 // A frame of random samples between fences that the frame and the output each
 // touch with a random end.
-void expectConverted(Random &random, uint32 width, uint32 height, uint32 format, int32 bppdepth) {
+void expectConverted(Random &random, uint32_t width, uint32_t height, uint32_t format, int32_t bppdepth) {
     const auto fenced = [&](size_t size) {
         return FencedBuffer(size, random.oneIn(2) ? FencedBuffer::Flush::kBefore
                                                   : FencedBuffer::Flush::kBehind);
@@ -25,7 +25,7 @@ void expectConverted(Random &random, uint32 width, uint32 height, uint32 format,
     const FencedBuffer dst = fenced(size_t{width} * height * static_cast<size_t>(bppdepth + 1) / 8);
     random.fill(src.data(), src.size());
     random.fill(dst.data(), dst.size());
-    std::vector<uint8> expected(dst.data(), dst.end());
+    std::vector<uint8_t> expected(dst.data(), dst.end());
     Raster_YUVtoRGB(src.data(), dst.data(), width, height, format, bppdepth);
     reference::yuvToRgb(src.data(), expected.data(), width, height, format, bppdepth);
     EXPECT_TRUE(std::equal(dst.data(), dst.end(), expected.begin()))
@@ -36,10 +36,10 @@ void expectConverted(Random &random, uint32 width, uint32 height, uint32 format,
 TEST(YuvToRgb, matchesReference) {
     forEachTarget([&] {
         forEachCase(100, [&](Random &random) {
-            const uint32 width = random.below(random.oneIn(8) ? 400 : 71);
-            for (const uint32 height : {0u, 1u, 2u, 3u, 4u, random.below(40)})
-                for (const uint32 format : kFormats)
-                    for (const int32 depth : kDepths)
+            const uint32_t width = random.below(random.oneIn(8) ? 400 : 71);
+            for (const uint32_t height : {0u, 1u, 2u, 3u, 4u, random.below(40)})
+                for (const uint32_t format : kFormats)
+                    for (const int32_t depth : kDepths)
                         expectConverted(random, width, height, format, depth);
         });
     });
@@ -50,10 +50,10 @@ TEST(YuvToRgb, matchesReference) {
 TEST(YuvToRgb, largeFramesMatchReference) {
     forEachTarget([&] {
         forEachCase(2, [&](Random &random) {
-            const uint32 width = running.number == 0 ? 1088 : 1030;
-            for (const int32 depth : kDepths) {
-                const uint32 rowBytes = width * (static_cast<uint32>(depth + 1) / 8);
-                for (const uint32 format : kFormats)
+            const uint32_t width = running.number == 0 ? 1088 : 1030;
+            for (const int32_t depth : kDepths) {
+                const uint32_t rowBytes = width * (static_cast<uint32_t>(depth + 1) / 8);
+                for (const uint32_t format : kFormats)
                     expectConverted(random, width, 1600000 / rowBytes & ~1u, format, depth);
             }
         });
@@ -62,29 +62,29 @@ TEST(YuvToRgb, largeFramesMatchReference) {
 
 // Every luma with every pair of chroma, as runs of one chromaLow.
 TEST(YuvToRgb, everyTriple) {
-    constexpr uint32 kSide = 256; // luma, chromaHigh
-    std::vector<uint8> src(2 * kSide * kSide);
-    for (uint32 chromaLow = 0; chromaLow < 256; ++chromaLow) {
+    constexpr uint32_t kSide = 256; // luma, chromaHigh
+    std::vector<uint8_t> src(2 * kSide * kSide);
+    for (uint32_t chromaLow = 0; chromaLow < 256; ++chromaLow) {
         for (size_t i = 0; i < src.size(); i += 2) {
-            src[i] = static_cast<uint8>(i / 2 % kSide);
-            src[i + 1] = static_cast<uint8>(i % 4 == 0 ? chromaLow : i / 2 / kSide);
+            src[i] = static_cast<uint8_t>(i / 2 % kSide);
+            src[i + 1] = static_cast<uint8_t>(i % 4 == 0 ? chromaLow : i / 2 / kSide);
         }
         const auto converted = [&](auto function) {
-            std::vector<uint8> dst(4 * kSide * kSide);
+            std::vector<uint8_t> dst(4 * kSide * kSide);
             function(src.data(), dst.data(), kSide, kSide, RASTER_VIDEO_YUY2, 32);
             return dst;
         };
-        const std::vector<uint8> expected = converted(reference::yuvToRgb);
+        const std::vector<uint8_t> expected = converted(reference::yuvToRgb);
         forEachTarget([&] { ASSERT_TRUE(converted(Raster_YUVtoRGB) == expected) << chromaLow; });
     }
 }
 
 TEST(YuvToRgb, touchesNothingWhereThereIsNothingToDo) {
     const FencedBuffer fence(1);
-    const std::pair<uint32, uint32> sizes[] = {{0, UINT32_MAX}, {UINT32_MAX, 0}, {1, 1}};
+    const std::pair<uint32_t, uint32_t> sizes[] = {{0, UINT32_MAX}, {UINT32_MAX, 0}, {1, 1}};
     for (const auto &[width, height] : sizes)
-        for (const int32 depth : kDepths)
-            for (const uint32 format : kFormats)
+        for (const int32_t depth : kDepths)
+            for (const uint32_t format : kFormats)
                 Raster_YUVtoRGB(fence.end(), fence.end(), width, height, format, depth);
     Raster_YUVtoRGB(fence.end(), fence.end(), UINT32_MAX, 1, RASTER_VIDEO_YV12, 32);
     Raster_YUVtoRGB(fence.end(), fence.end(), 1, UINT32_MAX, RASTER_VIDEO_YV12, 32);
@@ -92,10 +92,10 @@ TEST(YuvToRgb, touchesNothingWhereThereIsNothingToDo) {
 
 TEST(YuvToBgrx, matchesReference) {
     forEachCase(300000, [](Random &random) {
-        // Samples, samples out of range, and any int32 at all.
+        // Samples, samples out of range, and any int32_t at all.
         const auto [low, high] =
-            random.oneOf<std::pair<int32, int32>>({{0, 255}, {-300, 600}, {INT32_MIN, INT32_MAX}});
-        const int32 y = random.between(low, high), u = random.between(low, high),
+            random.oneOf<std::pair<int32_t, int32_t>>({{0, 255}, {-300, 600}, {INT32_MIN, INT32_MAX}});
+        const int32_t y = random.between(low, high), u = random.between(low, high),
                     v = random.between(low, high);
         EXPECT_EQ(RasterRGB_YUVtoBGRX(y, u, v), reference::yuvToBgrx(y, u, v))
             << y << ", " << u << ", " << v;
@@ -107,7 +107,7 @@ TEST(YuvToBgrx, matchesReference) {
 TEST(VideoAttributes, geometry) {
     using Numbers = std::vector<size_t>;
     size_t size = 1, pitches[] = {2, 3, 4}, offsets[] = {5, 6, 7};
-    const auto geometry = [&](uint32 format, uint32 width, uint32 height) {
+    const auto geometry = [&](uint32_t format, uint32_t width, uint32_t height) {
         EXPECT_TRUE(RasterComputeVideoAttributes(format, width, height, &size, pitches, offsets));
         return Numbers{size,       pitches[0], pitches[1], pitches[2],
                        offsets[0], offsets[1], offsets[2]};
@@ -124,11 +124,11 @@ TEST(VideoAttributes, geometry) {
 TEST(VideoMessages, comeOnce) {
     const FencedBuffer fence(1);
     size_t size = 1;
-    for (const uint32 format : {0xFFFFFFFEu, 0u}) {
+    for (const uint32_t format : {0xFFFFFFFEu, 0u}) {
         EXPECT_FALSE(RasterComputeVideoAttributes(format, 5, 3, &size, nullptr, nullptr));
         EXPECT_EQ(size, 0u);
     }
-    for (const auto &[format, depth] : std::initializer_list<std::pair<uint32, int32>>{
+    for (const auto &[format, depth] : std::initializer_list<std::pair<uint32_t, int32_t>>{
              {UINT32_MAX, -8}, {RASTER_VIDEO_YUY2, 8}, {UINT32_MAX, 32}, {0, 16}, {0, 0}})
         Raster_YUVtoRGB(fence.end(), fence.end(), 8, 8, format, depth);
     EXPECT_EQ(logs, (std::vector<std::string>{
@@ -144,15 +144,15 @@ TEST(ApplyColorKey, matchesReference) {
     holdToReference(16000, [](Random &random) {
         // The fewer values there are, the more pixels match.  Now and then the
         // key has more bits than a pixel.
-        const uint32 limit = random.oneOf({1u, 2u, 2u, 3u, 256u});
-        const uint32 depth = random.oneOf({32u, 16u, 8u, 24u, 15u, 0u, UINT32_MAX});
-        const uint32 bytes = depth == 32 ? 4 : depth == 16 ? 2 : 1;
-        uint32 key = 0;
-        for (uint32 i = 0; i < std::min(bytes, 3u); ++i)
+        const uint32_t limit = random.oneOf({1u, 2u, 2u, 3u, 256u});
+        const uint32_t depth = random.oneOf({32u, 16u, 8u, 24u, 15u, 0u, UINT32_MAX});
+        const uint32_t bytes = depth == 32 ? 4 : depth == 16 ? 2 : 1;
+        uint32_t key = 0;
+        for (uint32_t i = 0; i < std::min(bytes, 3u); ++i)
             key |= random.below(limit) << (8 * i);
         if (bytes == 4 || random.oneIn(8))
             key |= random.word() << (8 * std::min(bytes, 3u));
-        const uint32 compared = depth == 32 ? 0x00FFFFFF : 0xFFFFFFFF;
+        const uint32_t compared = depth == 32 ? 0x00FFFFFF : 0xFFFFFFFF;
         return Operation{.name = "key of depth " + std::to_string(depth),
                          .parts = {{4}, {4}, {4}, {.bytes = bytes, .low = 0, .count = limit}},
                          .library =

@@ -2,14 +2,14 @@
 // there a pixel.
 #include "operations.h"
 
-#include "raster.h"
+#include <quillon/raster.h>
 
 namespace quillon::bench {
 namespace {
 
 void addOpaque(Plan &plan, const Area &area, const std::string &name, const Content &content,
-               uint32 bits) {
-    const auto bytes = static_cast<int32>(bits / 8);
+               uint32_t bits) {
+    const auto bytes = static_cast<int32_t>(bits / 8);
     plan.push_back({"bits " + name + " to " + std::to_string(bits),
                     "bits",
                     area,
@@ -18,15 +18,15 @@ void addOpaque(Plan &plan, const Area &area, const std::string &name, const Cont
                     {{"quillon", Agreement::Exact, [=](const Job &job) -> Work {
                           return [=, dst = job.dst, src = job.src()] {
                               Raster_BitsToPixels(src.data, src.line(), dst.data, dst.line(), bytes,
-                                                  static_cast<int32>(dst.width), dst.height,
+                                                  static_cast<int32_t>(dst.width), dst.height,
                                                   kForeground, kBackground);
                           };
                       }}}});
 }
 
 void addStencil(Plan &plan, const Area &area, const std::string &name, const Content &content,
-                uint32 bits) {
-    const auto bytes = static_cast<int32>(bits / 8);
+                uint32_t bits) {
+    const auto bytes = static_cast<int32_t>(bits / 8);
     plan.push_back({"stencil " + name + " to " + std::to_string(bits),
                     "stencil",
                     area,
@@ -35,7 +35,7 @@ void addStencil(Plan &plan, const Area &area, const std::string &name, const Con
                     {{"quillon", Agreement::Exact, [=](const Job &job) -> Work {
                           return [=, dst = job.dst, src = job.src()] {
                               Raster_BitsToPixelsStencil(src.data, src.line(), dst.data, dst.line(),
-                                                         bytes, static_cast<int32>(dst.width),
+                                                         bytes, static_cast<int32_t>(dst.width),
                                                          dst.height, kForeground);
                           };
                       }}}});
@@ -44,7 +44,7 @@ void addStencil(Plan &plan, const Area &area, const std::string &name, const Con
 } // namespace
 
 void addBits(Plan &plan, const Area &area) {
-    for (const uint32 bits : {8, 16, 24, 32}) {
+    for (const uint32_t bits : {8, 16, 24, 32}) {
         addOpaque(plan, area, "noise", noise, bits);
         addStencil(plan, area, "text", textBits, bits);
         addStencil(plan, area, "noise", noise, bits);

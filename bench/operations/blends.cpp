@@ -1,7 +1,7 @@
 // Raster_AlphaBlendOver, over noise and over what windows are made of.
 #include "operations.h"
 
-#include "raster.h"
+#include <quillon/raster.h>
 
 namespace quillon::bench {
 namespace {

@@ -2,16 +2,16 @@
 #include "operations.h"
 
 #include "names.h"
-#include "raster.h"
+#include <quillon/raster.h>
 
 namespace quillon::bench {
 namespace {
 
-uint32 bitsOf(int32 depth) {
-    return depth <= 8 ? 8 : depth == 15 ? 16 : static_cast<uint32>(depth);
+uint32_t bitsOf(int32_t depth) {
+    return depth <= 8 ? 8 : depth == 15 ? 16 : static_cast<uint32_t>(depth);
 }
 
-std::string familyOf(int32 srcDepth, int32 dstDepth) {
+std::string familyOf(int32_t srcDepth, int32_t dstDepth) {
     if (srcDepth == kIndex)
         return dstDepth <= 8 ? "index to small" : dstDepth == 24 ? "index to 24" : "index";
     if (dstDepth <= 8)
@@ -20,7 +20,7 @@ std::string familyOf(int32 srcDepth, int32 dstDepth) {
     return within24And32 ? "convert 24 and 32" : "convert";
 }
 
-void addConversion(Plan &plan, const Area &area, int32 srcDepth, int32 dstDepth) {
+void addConversion(Plan &plan, const Area &area, int32_t srcDepth, int32_t dstDepth) {
     const bool indexed = srcDepth == kIndex;
     plan.push_back({conversionName(srcDepth, dstDepth),
                     familyOf(srcDepth, dstDepth),
@@ -30,8 +30,8 @@ void addConversion(Plan &plan, const Area &area, int32 srcDepth, int32 dstDepth)
                     {{"quillon", Agreement::Exact, [=](const Job &job) -> Work {
                           return [=, dst = job.dst, src = job.src(), colours = palette().data()] {
                               Raster_ConvertPixels(
-                                  dst.data, static_cast<uint32>(dst.step), dstDepth, src.data,
-                                  static_cast<uint32>(src.step), indexed ? 8 : srcDepth, indexed,
+                                  dst.data, static_cast<uint32_t>(dst.step), dstDepth, src.data,
+                                  static_cast<uint32_t>(src.step), indexed ? 8 : srcDepth, indexed,
                                   colours, 0, 0, 0, 0, dst.width, dst.height);
                           };
                       }}}});
@@ -40,8 +40,8 @@ void addConversion(Plan &plan, const Area &area, int32 srcDepth, int32 dstDepth)
 } // namespace
 
 void addConversions(Plan &plan, const Area &area) {
-    for (const int32 src : {kIndex, 15, 16, 24, 32}) {
-        for (const int32 dst : {3, 6, 8, 15, 16, 24, 32}) {
+    for (const int32_t src : {kIndex, 15, 16, 24, 32}) {
+        for (const int32_t dst : {3, 6, 8, 15, 16, 24, 32}) {
             if (src != dst)
                 addConversion(plan, area, src, dst);
         }

@@ -2,15 +2,15 @@
 #include "operations.h"
 
 #include "names.h"
-#include "raster.h"
+#include <quillon/raster.h>
 
 #include <cstring>
 
 namespace quillon::bench {
 namespace {
 
-void addCopy(Plan &plan, const Area &area, uint32 bits) {
-    const auto bytes = static_cast<int32>(bits / 8);
+void addCopy(Plan &plan, const Area &area, uint32_t bits) {
+    const auto bytes = static_cast<int32_t>(bits / 8);
     plan.push_back({"copy " + std::to_string(bits),
                     "copy",
                     area,
@@ -25,8 +25,8 @@ void addCopy(Plan &plan, const Area &area, uint32 bits) {
 }
 
 // Within one surface, by lines and pixels: what memmove does row by row.
-void addScroll(Plan &plan, const Area &area, const std::string &name, uint32 fromX, uint32 fromY,
-               uint32 toX, uint32 toY) {
+void addScroll(Plan &plan, const Area &area, const std::string &name, uint32_t fromX, uint32_t fromY,
+               uint32_t toX, uint32_t toY) {
     if (area.width <= fromX + toX || area.height <= fromY + toY)
         return;
     const auto ours = [=](const Job &job) -> Work {
@@ -37,10 +37,10 @@ void addScroll(Plan &plan, const Area &area, const std::string &name, uint32 fro
     };
     const auto theirs = [=](const Job &job) -> Work {
         return [=, dst = job.dst] {
-            const uint32 rows = dst.height - fromY - toY;
+            const uint32_t rows = dst.height - fromY - toY;
             const size_t bytes = size_t{4} * (dst.width - fromX - toX);
-            for (uint32 i = 0; i < rows; ++i) {
-                const uint32 row = fromY < toY ? rows - 1 - i : i;
+            for (uint32_t i = 0; i < rows; ++i) {
+                const uint32_t row = fromY < toY ? rows - 1 - i : i;
                 std::memmove(dst.data + (toY + row) * dst.step + size_t{4} * toX,
                              dst.data + (fromY + row) * dst.step + size_t{4} * fromX, bytes);
             }
@@ -54,8 +54,8 @@ void addScroll(Plan &plan, const Area &area, const std::string &name, uint32 fro
                     {{"quillon", Agreement::Exact, ours}, {"memmove", Agreement::Exact, theirs}}});
 }
 
-void addRasterCopy(Plan &plan, const Area &area, uint32 rop, uint32 bits) {
-    const auto bytes = static_cast<int32>(bits / 8);
+void addRasterCopy(Plan &plan, const Area &area, uint32_t rop, uint32_t bits) {
+    const auto bytes = static_cast<int32_t>(bits / 8);
     std::vector<Plane> planes = {plane(area, bits, noise)};
     if (rop != RASTER_ROP_INVERT && rop != RASTER_ROP_CLEAR && rop != RASTER_ROP_SET)
         planes.push_back(plane(area, bits, noise));
@@ -76,16 +76,16 @@ void addRasterCopy(Plan &plan, const Area &area, uint32 rop, uint32 bits) {
 } // namespace
 
 void addCopies(Plan &plan, const Area &area) {
-    for (const uint32 bits : {8, 16, 24, 32})
+    for (const uint32_t bits : {8, 16, 24, 32})
         addCopy(plan, area, bits);
     addScroll(plan, area, "up", 0, 8, 0, 0);
     addScroll(plan, area, "down", 0, 0, 0, 8);
     addScroll(plan, area, "right", 0, 0, 3, 0);
-    for (uint32 rop = 0; rop < 16; ++rop) {
+    for (uint32_t rop = 0; rop < 16; ++rop) {
         if (rop != RASTER_ROP_NOOP)
             addRasterCopy(plan, area, rop, 32);
     }
-    for (const uint32 bits : {8, 16, 24})
+    for (const uint32_t bits : {8, 16, 24})
         addRasterCopy(plan, area, RASTER_ROP_XOR, bits);
 }
 

@@ -2,13 +2,13 @@
 #include "operations.h"
 
 #include "names.h"
-#include "raster.h"
+#include <quillon/raster.h>
 
 namespace quillon::bench {
 namespace {
 
-void addFill(Plan &plan, const Area &area, uint32 bits) {
-    const auto bytes = static_cast<int32>(bits / 8);
+void addFill(Plan &plan, const Area &area, uint32_t bits) {
+    const auto bytes = static_cast<int32_t>(bits / 8);
     plan.push_back({"fill " + std::to_string(bits),
                     "fill",
                     area,
@@ -36,8 +36,8 @@ void addAlphaFill(Plan &plan, const Area &area) {
                       }}}});
 }
 
-void addRasterFill(Plan &plan, const Area &area, uint32 rop, uint32 bits) {
-    const auto bytes = static_cast<int32>(bits / 8);
+void addRasterFill(Plan &plan, const Area &area, uint32_t rop, uint32_t bits) {
+    const auto bytes = static_cast<int32_t>(bits / 8);
     plan.push_back({"raster fill " + ropName(rop) + " " + std::to_string(bits),
                     ropFamily("raster fill", rop),
                     area,
@@ -54,15 +54,15 @@ void addRasterFill(Plan &plan, const Area &area, uint32 rop, uint32 bits) {
 } // namespace
 
 void addFills(Plan &plan, const Area &area) {
-    for (const uint32 bits : {8, 16, 24, 32})
+    for (const uint32_t bits : {8, 16, 24, 32})
         addFill(plan, area, bits);
     addAlphaFill(plan, area);
-    for (uint32 rop = 0; rop < 16; ++rop) {
+    for (uint32_t rop = 0; rop < 16; ++rop) {
         if (rop == RASTER_ROP_NOOP)
             continue;
         addRasterFill(plan, area, rop, 32);
     }
-    for (const uint32 bits : {8, 16, 24})
+    for (const uint32_t bits : {8, 16, 24})
         addRasterFill(plan, area, RASTER_ROP_XOR, bits);
 }
 

@@ -1,8 +1,9 @@
 // PNG beside libpng called directly; BMP, combining and cropping beside one pass
 // over their memory.
+#include <hearth/hearth.h>
 #include "operations.h"
 
-#include "imageUtil.h"
+#include <quillon/imageUtil.h>
 #include "picture.h"
 
 #include <algorithm>
@@ -16,8 +17,8 @@ namespace {
 // The memory that a function reads and writes, moved once.
 Contender memoryPass(size_t read, size_t written) {
     return {"one pass", Agreement::Approximate, [=](const Job & /*job*/) -> Work {
-                return [=, from = std::vector<uint8>(read, 1)] {
-                    const std::unique_ptr<uint8[]> to(new uint8[written]); // not cleared
+                return [=, from = std::vector<uint8_t>(read, 1)] {
+                    const std::unique_ptr<uint8_t[]> to(new uint8_t[written]); // not cleared
                     for (size_t done = 0; done < written; done += read)
                         std::memcpy(to.get() + done, from.data(), std::min(read, written - done));
                     benchmark::DoNotOptimize(to.get());
@@ -40,7 +41,7 @@ void add(Plan &plan, const std::string &name, const std::string &family, const W
 
 // libpng called as directly as can be; what fails ends the program.
 struct Reading {
-    const uint8 *next;
+    const uint8_t *next;
 };
 
 Work readDirectly() {
@@ -56,10 +57,10 @@ Work readDirectly() {
         png_read_info(png, info);
         png_set_bgr(png);
         const size_t rowBytes = png_get_rowbytes(png, info);
-        const uint32 height = png_get_image_height(png, info);
-        const std::unique_ptr<uint8[]> pixels(new uint8[rowBytes * height]); // not cleared
+        const uint32_t height = png_get_image_height(png, info);
+        const std::unique_ptr<uint8_t[]> pixels(new uint8_t[rowBytes * height]); // not cleared
         std::vector<png_bytep> rows;
-        for (uint32 y = 0; y < height; ++y)
+        for (uint32_t y = 0; y < height; ++y)
             rows.push_back(pixels.get() + y * rowBytes);
         png_read_image(png, rows.data());
         png_read_end(png, nullptr);
@@ -71,13 +72,13 @@ Work readDirectly() {
 Work writeDirectly() {
     return [] {
         const ImageInfo &image = picture();
-        std::vector<uint8> file;
+        std::vector<uint8_t> file;
         png_structp png = png_create_write_struct(PNG_LIBPNG_VER_STRING, nullptr, nullptr, nullptr);
         png_infop info = png_create_info_struct(png);
         png_set_write_fn(
             png, &file,
             [](png_structp writer, png_bytep from, size_t length) {
-                auto &to = *static_cast<std::vector<uint8> *>(png_get_io_ptr(writer));
+                auto &to = *static_cast<std::vector<uint8_t> *>(png_get_io_ptr(writer));
                 to.insert(to.end(), from, from + length);
             },
             nullptr);
@@ -87,7 +88,7 @@ Work writeDirectly() {
         png_set_bgr(png);
         png_write_info(png, info);
         std::vector<png_bytep> rows;
-        for (uint32 y = 0; y < image.height; ++y)
+        for (uint32_t y = 0; y < image.height; ++y)
             rows.push_back(image.data + size_t{y} * image.bytesPerLine);
         png_write_image(png, rows.data());
         png_write_end(png, nullptr);
@@ -118,7 +119,7 @@ void addCombine(Plan &plan) {
     add(plan, "combine two", "image",
         [&image] {
             const ImageInfo images[] = {image, image};
-            const RectPoint positions[] = {{0, 0}, {static_cast<int32>(image.width), 0}};
+            const RectPoint positions[] = {{0, 0}, {static_cast<int32_t>(image.width), 0}};
             ImageInfo combined = {};
             ImageUtil_Combine(images, positions, 2, &combined);
             ImageUtil_FreeImageData(&combined);
@@ -143,7 +144,7 @@ void addPng(Plan &plan) {
     add(plan, "PNG read", "PNG",
         [&file] {
             ImageInfo read = {};
-            ImageUtil_ReadPNGBuffer(&read, file.data(), static_cast<uint32>(file.size()),
+            ImageUtil_ReadPNGBuffer(&read, file.data(), static_cast<uint32_t>(file.size()),
                                     IMAGEUTIL_READ_KEEP_ALPHA);
             ImageUtil_FreeImageData(&read);
         },

@@ -1,12 +1,12 @@
 #include "names.h"
 
-#include "raster.h"
+#include <quillon/raster.h>
 
 #include <cstdio>
 
 namespace quillon::bench {
 
-std::string ropName(uint32 rop) {
+std::string ropName(uint32_t rop) {
     constexpr const char *kNames[] = {"clear",         "and",         "and reverse", "copy",
                                       "and inverted",  "noop",        "xor",         "or",
                                       "nor",           "equiv",       "invert",      "or reverse",
@@ -14,7 +14,7 @@ std::string ropName(uint32 rop) {
     return kNames[rop];
 }
 
-std::string ropFamily(const std::string &operation, uint32 rop) {
+std::string ropFamily(const std::string &operation, uint32_t rop) {
     switch (rop) {
     case RASTER_ROP_AND:
     case RASTER_ROP_OR:
@@ -28,7 +28,7 @@ std::string ropFamily(const std::string &operation, uint32 rop) {
     }
 }
 
-bool ropReadsDestination(uint32 rop) {
+bool ropReadsDestination(uint32_t rop) {
     switch (rop) {
     case RASTER_ROP_CLEAR:
     case RASTER_ROP_COPY:
@@ -40,7 +40,7 @@ bool ropReadsDestination(uint32 rop) {
     }
 }
 
-std::string conversionName(int32 srcDepth, int32 dstDepth) {
+std::string conversionName(int32_t srcDepth, int32_t dstDepth) {
     const std::string from = srcDepth == kIndex ? "index" : "convert " + std::to_string(srcDepth);
     return from + " to " + std::to_string(dstDepth);
 }

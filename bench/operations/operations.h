@@ -7,10 +7,10 @@
 namespace quillon::bench {
 
 // What the operations are given; peers are given the same.
-inline constexpr uint32 kPixel = 0xFF345678;
-inline constexpr uint32 kForeground = 0xFF102030;
-inline constexpr uint32 kBackground = 0xFFE0D0C0;
-inline constexpr uint8 kAlpha = 0x80;
+inline constexpr uint32_t kPixel = 0xFF345678;
+inline constexpr uint32_t kForeground = 0xFF102030;
+inline constexpr uint32_t kBackground = 0xFFE0D0C0;
+inline constexpr uint8_t kAlpha = 0x80;
 
 void addFills(Plan &plan, const Area &area);
 void addCopies(Plan &plan, const Area &area);

@@ -1,3 +1,4 @@
+#include <hearth/hearth.h>
 #include "picture.h"
 
 #include <stdexcept>
@@ -14,13 +15,13 @@ const ImageInfo &picture() {
     return image;
 }
 
-const std::vector<uint8> &pngFile() {
-    static const std::vector<uint8> file = [] {
+const std::vector<uint8_t> &pngFile() {
+    static const std::vector<uint8_t> file = [] {
         const ImageUtilPngOptions options = {kPngLevel, false};
         DynBuf buffer;
         if (!ImageUtil_ConstructPNGBuffer(&picture(), &options, &buffer))
             throw std::runtime_error("cannot write the picture as a PNG");
-        std::vector<uint8> bytes(buffer.data, buffer.data + buffer.size);
+        std::vector<uint8_t> bytes(buffer.data, buffer.data + buffer.size);
         DynBuf_Destroy(&buffer);
         return bytes;
     }();

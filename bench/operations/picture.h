@@ -1,7 +1,7 @@
 // The picture that the image operations work on, 32 bits a pixel.
 #pragma once
 
-#include "imageUtil.h"
+#include <quillon/imageUtil.h>
 
 #include <vector>
 
@@ -9,9 +9,9 @@ namespace quillon::bench {
 
 const ImageInfo &picture();
 
-constexpr int32 kPngLevel = 6;
+constexpr int32_t kPngLevel = 6;
 
 // The same as a PNG, compressed at that level.
-const std::vector<uint8> &pngFile();
+const std::vector<uint8_t> &pngFile();
 
 } // namespace quillon::bench

@@ -1,7 +1,7 @@
 // Raster_AddRect and Raster_SubRect.
 #include "operations.h"
 
-#include "raster.h"
+#include <quillon/raster.h>
 #include "rectSequences.h"
 
 #include <algorithm>
@@ -15,7 +15,7 @@ std::vector<ListStep> damage() {
     std::mt19937 random(1);
     std::vector<ListStep> steps;
     for (int i = 0; i < 8; ++i) {
-        const auto below = [&](uint32 bound) { return static_cast<int32>(random() % bound); };
+        const auto below = [&](uint32_t bound) { return static_cast<int32_t>(random() % bound); };
         steps.push_back({false, 16 * below(12), 16 * below(8), 16 + 16 * below(4), 16});
     }
     return steps;
@@ -23,8 +23,8 @@ std::vector<ListStep> damage() {
 
 std::vector<ListStep> grid() {
     std::vector<ListStep> steps;
-    for (int32 y = 0; y < 3; ++y) {
-        for (int32 x = 0; x < 4; ++x)
+    for (int32_t y = 0; y < 3; ++y) {
+        for (int32_t x = 0; x < 4; ++x)
             steps.push_back({false, 100 * x, 100 * y, 60, 60});
     }
     return steps;
@@ -32,8 +32,8 @@ std::vector<ListStep> grid() {
 
 std::vector<ListStep> touching() {
     std::vector<ListStep> steps;
-    for (int32 y = 0; y < 4; ++y) {
-        for (int32 x = 0; x < 4; ++x)
+    for (int32_t y = 0; y < 4; ++y) {
+        for (int32_t x = 0; x < 4; ++x)
             steps.push_back({false, 64 * x, 64 * y, 64, 64});
     }
     return steps;
@@ -50,7 +50,7 @@ std::vector<ListStep> clusters() {
     std::mt19937 random(3);
     std::vector<ListStep> steps;
     for (int i = 0; i < 12; ++i) {
-        const auto below = [&](uint32 bound) { return static_cast<int32>(random() % bound); };
+        const auto below = [&](uint32_t bound) { return static_cast<int32_t>(random() % bound); };
         steps.push_back({false, 600 * (i % 3) + below(60), 400 * (i % 2) + below(40), 40, 20});
     }
     return steps;
@@ -62,14 +62,14 @@ std::vector<ListStep> crossingBars() {
 
 std::vector<ListStep> holes() {
     std::vector<ListStep> steps = {{false, 0, 0, 1000, 600}};
-    for (int32 i = 0; i < 3; ++i)
+    for (int32_t i = 0; i < 3; ++i)
         steps.push_back({true, 100 + 250 * i, 100 + 150 * i, 50, 50});
     return steps;
 }
 
 std::vector<ListStep> holesInARow() {
     std::vector<ListStep> steps = {{false, 0, 0, 1000, 600}};
-    for (int32 i = 0; i < 8; ++i)
+    for (int32_t i = 0; i < 8; ++i)
         steps.push_back({true, 50 + 110 * i, 200, 50, 50});
     return steps;
 }
@@ -77,14 +77,14 @@ std::vector<ListStep> holesInARow() {
 // Cuts between the rectangles of a grid.
 std::vector<ListStep> missedCuts() {
     std::vector<ListStep> steps = grid();
-    for (int32 i = 0; i < 8; ++i)
+    for (int32_t i = 0; i < 8; ++i)
         steps.push_back({true, 65 + 100 * (i % 3), 70 * (i % 4), 30, 50});
     return steps;
 }
 
 std::vector<ListStep> typing() {
     std::vector<ListStep> steps;
-    for (int32 i = 0; i < 40; ++i)
+    for (int32_t i = 0; i < 40; ++i)
         steps.push_back({false, 8 * i, 300, 8, 16});
     return steps;
 }

@@ -1,7 +1,7 @@
 // Sequences of rectangles that are added to or cut from a list, as hosts do.
 #pragma once
 
-#include "quillonTypes.h"
+#include <cstdint>
 
 #include <string>
 #include <vector>
@@ -10,7 +10,7 @@ namespace quillon::bench {
 
 struct ListStep {
     bool cut;
-    int32 x, y, width, height;
+    int32_t x, y, width, height;
 };
 
 struct RectSequence {

@@ -2,7 +2,7 @@
 #include "operations.h"
 
 #include "names.h"
-#include "raster.h"
+#include <quillon/raster.h>
 
 #include <algorithm>
 #include <cmath>
@@ -11,8 +11,8 @@ namespace quillon::bench {
 namespace {
 
 void addScale(Plan &plan, const Area &area, const std::string &filter, double factor) {
-    const auto sourceSize = [factor](uint32 size) {
-        return std::max(static_cast<uint32>(std::lround(size / factor)), 1U);
+    const auto sourceSize = [factor](uint32_t size) {
+        return std::max(static_cast<uint32_t>(std::lround(size / factor)), 1U);
     };
     Area srcArea = area;
     srcArea.width = sourceSize(area.width);
@@ -29,8 +29,8 @@ void addScale(Plan &plan, const Area &area, const std::string &filter, double fa
                     {{"quillon", Agreement::Exact, [=](const Job &job) -> Work {
                           return [=, dst = job.dst, src = job.src()] {
                               Raster_Scale(dst.data, dst.line(), dst.width, dst.height, 0, 0,
-                                           static_cast<int32>(dst.width),
-                                           static_cast<int32>(dst.height), src.data, src.line(),
+                                           static_cast<int32_t>(dst.width),
+                                           static_cast<int32_t>(dst.height), src.data, src.line(),
                                            src.width, src.height, factor, factor,
                                            filter != "nearest");
                           };

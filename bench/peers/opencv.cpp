@@ -3,7 +3,7 @@
 #include "../operations/operations.h"
 #include "peers.h"
 
-#include "raster.h"
+#include <quillon/raster.h>
 
 #include <opencv2/core.hpp>
 #include <opencv2/imgproc.hpp>
@@ -16,20 +16,20 @@ cv::Mat matOf(const Buffer &buffer, int type) {
             buffer.step};
 }
 
-int typeOf(int32 bits) {
+int typeOf(int32_t bits) {
     return bits == 8 ? CV_8UC1 : bits == 16 ? CV_8UC2 : bits == 24 ? CV_8UC3 : CV_8UC4;
 }
 
-cv::Scalar channels(uint32 pixel) {
+cv::Scalar channels(uint32_t pixel) {
     return {double(pixel & 0xFF), double(pixel >> 8 & 0xFF), double(pixel >> 16 & 0xFF),
             double(pixel >> 24)};
 }
 
 // The bitwise codes that it has; the others would take several passes.
-constexpr uint32 kRops[] = {RASTER_ROP_AND,  RASTER_ROP_OR,     RASTER_ROP_XOR,
+constexpr uint32_t kRops[] = {RASTER_ROP_AND,  RASTER_ROP_OR,     RASTER_ROP_XOR,
                             RASTER_ROP_COPY, RASTER_ROP_INVERT, RASTER_ROP_COPY_INVERTED};
 
-void combine(uint32 rop, const cv::Mat &src, cv::Mat &dst) {
+void combine(uint32_t rop, const cv::Mat &src, cv::Mat &dst) {
     switch (rop) {
     case RASTER_ROP_AND:
         return cv::bitwise_and(src, dst, dst);
@@ -47,8 +47,8 @@ void combine(uint32 rop, const cv::Mat &src, cv::Mat &dst) {
 }
 
 void offerRasterCopies(Offers &offers) {
-    for (const int32 bits : {8, 16, 24, 32}) {
-        for (const uint32 rop : kRops) {
+    for (const int32_t bits : {8, 16, 24, 32}) {
+        for (const uint32_t rop : kRops) {
             offers["raster copy " + ropName(rop) + " " + std::to_string(bits)].push_back(
                 {"OpenCV", Agreement::Exact, [=](const Job &job) -> Work {
                      const cv::Mat src =
@@ -71,7 +71,7 @@ Contender converter(int code, int srcType, int dstType, Agreement agreement) {
 
 void offerConversions(Offers &offers) {
     constexpr struct {
-        int32 from, to;
+        int32_t from, to;
         int code, srcType, dstType;
         Agreement agreement;
     } kCodes[] = {
@@ -106,7 +106,7 @@ void offerVideo(Offers &offers) {
     for (const auto &code : kCodes)
         offers[code.operation].push_back(
             converter(code.code, code.srcType, code.dstType, Agreement::Approximate));
-    for (const int32 depth : {8, 16, 32}) {
+    for (const int32_t depth : {8, 16, 32}) {
         offers["key " + std::to_string(depth)].push_back(
             {"OpenCV", Agreement::ColourOnly, [=](const Job &job) -> Work {
                  return [=, dst = matOf(job.dst, CV_8UC4), back = matOf(job.sources[0], CV_8UC4),
@@ -145,7 +145,7 @@ void offerScaling(Offers &offers) {
 
 void offerOpenCv(Offers &offers) {
     cv::setNumThreads(1);
-    for (const int32 bits : {8, 16, 24, 32}) {
+    for (const int32_t bits : {8, 16, 24, 32}) {
         const Prepare fill = [=](const Job &job) -> Work {
             const cv::Scalar value = bits == 8 ? cv::Scalar::all(kPixel & 0xFF) : channels(kPixel);
             return [=, dst = matOf(job.dst, typeOf(bits))]() mutable { dst.setTo(value); };

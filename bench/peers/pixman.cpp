@@ -19,7 +19,7 @@ Image imageOf(const Buffer &buffer, pixman_format_code_t format) {
             pixman_image_unref};
 }
 
-Image solid(uint32 pixel) {
+Image solid(uint32_t pixel) {
     const auto channel = [pixel](int shift) {
         return static_cast<uint16_t>((pixel >> shift & 0xFF) * 0x0101);
     };
@@ -44,7 +44,7 @@ Work fill(const Job &job, int bits) {
 }
 
 struct Format {
-    int32 depth;
+    int32_t depth;
     pixman_format_code_t src, dst;
 };
 constexpr Format kFormats[] = {

@@ -5,48 +5,48 @@
 // be ones that the function accepts.
 #pragma once
 
-#include <quillonTypes.h>
+#include <cstdint>
 
 namespace quillon::bench::plain {
 
-void rectFill(uint8 *frameBuffer, int32 lineIncrement, int32 bytesPerPixel, uint32 pixel, uint32 x,
-              uint32 y, uint32 width, uint32 height);
+void rectFill(uint8_t *frameBuffer, int32_t lineIncrement, int32_t bytesPerPixel, uint32_t pixel, uint32_t x,
+              uint32_t y, uint32_t width, uint32_t height);
 
-void rectCopy(uint8 *dstBuffer, int64_t dstLineIncrement, const uint8 *srcBuffer,
-              int64_t srcLineIncrement, int32 bytesPerPixel, uint32 srcX, uint32 srcY, uint32 dstX,
-              uint32 dstY, uint32 width, uint32 height);
+void rectCopy(uint8_t *dstBuffer, int64_t dstLineIncrement, const uint8_t *srcBuffer,
+              int64_t srcLineIncrement, int32_t bytesPerPixel, uint32_t srcX, uint32_t srcY, uint32_t dstX,
+              uint32_t dstY, uint32_t width, uint32_t height);
 
-void rectFillAlpha(uint8 *frameBuffer, int32 lineIncrement, uint8 alpha, uint32 x, uint32 y,
-                   uint32 width, uint32 height);
+void rectFillAlpha(uint8_t *frameBuffer, int32_t lineIncrement, uint8_t alpha, uint32_t x, uint32_t y,
+                   uint32_t width, uint32_t height);
 
-void alphaBlendOver(uint8 *dstBuffer, uint32 dstX, uint32 dstY, int32 dstLineIncrement,
-                    const uint8 *srcBuffer, uint32 srcX, uint32 srcY, int32 srcLineIncrement,
-                    uint32 width, uint32 height);
+void alphaBlendOver(uint8_t *dstBuffer, uint32_t dstX, uint32_t dstY, int32_t dstLineIncrement,
+                    const uint8_t *srcBuffer, uint32_t srcX, uint32_t srcY, int32_t srcLineIncrement,
+                    uint32_t width, uint32_t height);
 
 // Also states the functions that are this with a depth, or both, fixed.
-void convertPixels(uint8 *dstBuffer, uint32 dstLineIncrement, int32 dstDepth,
-                   const uint8 *srcBuffer, uint32 srcLineIncrement, int32 srcDepth,
-                   bool pseudoColor, const uint32 *palette, uint32 srcX, uint32 srcY, uint32 dstX,
-                   uint32 dstY, uint32 width, uint32 height);
+void convertPixels(uint8_t *dstBuffer, uint32_t dstLineIncrement, int32_t dstDepth,
+                   const uint8_t *srcBuffer, uint32_t srcLineIncrement, int32_t srcDepth,
+                   bool pseudoColor, const uint32_t *palette, uint32_t srcX, uint32_t srcY, uint32_t dstX,
+                   uint32_t dstY, uint32_t width, uint32_t height);
 
-void rectRopFill(uint8 *frameBuffer, int32 lineIncrement, int32 bytesPerPixel, uint32 pixel,
-                 uint32 rop, uint32 x, uint32 y, uint32 width, uint32 height);
+void rectRopFill(uint8_t *frameBuffer, int32_t lineIncrement, int32_t bytesPerPixel, uint32_t pixel,
+                 uint32_t rop, uint32_t x, uint32_t y, uint32_t width, uint32_t height);
 
-void rectRopCopy(uint8 *dstBuffer, int32 dstLineIncrement, const uint8 *srcBuffer,
-                 int32 srcLineIncrement, int32 bytesPerPixel, uint32 srcX, uint32 srcY, uint32 rop,
-                 uint32 dstX, uint32 dstY, uint32 width, uint32 height);
+void rectRopCopy(uint8_t *dstBuffer, int32_t dstLineIncrement, const uint8_t *srcBuffer,
+                 int32_t srcLineIncrement, int32_t bytesPerPixel, uint32_t srcX, uint32_t srcY, uint32_t rop,
+                 uint32_t dstX, uint32_t dstY, uint32_t width, uint32_t height);
 
-void bitsToPixels(const uint8 *srcBits, int32 srcLineIncrement, uint8 *dstBuffer,
-                  int32 dstLineIncrement, int32 bytesPerPixel, int32 width, uint32 height,
-                  uint32 foreground, uint32 background);
+void bitsToPixels(const uint8_t *srcBits, int32_t srcLineIncrement, uint8_t *dstBuffer,
+                  int32_t dstLineIncrement, int32_t bytesPerPixel, int32_t width, uint32_t height,
+                  uint32_t foreground, uint32_t background);
 
-void bitsToPixelsStencil(const uint8 *srcBits, int32 srcLineIncrement, uint8 *dstBuffer,
-                         int32 dstLineIncrement, int32 bytesPerPixel, int32 width, uint32 height,
-                         uint32 pixel);
+void bitsToPixelsStencil(const uint8_t *srcBits, int32_t srcLineIncrement, uint8_t *dstBuffer,
+                         int32_t dstLineIncrement, int32_t bytesPerPixel, int32_t width, uint32_t height,
+                         uint32_t pixel);
 
-void applyColorKey(const uint8 *background, uint8 *dstBuffer, const uint8 *overlay,
-                   const uint8 *keySurface, int32 backgroundLineIncrement, int32 dstLineIncrement,
-                   int32 overlayLineIncrement, int32 keyLineIncrement, uint32 key, uint32 x,
-                   uint32 y, uint32 width, uint32 height, uint32 keyDepth);
+void applyColorKey(const uint8_t *background, uint8_t *dstBuffer, const uint8_t *overlay,
+                   const uint8_t *keySurface, int32_t backgroundLineIncrement, int32_t dstLineIncrement,
+                   int32_t overlayLineIncrement, int32_t keyLineIncrement, uint32_t key, uint32_t x,
+                   uint32_t y, uint32_t width, uint32_t height, uint32_t keyDepth);
 
 } // namespace quillon::bench::plain

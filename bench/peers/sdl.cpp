@@ -11,7 +11,7 @@ namespace {
 
 using Surface = std::shared_ptr<SDL_Surface>;
 
-Surface surfaceOf(const Buffer &buffer, uint32 format) {
+Surface surfaceOf(const Buffer &buffer, uint32_t format) {
     const int bits = SDL_BITSPERPIXEL(format);
     return {SDL_CreateRGBSurfaceWithFormatFrom(buffer.data, static_cast<int>(buffer.width),
                                                static_cast<int>(buffer.height), bits, buffer.line(),
@@ -25,8 +25,8 @@ Work blit(const Surface &src, const Surface &dst, SDL_BlendMode mode) {
 }
 
 constexpr struct Format {
-    int32 depth;
-    uint32 format;
+    int32_t depth;
+    uint32_t format;
 } kFormats[] = {{kIndex, SDL_PIXELFORMAT_INDEX8}, {8, SDL_PIXELFORMAT_RGB332},
                 {15, SDL_PIXELFORMAT_RGB555},     {16, SDL_PIXELFORMAT_RGB565},
                 {24, SDL_PIXELFORMAT_BGR24},      {32, SDL_PIXELFORMAT_RGB888}};
@@ -34,9 +34,9 @@ constexpr struct Format {
 void setPalette(SDL_Surface *surface) {
     SDL_Color colours[256];
     for (size_t i = 0; i < 256; ++i) {
-        const uint32 colour = palette()[i];
-        colours[i] = {static_cast<uint8>(colour >> 16), static_cast<uint8>(colour >> 8),
-                      static_cast<uint8>(colour), 255};
+        const uint32_t colour = palette()[i];
+        colours[i] = {static_cast<uint8_t>(colour >> 16), static_cast<uint8_t>(colour >> 8),
+                      static_cast<uint8_t>(colour), 255};
     }
     SDL_SetPaletteColors(surface->format->palette, colours, 0, 256);
 }
@@ -58,7 +58,7 @@ void offerConversions(Offers &offers) {
 }
 
 void offerVideo(Offers &offers) {
-    const auto offer = [&](const char *name, uint32 from, uint32 to) {
+    const auto offer = [&](const char *name, uint32_t from, uint32_t to) {
         offers[name].push_back(
             {"SDL", Agreement::Approximate, [=](const Job &job) -> Work {
                  return [=, dst = job.dst, src = job.src()] {
@@ -85,10 +85,10 @@ void offerSdl(Offers &offers) {
         if (format.depth == kIndex || format.depth == 15)
             continue;
         const std::string depth = std::to_string(format.depth);
-        const uint32 mask = 0xFFFFFFFF >> (32 - 8 * SDL_BYTESPERPIXEL(format.format));
+        const uint32_t mask = 0xFFFFFFFF >> (32 - 8 * SDL_BYTESPERPIXEL(format.format));
         offers["fill " + depth].push_back({"SDL", Agreement::Exact, [=](const Job &job) -> Work {
                                                // Only the bytes of a pixel may be set.
-                                               const uint32 pixel = kPixel & mask;
+                                               const uint32_t pixel = kPixel & mask;
                                                return [=, dst = surfaceOf(job.dst, format.format)] {
                                                    SDL_FillRect(dst.get(), nullptr, pixel);
                                                };

@@ -24,7 +24,7 @@ struct Ends {
 
 // One context serves all jobs of the same sizes.
 Context contextOf(const Ends &ends, int srcWidth, int srcHeight, const Buffer &dst) {
-    static std::map<std::tuple<Ends, int, int, uint32, uint32>, Context> made;
+    static std::map<std::tuple<Ends, int, int, uint32_t, uint32_t>, Context> made;
     Context &context = made[{ends, srcWidth, srcHeight, dst.width, dst.height}];
     if (!context)
         context = Context(sws_getContext(srcWidth, srcHeight, ends.src, static_cast<int>(dst.width),
@@ -41,7 +41,7 @@ Work convert(const Job &job, const Ends &ends) {
     const Context context = contextOf(ends, static_cast<int>(src.width), srcHeight, dst);
     if (!context)
         return [] {};
-    const uint8 *planes[4] = {src.data};
+    const uint8_t *planes[4] = {src.data};
     int steps[4] = {src.line()};
     if (planar) {
         const size_t pixels = size_t{dst.width} * dst.height;
@@ -49,10 +49,10 @@ Work convert(const Job &job, const Ends &ends) {
         planes[2] = src.data + pixels;
         steps[1] = steps[2] = src.line() / 2;
     } else if (ends.src == AV_PIX_FMT_PAL8) {
-        planes[1] = reinterpret_cast<const uint8 *>(palette().data());
+        planes[1] = reinterpret_cast<const uint8_t *>(palette().data());
     }
     return [=] {
-        uint8 *out[4] = {dst.data};
+        uint8_t *out[4] = {dst.data};
         const int outSteps[4] = {dst.line()};
         sws_scale(context.get(), planes, steps, 0, srcHeight, out, outSteps);
     };
@@ -68,7 +68,7 @@ void offer(Offers &offers, const std::string &operation, const Ends &ends) {
 void offerSwscale(Offers &offers) {
     av_log_set_level(AV_LOG_ERROR);
     constexpr struct {
-        int32 depth;
+        int32_t depth;
         AVPixelFormat format;
     } kFormats[] = {{kIndex, AV_PIX_FMT_PAL8}, {8, AV_PIX_FMT_RGB8},   {15, AV_PIX_FMT_RGB555LE},
                     {16, AV_PIX_FMT_RGB565LE}, {24, AV_PIX_FMT_BGR24}, {32, AV_PIX_FMT_BGRA}};

@@ -11,8 +11,8 @@ namespace {
 // The sprite in falling sizes, from left to right as far as there is room.
 Picture decorated(const Material &material) {
     Picture picture = covering(material.photo, 704, 300);
-    int32 x = 0;
-    for (int32 size = 280; size >= 16; size = size * 5 / 8) {
+    int32_t x = 0;
+    for (int32_t size = 280; size >= 16; size = size * 5 / 8) {
         if (x + size > picture.width())
             break;
         blend(picture, resized(material.sprite, size, size), x, picture.height() - size);
@@ -22,11 +22,11 @@ Picture decorated(const Material &material) {
 }
 
 // One sprite over the picture, with its alpha replaced unless alpha is negative.
-Picture withAlpha(const Material &material, int32 alpha) {
-    constexpr int32 kSize = 136;
+Picture withAlpha(const Material &material, int32_t alpha) {
+    constexpr int32_t kSize = 136;
     Picture sprite = resized(material.sprite, kSize, kSize);
     if (alpha >= 0)
-        Raster_RectFillAlpha(sprite.data(), sprite.step(), static_cast<uint8>(alpha), 0, 0, kSize,
+        Raster_RectFillAlpha(sprite.data(), sprite.step(), static_cast<uint8_t>(alpha), 0, 0, kSize,
                              kSize);
     Picture picture = covering(material.photo, 224, 152);
     blend(picture, sprite, 44, 8);

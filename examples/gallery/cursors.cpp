@@ -26,26 +26,26 @@ constexpr std::string_view kBeam[] = {"xxxx xxxx", "    x    ", "    x    ", "  
 // A cursor together with the pixels its record points to.
 struct Cursor {
     RasterCursor record = {};
-    std::vector<uint8> images;
+    std::vector<uint8_t> images;
 };
 
 // From its two planes of one bit a pixel, as a host would hand it over.
 template <size_t height>
-Cursor maskCursor(const std::string_view (&rows)[height], uint32 hotspot) {
-    const auto width = static_cast<uint32>(rows[0].size());
-    const uint32 planeSize = Raster_CalculateCursorSize(width, height, 1);
+Cursor maskCursor(const std::string_view (&rows)[height], uint32_t hotspot) {
+    const auto width = static_cast<uint32_t>(rows[0].size());
+    const uint32_t planeSize = Raster_CalculateCursorSize(width, height, 1);
     const size_t step = planeSize / height;
-    std::vector<uint8> andPlane(planeSize), xorPlane(planeSize);
+    std::vector<uint8_t> andPlane(planeSize), xorPlane(planeSize);
     for (size_t y = 0; y < height; ++y)
         for (size_t x = 0; x < width; ++x) {
             const char c = rows[y][x];
-            const auto bit = static_cast<uint8>(0x80 >> x % 8);
+            const auto bit = static_cast<uint8_t>(0x80 >> x % 8);
             const size_t at = y * step + x / 8;
-            andPlane[at] |= c == ' ' || c == 'x' ? bit : uint8{0};
-            xorPlane[at] |= c == '.' || c == 'x' ? bit : uint8{0};
+            andPlane[at] |= c == ' ' || c == 'x' ? bit : uint8_t{0};
+            xorPlane[at] |= c == '.' || c == 'x' ? bit : uint8_t{0};
         }
 
-    const uint32 imageSize = Raster_CalculateCursorSize(width, height, 32);
+    const uint32_t imageSize = Raster_CalculateCursorSize(width, height, 32);
     Cursor cursor;
     cursor.images.resize(size_t{imageSize} * 2);
     Raster_ExpandPlanarCursorData(width, height, 1, andPlane.data(), 1, xorPlane.data(), 32,
@@ -72,14 +72,14 @@ RasterCursor alphaCursor(const Picture &image) {
     return record;
 }
 
-void draw(Picture &screen, const RasterCursor &cursor, int32 x, int32 y) {
+void draw(Picture &screen, const RasterCursor &cursor, int32_t x, int32_t y) {
     const RasterCursorScreen size = {screen.info().width, screen.info().height};
     RasterCursorBox box;
     if (Raster_ComputeCursorBox(&size, &cursor, x, y, &box))
         Raster_DrawCursor(screen.data(), screen.step(), nullptr, 0, &cursor, &box);
 }
 
-void drawScaled(Picture &screen, const RasterCursor &cursor, int32 x, int32 y, double scale) {
+void drawScaled(Picture &screen, const RasterCursor &cursor, int32_t x, int32_t y, double scale) {
     const std::unique_ptr<RasterCursor, void (*)(RasterCursor *)> large(
         Raster_ScaleCursor(&cursor, scale, scale), [](RasterCursor *scaled) {
             if (!scaled)
@@ -109,16 +109,16 @@ void showCursors(Page &page, const Material &material) {
     const Picture screen = covering(material.photo, 86, 57);
     std::array<Picture, 4> screens;
     std::generate(screens.begin(), screens.end(), [&screen] { return copyOf(screen); });
-    for (const int32 x : {10, 36, 62})
+    for (const int32_t x : {10, 36, 62})
         draw(screens[0], arrow.record, x, 18);
     fill(screens[1], area(13, 14, 30, 30), kInk);
     fill(screens[1], area(43, 14, 30, 30), kWhite);
-    for (const int32 x : {5, 24, 43, 62, 81})
+    for (const int32_t x : {5, 24, 43, 62, 81})
         draw(screens[1], beam.record, x, 24);
     draw(screens[2], ball, 26, 30);
     draw(screens[2], ball, 60, 30);
-    for (const int32 x : {0, 43, 85})
-        for (const int32 y : {0, 28, 56})
+    for (const int32_t x : {0, 43, 85})
+        for (const int32_t y : {0, 28, 56})
             if (x != 43 || y != 28)
                 draw(screens[3], ball, x, y);
 
@@ -135,9 +135,9 @@ void showCursors(Page &page, const Material &material) {
     Sheet scaled(1);
     for (const bool alpha : {false, true}) {
         Picture wide = covering(material.photo, 704, 170);
-        int32 x = 40;
+        int32_t x = 40;
         for (const double scale : {0.5, 1.0, 2.0, 3.0, 4.5}) {
-            const int32 half = static_cast<int32>(16 * scale);
+            const int32_t half = static_cast<int32_t>(16 * scale);
             drawScaled(wide, alpha ? ball : arrow.record, x + (alpha ? half : 0), alpha ? 84 : 60,
                        scale);
             x += half * 2 + 50;

@@ -9,21 +9,21 @@ namespace gallery {
 
 namespace {
 
-constexpr std::array<uint32, 8> kRings = {0xFF1B4965, 0xFF2F6690, 0xFF5FA8D3, 0xFFBEE9E8,
+constexpr std::array<uint32_t, 8> kRings = {0xFF1B4965, 0xFF2F6690, 0xFF5FA8D3, 0xFFBEE9E8,
                                           0xFFFFF3B0, 0xFFF6BD60, 0xFFE8590C, 0xFF9E2A2B};
 
 // Squares within squares, filled in pixels of the given layout; depth 8 stands
 // for indices into kRings.
-Picture filledRings(int32 depth) {
-    constexpr int32 kSize = 160, kRing = 10;
+Picture filledRings(int32_t depth) {
+    constexpr int32_t kSize = 160, kRing = 10;
     const bool indices = depth == 8;
-    const int32 bytes = (depth + 7) / 8, step = kSize * bytes;
-    std::vector<uint8> surface(size_t{kSize} * static_cast<size_t>(step));
-    for (uint32 ring = 0; ring < kRings.size(); ++ring) {
-        const uint32 colour = kRings[ring];
-        const uint32 pixel =
+    const int32_t bytes = (depth + 7) / 8, step = kSize * bytes;
+    std::vector<uint8_t> surface(size_t{kSize} * static_cast<size_t>(step));
+    for (uint32_t ring = 0; ring < kRings.size(); ++ring) {
+        const uint32_t colour = kRings[ring];
+        const uint32_t pixel =
             indices ? ring : Raster_ConvertOnePixel(colour, 32, depth, false, nullptr);
-        const uint32 inset = ring * kRing;
+        const uint32_t inset = ring * kRing;
         Raster_RectFill(surface.data(), step, bytes, pixel, inset, inset, kSize - 2 * inset,
                         kSize - 2 * inset);
     }
@@ -53,13 +53,13 @@ constexpr std::array<Operation, 16> kOperations = {{{"CLEAR", "0"},
                                                     {"NAND", "~(S & D)"},
                                                     {"SET", "1"}}};
 
-std::string labelOf(uint32 rop) {
+std::string labelOf(uint32_t rop) {
     return std::to_string(rop) + " " + kOperations[rop].name + "\n   " + kOperations[rop].formula;
 }
 
-constexpr int32 kTileWidth = 168, kTileHeight = 112;
+constexpr int32_t kTileWidth = 168, kTileHeight = 112;
 
-Picture againstConstant(const Picture &photo, uint32 rop) {
+Picture againstConstant(const Picture &photo, uint32_t rop) {
     Picture picture = covering(photo, kTileWidth, kTileHeight);
     Raster_RectROPfill(picture.data(), picture.step(), 4, kOrange, rop, 28, 20, kTileWidth - 56,
                        kTileHeight - 40);
@@ -67,11 +67,11 @@ Picture againstConstant(const Picture &photo, uint32 rop) {
 }
 
 // A disc on a surface of one byte a pixel, row by row.
-std::vector<uint8> disc(int32 centreX) {
-    constexpr int32 kRadius = 40, kCentreY = kTileHeight / 2;
-    std::vector<uint8> surface(size_t{kTileWidth} * kTileHeight);
-    for (int32 y = -kRadius; y <= kRadius; ++y) {
-        int32 half = 0;
+std::vector<uint8_t> disc(int32_t centreX) {
+    constexpr int32_t kRadius = 40, kCentreY = kTileHeight / 2;
+    std::vector<uint8_t> surface(size_t{kTileWidth} * kTileHeight);
+    for (int32_t y = -kRadius; y <= kRadius; ++y) {
+        int32_t half = 0;
         while ((half + 1) * (half + 1) + y * y <= kRadius * kRadius)
             ++half;
         Raster_RectFill(surface.data(), kTileWidth, 1, 0xFF, natural(centreX - half),
@@ -80,12 +80,12 @@ std::vector<uint8> disc(int32 centreX) {
     return surface;
 }
 
-Picture betweenDiscs(uint32 rop) {
-    const std::vector<uint8> source = disc(62);
-    std::vector<uint8> surface = disc(106);
+Picture betweenDiscs(uint32_t rop) {
+    const std::vector<uint8_t> source = disc(62);
+    std::vector<uint8_t> surface = disc(106);
     Raster_RectROPcopy(surface.data(), kTileWidth, source.data(), kTileWidth, 1, 0, 0, rop, 0, 0,
                        kTileWidth, kTileHeight);
-    std::vector<uint32> palette(256);
+    std::vector<uint32_t> palette(256);
     palette[0x00] = kPale;
     palette[0xFF] = kBlue;
     Picture shown = blank(kTileWidth, kTileHeight, 0);
@@ -100,8 +100,8 @@ void showFills(Page &page, const Material &material) {
     page.room("Fills and copies", "Rectangles of one value, and rectangles moved.");
 
     Sheet fills(4);
-    for (const int32 depth : {8, 16, 24, 32}) {
-        const int32 bytes = depth / 8;
+    for (const int32_t depth : {8, 16, 24, 32}) {
+        const int32_t bytes = depth / 8;
         fills.add(filledRings(depth),
                   std::to_string(bytes) + (bytes == 1 ? " byte a pixel" : " bytes a pixel"));
     }
@@ -109,7 +109,7 @@ void showFills(Page &page, const Material &material) {
               "`Raster_RectFill`: eight squares, each filled over the last, in pixels of each "
               "size. They look the same, but for shades that 16 bits cannot hold.");
 
-    constexpr int32 kWidth = 344, kHeight = 228;
+    constexpr int32_t kWidth = 344, kHeight = 228;
     const Rect from = area(150, 66, 150, 110), to = area(90, 30, 150, 110);
     Picture before = covering(material.photo, kWidth, kHeight);
     Picture after = copyOf(before);
@@ -131,7 +131,7 @@ void showRasterOperations(Page &page, const Material &material) {
               "bit. The number of each is its truth table.");
     Sheet constants(4);
     Sheet discs(4);
-    for (uint32 rop = 0; rop < kOperations.size(); ++rop) {
+    for (uint32_t rop = 0; rop < kOperations.size(); ++rop) {
         constants.add(againstConstant(material.photo, rop), labelOf(rop));
         discs.add(betweenDiscs(rop), labelOf(rop));
     }

@@ -15,7 +15,7 @@ Picture withoutAlpha(const Picture &picture) {
     ImageInfo info = picture.info();
     info.bpp = 24;
     info.bytesPerLine = info.width * 3;
-    info.data = static_cast<uint8 *>(std::malloc(size_t{info.bytesPerLine} * info.height));
+    info.data = static_cast<uint8_t *>(std::malloc(size_t{info.bytesPerLine} * info.height));
     if (!info.data)
         fail("no memory");
     Raster_ConvertPixelsFrom32(info.data, info.bytesPerLine, 24, picture.data(),
@@ -25,10 +25,10 @@ Picture withoutAlpha(const Picture &picture) {
 
 // What is clear in a picture shows a chequered ground.
 Picture overCheques(const Picture &picture) {
-    constexpr int32 kSquare = 8;
+    constexpr int32_t kSquare = 8;
     Picture ground = blank(picture.width(), picture.height(), kWhite);
-    for (int32 y = 0; y < ground.height(); y += kSquare)
-        for (int32 x = y % (2 * kSquare); x < ground.width(); x += 2 * kSquare)
+    for (int32_t y = 0; y < ground.height(); y += kSquare)
+        for (int32_t x = y % (2 * kSquare); x < ground.width(); x += 2 * kSquare)
             fill(ground,
                  area(x, y, std::min(kSquare, ground.width() - x),
                       std::min(kSquare, ground.height() - y)),
@@ -38,13 +38,13 @@ Picture overCheques(const Picture &picture) {
 }
 
 // Four quarters of a picture put together again, gap pixels apart.
-void addCombined(Sheet &sheet, const Picture &photo, int32 gap, const std::string &label) {
-    const int32 width = photo.width() / 2, height = photo.height() / 2;
+void addCombined(Sheet &sheet, const Picture &photo, int32_t gap, const std::string &label) {
+    const int32_t width = photo.width() / 2, height = photo.height() / 2;
     std::vector<Picture> quarters;
     std::vector<ImageInfo> images;
     std::vector<RectPoint> corners;
-    for (int32 i = 0; i < 4; ++i) {
-        const int32 column = i % 2, row = i / 2;
+    for (int32_t i = 0; i < 4; ++i) {
+        const int32_t column = i % 2, row = i / 2;
         quarters.push_back(
             withoutAlpha(partOf(photo, area(column * width, row * height, width, height))));
         images.push_back(quarters.back().info());
@@ -66,7 +66,7 @@ void addCombined(Sheet &sheet, const Picture &photo, int32 gap, const std::strin
     sheet.add(std::move(shown), label + ": " + bits);
 }
 
-Picture cutAndScaled(const Picture &photo, const Rect &part, int32 width, int32 height) {
+Picture cutAndScaled(const Picture &photo, const Rect &part, int32_t width, int32_t height) {
     ImageInfo result = {};
     if (!ImageUtil_CropAndScaleImage(&photo.info(), part.left, part.top, part.right, part.bottom, 0,
                                      0, width, height, &result))
@@ -75,9 +75,9 @@ Picture cutAndScaled(const Picture &photo, const Rect &part, int32 width, int32 
 }
 
 // Scaled to a longest side.
-Picture thumbnail(const Picture &photo, int32 side) {
-    const int32 longest = std::max(photo.width(), photo.height());
-    const auto scaled = [side, longest](int32 extent) {
+Picture thumbnail(const Picture &photo, int32_t side) {
+    const int32_t longest = std::max(photo.width(), photo.height());
+    const auto scaled = [side, longest](int32_t extent) {
         return std::max(1, extent * side / longest);
     };
     return resized(photo, scaled(photo.width()), scaled(photo.height()));
@@ -100,7 +100,7 @@ public:
     // All of it on dark grey, with a margin.
     Picture drawn() const {
         ImageInfo info = {};
-        if (!ImageUtil_Combine(images.data(), corners.data(), static_cast<uint32>(images.size()),
+        if (!ImageUtil_Combine(images.data(), corners.data(), static_cast<uint32_t>(images.size()),
                                &info))
             fail("the sheet cannot be made");
         const Picture pasted(info);
@@ -111,10 +111,10 @@ public:
     }
 
 private:
-    static constexpr int32 kGap = 16;
+    static constexpr int32_t kGap = 16;
     std::vector<ImageInfo> images; // borrowed
     std::vector<RectPoint> corners;
-    int32 x = 0, y = 0, rowHeight = 0;
+    int32_t x = 0, y = 0, rowHeight = 0;
 };
 
 } // namespace
@@ -147,7 +147,7 @@ void showFiles(Page &page, const Material &material) {
                        "sheet of them, from `ImageUtil_WriteImage`.");
     const Picture &photo = material.photo;
     std::vector<Picture> thumbnails;
-    for (const int32 side : {480, 240, 120, 60}) {
+    for (const int32_t side : {480, 240, 120, 60}) {
         thumbnails.push_back(thumbnail(photo, side));
         const std::string name = "thumbnail-" + std::to_string(side);
         page.link(thumbnails.back(), name + ".png");

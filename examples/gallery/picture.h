@@ -4,8 +4,8 @@
 #ifndef GALLERY_PICTURE_H
 #define GALLERY_PICTURE_H
 
-#include "imageUtil.h"
-#include "raster.h"
+#include <quillon/imageUtil.h>
+#include <quillon/raster.h>
 
 #include <string>
 #include <string_view>
@@ -13,7 +13,7 @@
 
 namespace gallery {
 
-inline constexpr uint32 kWhite = 0xFFFFFFFF, kInk = 0xFF1F2A36, kPale = 0xFFE4E9EE,
+inline constexpr uint32_t kWhite = 0xFFFFFFFF, kInk = 0xFF1F2A36, kPale = 0xFFE4E9EE,
                         kBlue = 0xFF2F6690, kOrange = 0xFFE8590C;
 
 // Whatever goes wrong ends the program with a message.
@@ -35,12 +35,12 @@ public:
     ~Picture() { ImageUtil_FreeImageData(&image); }
 
     const ImageInfo &info() const { return image; }
-    int32 width() const { return static_cast<int32>(image.width); }
-    int32 height() const { return static_cast<int32>(image.height); }
+    int32_t width() const { return static_cast<int32_t>(image.width); }
+    int32_t height() const { return static_cast<int32_t>(image.height); }
     // What the raster functions call a surface.
-    uint8 *data() const { return image.data; }
-    int32 step() const { return static_cast<int32>(image.bytesPerLine); }
-    uint8 *at(int32 x, int32 y) const {
+    uint8_t *data() const { return image.data; }
+    int32_t step() const { return static_cast<int32_t>(image.bytesPerLine); }
+    uint8_t *at(int32_t x, int32_t y) const {
         return image.data + ptrdiff_t{y} * step() + ptrdiff_t{x} * 4;
     }
     Rect bounds() const { return {0, 0, width(), height()}; }
@@ -51,42 +51,42 @@ private:
 
 // Positions and sizes are signed here, so that one can calculate with them; most
 // of the library takes them unsigned.
-constexpr uint32 natural(int32 value) {
-    return static_cast<uint32>(value);
+constexpr uint32_t natural(int32_t value) {
+    return static_cast<uint32_t>(value);
 }
 
 // The rectangle of a corner and a size.
-Rect area(int32 x, int32 y, int32 width, int32 height);
+Rect area(int32_t x, int32_t y, int32_t width, int32_t height);
 
-Picture blank(int32 width, int32 height, uint32 colour);
+Picture blank(int32_t width, int32_t height, uint32_t colour);
 // A PNG of any kind the library reads, whether it has alpha or a palette.
 Picture read(const std::string &fileName);
 
 // Drawing.  The library does not clip; here, drawing past an edge is a failure.
-void fill(Picture &ground, const Rect &part, uint32 colour);
+void fill(Picture &ground, const Rect &part, uint32_t colour);
 // A frame of the given thickness, just inside the rectangle.
-void outline(Picture &ground, const Rect &part, uint32 colour, int32 thickness = 1);
-void paste(Picture &ground, const Picture &top, int32 x, int32 y);
+void outline(Picture &ground, const Rect &part, uint32_t colour, int32_t thickness = 1);
+void paste(Picture &ground, const Picture &top, int32_t x, int32_t y);
 // By alpha; top is premultiplied.
-void blend(Picture &ground, const Picture &top, int32 x, int32 y);
+void blend(Picture &ground, const Picture &top, int32_t x, int32_t y);
 Picture premultiplied(const Picture &picture);
 
 // A line of text, every pixel of its box written, and one with only the letters.
-void write(Picture &ground, int32 x, int32 y, std::string_view text, uint32 ink, uint32 paper);
-void stencil(Picture &ground, int32 x, int32 y, std::string_view text, uint32 ink);
-int32 textWidth(std::string_view text);
+void write(Picture &ground, int32_t x, int32_t y, std::string_view text, uint32_t ink, uint32_t paper);
+void stencil(Picture &ground, int32_t x, int32_t y, std::string_view text, uint32_t ink);
+int32_t textWidth(std::string_view text);
 
 // Parts and sizes.
 Picture copyOf(const Picture &source);
 Picture partOf(const Picture &source, const Rect &part);
-Picture resized(const Picture &source, int32 width, int32 height);
+Picture resized(const Picture &source, int32_t width, int32_t height);
 // Every pixel a square of factor by factor.
-Picture zoomed(const Picture &source, int32 factor);
+Picture zoomed(const Picture &source, int32_t factor);
 // As much of a picture as has the proportions of the given size, in that size.
-Picture covering(const Picture &source, int32 width, int32 height);
+Picture covering(const Picture &source, int32_t width, int32_t height);
 // A part of at most the given size, around the point that divides the width by
 // the golden section: that is where pictures have their subject.
-Rect subject(const Picture &source, int32 width, int32 height);
+Rect subject(const Picture &source, int32_t width, int32_t height);
 
 } // namespace gallery
 

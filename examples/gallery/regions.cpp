@@ -6,10 +6,10 @@ namespace gallery {
 
 namespace {
 
-constexpr int32 kWidth = 168, kHeight = 128;
+constexpr int32_t kWidth = 168, kHeight = 128;
 
 // The entries of a list, and the rectangle that was last added or cut.
-Picture drawn(const RasterRectList &list, const Rect &last, uint32 colour) {
+Picture drawn(const RasterRectList &list, const Rect &last, uint32_t colour) {
     Picture picture = blank(kWidth, kHeight, kPale);
     for (const RasterRectListEntry &entry : list.entries) {
         if (entry.width < 1)
@@ -33,23 +33,23 @@ std::string countOf(const RasterRectList &list) {
 class Story {
 public:
     explicit Story(Sheet &sheetToFill) : sheet(sheetToFill) {}
-    void add(int32 x, int32 y, int32 width, int32 height) {
-        const uint32 pixels = Raster_AddRect(&list, x, y, width, height);
+    void add(int32_t x, int32_t y, int32_t width, int32_t height) {
+        const uint32_t pixels = Raster_AddRect(&list, x, y, width, height);
         tell("added: ", pixels, area(x, y, width, height), kOrange);
     }
-    void cut(int32 x, int32 y, int32 width, int32 height) {
-        const uint32 pixels = Raster_SubRect(&list, x, y, width, height);
+    void cut(int32_t x, int32_t y, int32_t width, int32_t height) {
+        const uint32_t pixels = Raster_SubRect(&list, x, y, width, height);
         tell("cut: ", pixels, area(x, y, width, height), kInk);
     }
     // Squares without a tile of their own.
-    void scatter(int32 count) {
+    void scatter(int32_t count) {
         Raster_ClearRectList(&list);
-        for (int32 i = 0; i < count; ++i)
+        for (int32_t i = 0; i < count; ++i)
             Raster_AddRect(&list, 8 + i % 5 * 32, 8 + i / 5 * 32 + i % 2 * 6, 20, 20);
     }
 
 private:
-    void tell(const char *what, uint32 pixels, const Rect &last, uint32 colour) {
+    void tell(const char *what, uint32_t pixels, const Rect &last, uint32_t colour) {
         sheet.add(drawn(list, last, colour),
                   what + countOf(list) + "\n" + std::to_string(pixels) + " pixels");
     }

@@ -8,9 +8,9 @@ namespace gallery {
 
 namespace {
 
-enum Filter : uint32 { kNearest = 0, kFiltered = 1 };
+enum Filter : uint32_t { kNearest = 0, kFiltered = 1 };
 
-Picture scaled(const Picture &source, int32 width, int32 height, Filter filter) {
+Picture scaled(const Picture &source, int32_t width, int32_t height, Filter filter) {
     Picture result = blank(width, height, 0);
     const Rect all = result.bounds();
     if (!Raster_Scale(result.data(), result.step(), result.info().width, result.info().height,
@@ -24,11 +24,11 @@ Picture scaled(const Picture &source, int32 width, int32 height, Filter filter) 
 
 // Spokes that grow finer towards the middle: what cannot be shown in fewer
 // pixels should turn grey.
-Picture spokes(int32 size) {
+Picture spokes(int32_t size) {
     Picture picture = blank(size, size, kWhite);
     const double middle = (size - 1) / 2.0;
-    for (int32 y = 0; y < size; ++y)
-        for (int32 x = 0; x < size; ++x) {
+    for (int32_t y = 0; y < size; ++y)
+        for (int32_t x = 0; x < size; ++x) {
             const double dx = x - middle, dy = y - middle;
             if (std::hypot(dx, dy) < middle && std::sin(std::atan2(dy, dx) * 36) > 0)
                 fill(picture, area(x, y, 1, 1), kInk);
@@ -38,8 +38,8 @@ Picture spokes(int32 size) {
 
 // A large picture as it was, then reduced to a quarter of the given size and
 // enlarged again so that its pixels can be seen.
-void addReductions(Sheet &sheet, const Picture &source, int32 width, int32 height) {
-    constexpr int32 kZoom = 4;
+void addReductions(Sheet &sheet, const Picture &source, int32_t width, int32_t height) {
+    constexpr int32_t kZoom = 4;
     sheet.add(covering(source, width, height), "for comparison");
     for (const Filter filter : {kNearest, kFiltered})
         sheet.add(zoomed(scaled(source, width / kZoom, height / kZoom, filter), kZoom),
@@ -48,7 +48,7 @@ void addReductions(Sheet &sheet, const Picture &source, int32 width, int32 heigh
 }
 
 // Which pixels of an enlargement change when a part of the source does.
-void addDamage(Sheet &sheet, const Picture &source, int32 factor) {
+void addDamage(Sheet &sheet, const Picture &source, int32_t factor) {
     Rect part = area(source.width() / 2 - 6, source.height() / 2 - 4, 8, 6);
     Picture small = copyOf(source);
     fill(small, part, kOrange);
@@ -65,7 +65,7 @@ void showScaling(Page &page, const Material &material) {
     page.room("Scaling", "`Raster_Scale` has two ways: the nearest sample, or filtered, which "
                          "interpolates where a picture grows and averages where it shrinks.");
 
-    constexpr int32 kFactor = 8;
+    constexpr int32_t kFactor = 8;
     const Picture detail =
         covering(partOf(material.photo, subject(material.photo, 129, 87)), 43, 29);
     Sheet up(2);

@@ -8,18 +8,18 @@
 namespace gallery {
 
 namespace {
-constexpr int32 kColumnGap = 16, kRowGap = 18, kLabelGap = 5, kLinePitch = kGlyphHeight + 2;
+constexpr int32_t kColumnGap = 16, kRowGap = 18, kLabelGap = 5, kLinePitch = kGlyphHeight + 2;
 } // namespace
 
-int32 Sheet::Tile::width() const {
-    int32 widest = picture.width();
+int32_t Sheet::Tile::width() const {
+    int32_t widest = picture.width();
     for (const std::string &line : label)
         widest = std::max(widest, textWidth(line));
     return widest;
 }
 
-int32 Sheet::Tile::height() const {
-    return picture.height() + kLabelGap + static_cast<int32>(label.size()) * kLinePitch;
+int32_t Sheet::Tile::height() const {
+    return picture.height() + kLabelGap + static_cast<int32_t>(label.size()) * kLinePitch;
 }
 
 void Sheet::add(Picture picture, const std::string &label) {
@@ -31,24 +31,24 @@ void Sheet::add(Picture picture, const std::string &label) {
 }
 
 Picture Sheet::drawn() const {
-    std::vector<int32> widths(std::min(columnCount, tiles.size()));
-    std::vector<int32> heights((tiles.size() + columnCount - 1) / columnCount);
+    std::vector<int32_t> widths(std::min(columnCount, tiles.size()));
+    std::vector<int32_t> heights((tiles.size() + columnCount - 1) / columnCount);
     for (size_t i = 0; i < tiles.size(); ++i) {
-        int32 &width = widths[i % columnCount], &height = heights[i / columnCount];
+        int32_t &width = widths[i % columnCount], &height = heights[i / columnCount];
         width = std::max(width, tiles[i].width());
         height = std::max(height, tiles[i].height());
     }
     // The gaps between columns and rows, one less than there are of these.
-    const auto total = [](const std::vector<int32> &sizes, int32 gap) {
+    const auto total = [](const std::vector<int32_t> &sizes, int32_t gap) {
         return std::accumulate(sizes.begin(), sizes.end(), -gap,
-                               [gap](int32 sum, int32 size) { return sum + size + gap; });
+                               [gap](int32_t sum, int32_t size) { return sum + size + gap; });
     };
     Picture sheet = blank(total(widths, kColumnGap), total(heights, kRowGap), kWhite);
 
-    int32 x = 0, y = 0;
+    int32_t x = 0, y = 0;
     for (size_t i = 0; i < tiles.size(); ++i) {
         paste(sheet, tiles[i].picture, x, y);
-        int32 line = y + tiles[i].picture.height() + kLabelGap;
+        int32_t line = y + tiles[i].picture.height() + kLabelGap;
         for (const std::string &text : tiles[i].label) {
             write(sheet, x, line, text, kInk, kWhite);
             line += kLinePitch;

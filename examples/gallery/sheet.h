@@ -21,8 +21,8 @@ private:
         Picture picture;
         std::vector<std::string> label;
 
-        int32 width() const;
-        int32 height() const;
+        int32_t width() const;
+        int32_t height() const;
     };
     size_t columnCount;
     std::vector<Tile> tiles;

@@ -8,11 +8,11 @@ namespace gallery {
 namespace {
 
 Picture allGlyphs() {
-    constexpr int32 kColumns = 32, kRows = 3, kPitch = kGlyphHeight + 3;
+    constexpr int32_t kColumns = 32, kRows = 3, kPitch = kGlyphHeight + 3;
     Picture table = blank(kColumns * kGlyphWidth + 8, kRows * kPitch + 5, kPale);
-    for (int32 row = 0; row < kRows; ++row) {
+    for (int32_t row = 0; row < kRows; ++row) {
         std::string line;
-        for (int32 c = kFirstGlyph + row * kColumns; c <= kLastGlyph; ++c)
+        for (int32_t c = kFirstGlyph + row * kColumns; c <= kLastGlyph; ++c)
             if (line.size() < kColumns)
                 line += static_cast<char>(c);
         write(table, 4, 4 + row * kPitch, line, kInk, kPale);
@@ -20,11 +20,11 @@ Picture allGlyphs() {
     return table;
 }
 
-using Lettering = void (*)(Picture &, int32 x, int32 y);
+using Lettering = void (*)(Picture &, int32_t x, int32_t y);
 
 Picture lettered(const Picture &photo, Lettering lettering) {
     Picture picture = covering(photo, 172, 116);
-    for (int32 line = 0; line < 3; ++line)
+    for (int32_t line = 0; line < 3; ++line)
         lettering(picture, 10, 18 + line * 32);
     return zoomed(picture, 2);
 }
@@ -39,12 +39,12 @@ void showText(Page &page, const Material &material) {
 
     Sheet ways(2);
     ways.add(lettered(material.photo,
-                      [](Picture &picture, int32 x, int32 y) {
+                      [](Picture &picture, int32_t x, int32_t y) {
                           write(picture, x, y, " Sphinx of quartz ", kInk, 0xFFFFF3B0);
                       }),
              "opaque");
     ways.add(lettered(material.photo,
-                      [](Picture &picture, int32 x, int32 y) {
+                      [](Picture &picture, int32_t x, int32_t y) {
                           stencil(picture, x + 1, y + 1, " Sphinx of quartz ", kInk);
                           stencil(picture, x, y, " Sphinx of quartz ", kWhite);
                       }),

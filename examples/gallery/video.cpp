@@ -10,41 +10,41 @@ namespace gallery {
 
 namespace {
 
-constexpr int32 kWidth = 224, kHeight = 150; // even, as frames are
+constexpr int32_t kWidth = 224, kHeight = 150; // even, as frames are
 
 struct Yuv {
-    uint8 y, u, v;
+    uint8_t y, u, v;
 };
 
 // The mean of a block of pixels, as video has it: luma from 16 to 235, and the
 // differences of blue (u) and red (v) around 128.
-Yuv yuvOf(const Picture &picture, int32 x, int32 y, int32 columns, int32 rows) {
-    int32 red = 0, green = 0, blue = 0;
-    for (int32 row = y; row < y + rows; ++row)
-        for (int32 column = x; column < x + columns; ++column) {
-            const uint8 *pixel = picture.at(column, row);
+Yuv yuvOf(const Picture &picture, int32_t x, int32_t y, int32_t columns, int32_t rows) {
+    int32_t red = 0, green = 0, blue = 0;
+    for (int32_t row = y; row < y + rows; ++row)
+        for (int32_t column = x; column < x + columns; ++column) {
+            const uint8_t *pixel = picture.at(column, row);
             blue += pixel[0];
             green += pixel[1];
             red += pixel[2];
         }
-    const int32 whole = 256 * columns * rows;
-    const auto part = [whole](int32 base, int32 sum) {
-        return static_cast<uint8>((base * whole + sum + whole / 2) / whole);
+    const int32_t whole = 256 * columns * rows;
+    const auto part = [whole](int32_t base, int32_t sum) {
+        return static_cast<uint8_t>((base * whole + sum + whole / 2) / whole);
     };
     return {part(16, 66 * red + 129 * green + 25 * blue),
             part(128, -38 * red - 74 * green + 112 * blue),
             part(128, 112 * red - 94 * green - 18 * blue)};
 }
 
-using Frame = std::vector<uint8>;
+using Frame = std::vector<uint8_t>;
 
 // Two pixels in four bytes; lumaAt is 0 for YUY2, 1 for UYVY.
 Frame packedFrame(const Picture &picture, size_t lumaAt, bool exchanged) {
     Frame frame;
-    for (int32 y = 0; y < kHeight; ++y)
-        for (int32 x = 0; x < kWidth; x += 2) {
+    for (int32_t y = 0; y < kHeight; ++y)
+        for (int32_t x = 0; x < kWidth; x += 2) {
             const Yuv both = yuvOf(picture, x, y, 2, 1);
-            uint8 four[4];
+            uint8_t four[4];
             four[lumaAt] = yuvOf(picture, x, y, 1, 1).y;
             four[lumaAt + 2] = yuvOf(picture, x + 1, y, 1, 1).y;
             four[1 - lumaAt] = exchanged ? both.v : both.u;
@@ -57,11 +57,11 @@ Frame packedFrame(const Picture &picture, size_t lumaAt, bool exchanged) {
 // A plane of luma, then V and U in half the width and height.
 Frame planarFrame(const Picture &picture) {
     Frame frame, uPlane;
-    for (int32 y = 0; y < kHeight; ++y)
-        for (int32 x = 0; x < kWidth; ++x)
+    for (int32_t y = 0; y < kHeight; ++y)
+        for (int32_t x = 0; x < kWidth; ++x)
             frame.push_back(yuvOf(picture, x, y, 1, 1).y);
-    for (int32 y = 0; y < kHeight; y += 2)
-        for (int32 x = 0; x < kWidth; x += 2) {
+    for (int32_t y = 0; y < kHeight; y += 2)
+        for (int32_t x = 0; x < kWidth; x += 2) {
             const Yuv four = yuvOf(picture, x, y, 2, 2);
             frame.push_back(four.v);
             uPlane.push_back(four.u);
@@ -70,15 +70,15 @@ Frame planarFrame(const Picture &picture) {
     return frame;
 }
 
-Picture converted(const Frame &frame, uint32 format, int32 depth) {
-    const auto bytes = static_cast<uint32>((depth + 7) / 8);
-    std::vector<uint8> pixels(size_t{kWidth} * kHeight * bytes);
+Picture converted(const Frame &frame, uint32_t format, int32_t depth) {
+    const auto bytes = static_cast<uint32_t>((depth + 7) / 8);
+    std::vector<uint8_t> pixels(size_t{kWidth} * kHeight * bytes);
     Raster_YUVtoRGB(frame.data(), pixels.data(), kWidth, kHeight, format, depth);
     // Depth 15 comes out one bit higher than the other functions have it.
     for (size_t i = 0; depth == 15 && i < pixels.size(); i += 2) {
-        uint16 pixel = 0;
+        uint16_t pixel = 0;
         std::memcpy(&pixel, &pixels[i], 2);
-        pixel = static_cast<uint16>(pixel >> 1);
+        pixel = static_cast<uint16_t>(pixel >> 1);
         std::memcpy(&pixels[i], &pixel, 2);
     }
     Picture picture = blank(kWidth, kHeight, 0);
@@ -95,16 +95,16 @@ void exchangeRedAndBlue(Picture &picture) {
 
 Picture pixelByPixel(const Picture &picture) {
     Picture result = blank(kWidth, kHeight, 0);
-    for (int32 y = 0; y < kHeight; ++y)
-        for (int32 x = 0; x < kWidth; ++x) {
+    for (int32_t y = 0; y < kHeight; ++y)
+        for (int32_t x = 0; x < kWidth; ++x) {
             const Yuv yuv = yuvOf(picture, x, y, 1, 1);
             fill(result, area(x, y, 1, 1), RasterRGB_YUVtoBGRX(yuv.y, yuv.u, yuv.v));
         }
     return result;
 }
 
-constexpr uint32 kKey = 0xFFFF00FF;
-constexpr int32 kTitle = 20;
+constexpr uint32_t kKey = 0xFFFF00FF;
+constexpr int32_t kTitle = 20;
 
 // A desktop with a player, whose screen is of the key colour, and in front of it
 // a note.
@@ -138,7 +138,7 @@ void showVideo(Page &page, const Material &material) {
     sheet.add(converted(packedFrame(photo, 0, false), RASTER_VIDEO_YUY2, 32), "YUY2, depth 32");
     sheet.add(converted(packedFrame(photo, 1, false), RASTER_VIDEO_UYVY, 32), "UYVY, depth 32");
     sheet.add(converted(planar, RASTER_VIDEO_YV12, 32), "YV12, depth 32");
-    for (const int32 depth : {24, 16, 15})
+    for (const int32_t depth : {24, 16, 15})
         sheet.add(converted(planar, RASTER_VIDEO_YV12, depth),
                   "YV12, depth " + std::to_string(depth));
     page.show(sheet.drawn(), "video-formats",

@@ -6,7 +6,7 @@
 //
 // Rays go from the eye through the picture, against a landscape of noise, and are
 // thrown back once by the water.  Lengths are metres: x to the right, y up, z away.
-#include "imageUtil.h"
+#include <quillon/imageUtil.h>
 
 #include <algorithm>
 #include <cmath>
@@ -356,11 +356,11 @@ std::vector<float> drawReeds() {
     return shade;
 }
 
-uint8 toByte(float light) {
+uint8_t toByte(float light) {
     // A soft shoulder, the display's curve, and some contrast.
     const float toned = std::clamp(1.2F * light / (1 + 0.3F * light), 0.0F, 1.0F);
     const float shown = std::pow(toned, 1 / 2.2F);
-    return static_cast<uint8>(std::lround(255 * std::lerp(shown, smoothstep(0, 1, shown), 0.5F)));
+    return static_cast<uint8_t>(std::lround(255 * std::lerp(shown, smoothstep(0, 1, shown), 0.5F)));
 }
 
 } // namespace
@@ -368,7 +368,7 @@ uint8 toByte(float light) {
 int main(int argc, char **argv) {
     if (argc != 2)
         return 2;
-    std::vector<uint8> pixels;
+    std::vector<uint8_t> pixels;
     pixels.reserve(size_t{kWidth} * kHeight * 3);
     const std::vector<float> reeds = drawReeds();
 

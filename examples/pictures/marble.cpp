@@ -3,7 +3,7 @@
 // through.  Colours are not premultiplied, as PNG has it.
 //
 //     marble marble.png
-#include "imageUtil.h"
+#include <quillon/imageUtil.h>
 
 #include <algorithm>
 #include <cmath>
@@ -71,8 +71,8 @@ Colour pixelAt(float x, float y) {
     return over(marble, shadow);
 }
 
-uint8 toByte(float channel) {
-    return static_cast<uint8>(std::lround(255 * std::clamp(channel, 0.0F, 1.0F)));
+uint8_t toByte(float channel) {
+    return static_cast<uint8_t>(std::lround(255 * std::clamp(channel, 0.0F, 1.0F)));
 }
 
 } // namespace
@@ -80,7 +80,7 @@ uint8 toByte(float channel) {
 int main(int argc, char **argv) {
     if (argc != 2)
         return 2;
-    std::vector<uint8> pixels;
+    std::vector<uint8_t> pixels;
     for (int y = 0; y < kSize; ++y) {
         for (int x = 0; x < kSize; ++x) {
             const Colour c = pixelAt(static_cast<float>(x) + 0.5F, static_cast<float>(y) + 0.5F);

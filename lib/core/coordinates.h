@@ -1,8 +1,8 @@
-// Arithmetic on int32 coordinates whose results may leave int32: they either
+// Arithmetic on int32_t coordinates whose results may leave int32_t: they either
 // wrap or stop at the limits, and neither is left to undefined behaviour.
 #pragma once
 
-#include "quillonTypes.h"
+#include <cstdint>
 
 #include <algorithm>
 #include <cstdint>
@@ -10,23 +10,23 @@
 
 namespace quillon {
 
-inline constexpr int32 kCoordinateMin = std::numeric_limits<int32>::min();
-inline constexpr int32 kCoordinateMax = std::numeric_limits<int32>::max();
+inline constexpr int32_t kCoordinateMin = std::numeric_limits<int32_t>::min();
+inline constexpr int32_t kCoordinateMax = std::numeric_limits<int32_t>::max();
 
-inline int32 wrappingAdd(int32 a, int32 b) {
-    return static_cast<int32>(static_cast<uint32>(a) + static_cast<uint32>(b));
+inline int32_t wrappingAdd(int32_t a, int32_t b) {
+    return static_cast<int32_t>(static_cast<uint32_t>(a) + static_cast<uint32_t>(b));
 }
 
-inline int32 wrappingSubtract(int32 a, int32 b) {
-    return static_cast<int32>(static_cast<uint32>(a) - static_cast<uint32>(b));
+inline int32_t wrappingSubtract(int32_t a, int32_t b) {
+    return static_cast<int32_t>(static_cast<uint32_t>(a) - static_cast<uint32_t>(b));
 }
 
-inline int32 saturate(int64_t value) {
-    return static_cast<int32>(std::clamp<int64_t>(value, kCoordinateMin, kCoordinateMax));
+inline int32_t saturate(int64_t value) {
+    return static_cast<int32_t>(std::clamp<int64_t>(value, kCoordinateMin, kCoordinateMax));
 }
 
 // Stores value, stopped at the limits; true when it did not have to be.
-inline bool storeSaturated(int32 &dst, int64_t value) {
+inline bool storeSaturated(int32_t &dst, int64_t value) {
     dst = saturate(value);
     return dst == value;
 }

@@ -113,11 +113,11 @@ double Extended::toDouble() const {
     return negative_ ? -magnitude : magnitude;
 }
 
-uint32 Extended::truncated() const {
+uint32_t Extended::truncated() const {
     if (exponent_ <= -64 || exponent_ >= 32)
         return 0;
     const uint64_t whole = exponent_ < 0 ? significand_ >> -exponent_ : significand_ << exponent_;
-    return static_cast<uint32>(negative_ ? 0 - whole : whole);
+    return static_cast<uint32_t>(negative_ ? 0 - whole : whole);
 }
 
 } // namespace quillon

@@ -11,7 +11,7 @@
 // counts as 2^1024) and no NaN; zero has no sign.
 #pragma once
 
-#include "quillonTypes.h"
+#include <cstdint>
 
 #include <cstdint>
 
@@ -21,11 +21,11 @@ class Extended {
 public:
     // All exact.
     explicit Extended(double value); // no NaN
-    explicit Extended(uint32 value) : Extended(normalised(false, 0, value)) {}
-    explicit Extended(int32 value)
+    explicit Extended(uint32_t value) : Extended(normalised(false, 0, value)) {}
+    explicit Extended(int32_t value)
         : Extended(normalised(value < 0, 0,
-                              value < 0 ? 0 - static_cast<uint32>(value)
-                                        : static_cast<uint32>(value))) {}
+                              value < 0 ? 0 - static_cast<uint32_t>(value)
+                                        : static_cast<uint32_t>(value))) {}
 
     friend Extended operator+(Extended a, Extended b);
     friend Extended operator-(Extended a, Extended b) { return a + b.negated(); }
@@ -40,7 +40,7 @@ public:
 
     // Truncated towards zero; of the whole number the low 32 bits, in two's
     // complement.
-    uint32 truncated() const;
+    uint32_t truncated() const;
 
 private:
     using Wide = unsigned __int128;
@@ -68,7 +68,7 @@ private:
 
 // A quotient of sizes as a double, rounded at 64 bits on its way.
 // The denominator must not be 0.
-inline double extendedQuotient(uint32 numerator, uint32 denominator) {
+inline double extendedQuotient(uint32_t numerator, uint32_t denominator) {
     return (Extended(numerator) / Extended(denominator)).toDouble();
 }
 

@@ -2,49 +2,74 @@
 // the entries hand a rectangle to a kernel.
 #pragma once
 
-#include "quillonTypes.h"
-
 #include <cstddef>
 #include <cstdint>
 
 namespace quillon {
 
-struct Size {
-    size_t width; // in whatever unit the kernel counts: pixels, or bytes
-    size_t height;
+constexpr bool isPixelSize(int32_t bytesPerPixel) {
+    return bytesPerPixel >= 1 && bytesPerPixel <= 4;
+}
+
+// The size of a rectangle in pixels.
+struct Extent {
+    size_t width, height;
 
     bool empty() const { return width == 0 || height == 0; }
 };
 
-// A pointer moved by a distance in bytes.  In whole addresses, because an
-// argument that is never followed (the corner of an empty rectangle) may lead
-// anywhere, and pointer arithmetic that leaves its object is undefined.
+// The size of a rectangle whose rows are rows of bytes.
+struct ByteExtent {
+    size_t rowBytes, height;
+};
+
+constexpr ByteExtent inBytes(Extent extent, int32_t bytesPerPixel) {
+    return {extent.width * static_cast<size_t>(bytesPerPixel), extent.height};
+}
+
+// A pointer moved by a distance in bytes, computed on integers: the corner of an
+// empty rectangle may lie anywhere, and pointer arithmetic that leaves its object
+// is undefined even where the pointer is never followed.
 template <class Byte>
 Byte *advance(Byte *pointer, uint64_t bytes) {
     return reinterpret_cast<Byte *>(reinterpret_cast<uintptr_t>(pointer) + bytes);
 }
 
-// The address of pixel (x, y).  At 64 bits: y * lineIncrement alone can pass 32.
-// Unsigned, so that a negative increment wraps to the right address.
+// The address of pixel (x, y).  At 64 bits: y * stride alone can pass 32.
+// Unsigned, so that a negative stride wraps to the right address.
 template <class Byte>
-Byte *pixelAddress(Byte *buffer, int64_t lineIncrement, int64_t bytesPerPixel, uint64_t x,
-                   uint64_t y) {
-    return advance(buffer, y * static_cast<uint64_t>(lineIncrement) +
-                               x * static_cast<uint64_t>(bytesPerPixel));
+Byte *pixelAddress(Byte *buffer, int64_t stride, int64_t bytesPerPixel, uint64_t x, uint64_t y) {
+    return advance(buffer,
+                   y * static_cast<uint64_t>(stride) + x * static_cast<uint64_t>(bytesPerPixel));
 }
 
 // The rows of a rectangle: its first pixel, and the bytes from row to row.
 template <class Byte>
 struct Rows {
     Byte *first;
-    ptrdiff_t step;
+    ptrdiff_t stride;
 
-    Byte *row(size_t index) const { return advance(first, index * static_cast<size_t>(step)); }
+    Byte *row(size_t index) const { return advance(first, index * static_cast<size_t>(stride)); }
 };
-using DstRows = Rows<uint8>;
-using SrcRows = Rows<const uint8>;
+using DstRows = Rows<uint8_t>;
+using SrcRows = Rows<const uint8_t>;
 
-// The addresses of a rectangle, from its lowest byte up to behind its highest one.
+// Whether each row begins where the one before ends.  Rows that overlap do not
+// count: they must be walked in their order.
+template <class Byte>
+bool areContiguous(const Rows<Byte> &rows, size_t rowBytes) {
+    return static_cast<ptrdiff_t>(rowBytes) == rows.stride;
+}
+
+// The extent of contiguous rows taken as one long row.
+constexpr Extent asOneRow(Extent extent) {
+    return {extent.width * extent.height, 1};
+}
+constexpr ByteExtent asOneRow(ByteExtent extent) {
+    return {extent.rowBytes * extent.height, 1};
+}
+
+// The addresses from the lowest byte of a rectangle up to behind its highest one.
 struct AddressRange {
     uintptr_t begin, end;
 
@@ -54,30 +79,23 @@ struct AddressRange {
 };
 
 template <class Byte>
-AddressRange addressesOf(const Rows<Byte> &rows, size_t rowBytes, size_t height) {
+AddressRange addressesOf(const Rows<Byte> &rows, ByteExtent extent) {
     const auto top = reinterpret_cast<uintptr_t>(rows.first);
-    const uintptr_t bottom = top + (height - 1) * static_cast<uintptr_t>(rows.step);
-    return rows.step < 0 ? AddressRange{bottom, top + rowBytes}
-                         : AddressRange{top, bottom + rowBytes};
+    const uintptr_t bottom = top + (extent.height - 1) * static_cast<uintptr_t>(rows.stride);
+    return rows.stride < 0 ? AddressRange{bottom, top + extent.rowBytes}
+                           : AddressRange{top, bottom + extent.rowBytes};
 }
 
-// A line increment rounded down (towards minus infinity) to whole pixels of 2
-// or 4 bytes.  Pixels of 1 and 3 bytes step exactly.
-inline int64_t wholePixels(int64_t lineIncrement, int32 bytesPerPixel) {
-    const bool isUnit = bytesPerPixel == 2 || bytesPerPixel == 4;
-    return isUnit ? lineIncrement & -int64_t{bytesPerPixel} : lineIncrement;
+// Whether two rectangles have bytes in common, or lie between each other's rows.
+inline bool rowsOverlap(DstRows dst, SrcRows src, ByteExtent extent) {
+    return addressesOf(dst, extent).overlaps(addressesOf(src, extent));
 }
 
-// Rows that lie end to end are one long row.  Only an exact fit counts: rows
-// that overlap must be walked in their order.
-inline Size joinedRows(Size size, size_t rowBytes, ptrdiff_t step) {
-    return static_cast<ptrdiff_t>(rowBytes) == step ? Size{size.width * size.height, 1} : size;
-}
-
-inline Size joinedRows(Size size, size_t dstRowBytes, ptrdiff_t dstStep, size_t srcRowBytes,
-                       ptrdiff_t srcStep) {
-    return static_cast<ptrdiff_t>(srcRowBytes) == srcStep ? joinedRows(size, dstRowBytes, dstStep)
-                                                          : size;
+// A stride rounded down (towards minus infinity) to whole pixels of 2 or 4 bytes.
+// Pixels of 1 and 3 bytes step exactly.
+constexpr int64_t strideInWholePixels(int64_t stride, int32_t bytesPerPixel) {
+    const bool isWord = bytesPerPixel == 2 || bytesPerPixel == 4;
+    return isWord ? stride & -int64_t{bytesPerPixel} : stride;
 }
 
 } // namespace quillon

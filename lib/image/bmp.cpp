@@ -1,6 +1,7 @@
 // Writing BMP: 8-bit images with their palette, everything else at 24 bits.
 
-#include "imageRecord.h"
+#include <hearth/hearth.h>
+#include "image/imageRecord.h"
 
 #include <algorithm>
 #include <array>
@@ -11,14 +12,14 @@ using namespace quillon;
 
 namespace {
 
-constexpr uint32 kFileHeaderBytes = 14;
-constexpr uint32 kInfoHeaderBytes = 40;
-constexpr uint32 kHeaderBytes = kFileHeaderBytes + kInfoHeaderBytes;
+constexpr uint32_t kFileHeaderBytes = 14;
+constexpr uint32_t kInfoHeaderBytes = 40;
+constexpr uint32_t kHeaderBytes = kFileHeaderBytes + kInfoHeaderBytes;
 
 // The sizes of a file: 64 bits hold them while width and height are below 2^31.
 struct BmpLayout {
     bool hasPalette;
-    uint32 numColors;
+    uint32_t numColors;
     uint64_t rowBytes;
     uint64_t paletteBytes;
     uint64_t imageBytes;
@@ -51,20 +52,20 @@ bool isCopied(const ImageInfo &image) {
 // Stores little-endian fields one after another.
 class FieldWriter {
 public:
-    explicit FieldWriter(uint8 *out) : next(out) {}
-    void put16(uint32 value) { put(value, 2); }
+    explicit FieldWriter(uint8_t *out) : next(out) {}
+    void put16(uint32_t value) { put(value, 2); }
     void put32(uint64_t value) { put(value, 4); }
 
 private:
-    void put(uint64_t value, uint32 bytes) {
-        for (uint32 i = 0; i < bytes; ++i) {
-            *next++ = static_cast<uint8>(value >> (8 * i));
+    void put(uint64_t value, uint32_t bytes) {
+        for (uint32_t i = 0; i < bytes; ++i) {
+            *next++ = static_cast<uint8_t>(value >> (8 * i));
         }
     }
-    uint8 *next;
+    uint8_t *next;
 };
 
-using BmpHeaders = std::array<uint8, kHeaderBytes>;
+using BmpHeaders = std::array<uint8_t, kHeaderBytes>;
 
 BmpHeaders makeHeaders(const ImageInfo &image, const BmpLayout &layout) {
     BmpHeaders headers;
@@ -91,25 +92,25 @@ BmpHeaders makeHeaders(const ImageInfo &image, const BmpLayout &layout) {
 
 // One row of the file, without what follows the pixels.  Neither way reads behind
 // the end of the source row.  Gives the number of bytes.
-uint64_t fillRow(uint8 *fileRow, const BmpLayout &layout, const ImageInfo &image, uint32 row) {
-    const uint8 *const source = rowAt(image, row);
+uint64_t fillRow(uint8_t *fileRow, const BmpLayout &layout, const ImageInfo &image, uint32_t row) {
+    const uint8_t *const source = rowAt(image, row);
     if (isCopied(image)) {
         // With the source's padding, as far as the file's row has room for it.
         const uint64_t bytes = std::min<uint64_t>(layout.rowBytes, image.bytesPerLine);
         std::memcpy(fileRow, source, bytes);
         return bytes;
     }
-    const int32 depth = conversionDepth(image);
-    const uint32 width = std::min(image.width, image.bytesPerLine / bytesAtDepth(depth));
-    Raster_ConvertPixels(fileRow, static_cast<uint32>(layout.rowBytes), 24, source,
+    const int32_t depth = conversionDepth(image);
+    const uint32_t width = std::min(image.width, image.bytesPerLine / bytesAtDepth(depth));
+    Raster_ConvertPixels(fileRow, static_cast<uint32_t>(layout.rowBytes), 24, source,
                          image.bytesPerLine, depth, false, nullptr, 0, 0, 0, 0, width, 1);
     return uint64_t{width} * 3;
 }
 
-void fillRows(uint8 *block, const BmpLayout &layout, const ImageInfo &image) {
-    for (uint32 i = 0; i < image.height; ++i) {
-        const uint32 row = isBottomUp(image) ? i : image.height - 1 - i;
-        uint8 *const fileRow = block + i * layout.rowBytes;
+void fillRows(uint8_t *block, const BmpLayout &layout, const ImageInfo &image) {
+    for (uint32_t i = 0; i < image.height; ++i) {
+        const uint32_t row = isBottomUp(image) ? i : image.height - 1 - i;
+        uint8_t *const fileRow = block + i * layout.rowBytes;
         const uint64_t bytes = fillRow(fileRow, layout, image, row);
         std::memset(fileRow + bytes, 0, layout.rowBytes - bytes);
     }
@@ -127,7 +128,7 @@ bool ImageUtil_ConstructBMPBuffer(const ImageInfo *image, DynBuf *buffer) {
         return false;
     }
     const BmpHeaders headers = makeHeaders(*image, layout);
-    uint8 *const block = static_cast<uint8 *>(std::malloc(layout.imageBytes));
+    uint8_t *const block = static_cast<uint8_t *>(std::malloc(layout.imageBytes));
     if (block == nullptr) {
         return false;
     }

@@ -2,19 +2,18 @@
 // from one.
 #pragma once
 
-#include "imageUtil.h"
-#include "raster.h"
-#include "raster/pixelLayout.h"
+#include <hearth/hearth.h>
+#include <quillon/imageUtil.h>
+#include <quillon/raster.h>
+#include "convert/pixelFormats.h"
 
 #include <cstddef>
 #include <cstdint>
 
 namespace quillon {
 
-// The path that the messages of this room carry.
-inline constexpr char kImageUnit[] = "lib/image/imageUtil";
 
-inline constexpr uint32 kMaxColors = 256;
+inline constexpr uint32_t kMaxColors = 256;
 
 // Rows of images and files start at multiples of four bytes.
 constexpr uint64_t roundUpTo4(uint64_t bytes) {
@@ -22,19 +21,19 @@ constexpr uint64_t roundUpTo4(uint64_t bytes) {
 }
 
 // The single depth by which Raster_ConvertPixels knows the image's pixels.
-inline int32 conversionDepth(const ImageInfo &image) {
-    return image.bpp == 32 && image.depth == 24 ? 32 : static_cast<int32>(image.depth);
+inline int32_t conversionDepth(const ImageInfo &image) {
+    return image.bpp == 32 && image.depth == 24 ? 32 : static_cast<int32_t>(image.depth);
 }
 
 // The bytes of a pixel that Raster_ConvertPixels reads at a depth.
-constexpr uint32 bytesAtDepth(int32 depth) {
-    return static_cast<uint32>(bytesPerPixelOf(depth));
+constexpr uint32_t bytesAtDepth(int32_t depth) {
+    return static_cast<uint32_t>(bytesPerPixelOf(depth));
 }
 
 // True when Raster_ConvertPixels widens pixels of the depth.  Otherwise it is
 // called for nothing but its Warning and its Panic, so that those come while
 // the caller holds nothing yet that a Panic would leak.
-inline bool checkConvertible(int32 srcDepth, int32 dstDepth) {
+inline bool checkConvertible(int32_t srcDepth, int32_t dstDepth) {
     if (srcDepth == 15 || srcDepth == 16 || srcDepth == 24 || srcDepth == 32) {
         return true;
     }
@@ -47,7 +46,7 @@ inline bool isBottomUp(const ImageInfo &image) {
     return (image.flags & IMAGEUTIL_FLAG_BOTTOM_UP) != 0;
 }
 
-inline const uint8 *rowAt(const ImageInfo &image, uint32 row) {
+inline const uint8_t *rowAt(const ImageInfo &image, uint32_t row) {
     return image.data + size_t{row} * image.bytesPerLine;
 }
 

@@ -1,6 +1,7 @@
 // The image record, and image files: what reading, writing and composing share.
 
-#include "imageRecord.h"
+#include <hearth/hearth.h>
+#include "image/imageRecord.h"
 
 #include "core/failure.h"
 
@@ -53,7 +54,7 @@ bool ImageUtilWriteBuf(const DynBuf *buffer, const char *fileName) {
 
 } // namespace
 
-bool ImageUtil_WriteImage(const ImageInfo *image, const char *fileName, uint32 format) {
+bool ImageUtil_WriteImage(const ImageInfo *image, const char *fileName, uint32_t format) {
     DynBuf buffer = {};
     bool isEncoded = false;
     switch (format) {
@@ -64,7 +65,7 @@ bool ImageUtil_WriteImage(const ImageInfo *image, const char *fileName, uint32 f
         isEncoded = ImageUtil_ConstructBMPBuffer(image, &buffer);
         break;
     default:
-        panicNotImplemented(kImageUnit);
+        panicNotImplemented(kUnitImageUtil);
         return false;
     }
     const bool isWritten = isEncoded && ImageUtilWriteBuf(&buffer, fileName);

@@ -1,6 +1,7 @@
 // Reading PNG: which files are taken, and how libpng is asked for their pixels.
 
-#include "imageRecord.h"
+#include <hearth/hearth.h>
+#include "image/imageRecord.h"
 
 #include <algorithm>
 #include <csetjmp>
@@ -12,21 +13,21 @@ using namespace quillon;
 
 namespace {
 
-constexpr uint32 kSignatureBytes = 8;
+constexpr uint32_t kSignatureBytes = 8;
 
 // All that a decoding holds.  A libpng error jumps back over the frames between
 // without running destructors, so what has to be released is kept here, plain,
 // and outside the frame of the setjmp.
 struct PngReader {
     ImageInfo *image;
-    uint32 flags;
+    uint32_t flags;
     ImageUtilPngReadState *state;
     png_structp png;
     png_infop info;
     png_bytep *rows; // in the order of the file
 };
 
-bool openReader(PngReader &reader, const uint8 *buffer, uint32 size) {
+bool openReader(PngReader &reader, const uint8_t *buffer, uint32_t size) {
     reader.state =
         static_cast<ImageUtilPngReadState *>(UtilSafeCalloc0(1, sizeof(ImageUtilPngReadState)));
     if (reader.state == nullptr) {
@@ -55,8 +56,8 @@ void takePalette(const PngReader &reader) {
     png_colorp colors = nullptr;
     int count = 0;
     png_get_PLTE(reader.png, reader.info, &colors, &count);
-    image.numColors = std::min(static_cast<uint32>(count), kMaxColors);
-    for (uint32 i = 0; i < image.numColors; ++i) {
+    image.numColors = std::min(static_cast<uint32_t>(count), kMaxColors);
+    for (uint32_t i = 0; i < image.numColors; ++i) {
         image.palette[i] = ImageUtilColor{colors[i].blue, colors[i].green, colors[i].red, 0};
     }
 }
@@ -118,9 +119,9 @@ bool prepareRows(PngReader &reader) {
     if (bytesPerLine > UINT32_MAX / image.height) {
         return false; // the block would pass 4 GiB
     }
-    image.bytesPerLine = static_cast<uint32>(bytesPerLine);
+    image.bytesPerLine = static_cast<uint32_t>(bytesPerLine);
 
-    image.data = static_cast<uint8 *>(UtilSafeMalloc0(size_t{image.height} * image.bytesPerLine));
+    image.data = static_cast<uint8_t *>(UtilSafeMalloc0(size_t{image.height} * image.bytesPerLine));
     if (image.data == nullptr) {
         return false;
     }
@@ -132,8 +133,8 @@ bool prepareRows(PngReader &reader) {
     }
 
     const bool bottomUp = (reader.flags & IMAGEUTIL_READ_BOTTOM_UP) != 0;
-    for (uint32 i = 0; i < image.height; ++i) {
-        const uint32 row = bottomUp ? image.height - 1 - i : i;
+    for (uint32_t i = 0; i < image.height; ++i) {
+        const uint32_t row = bottomUp ? image.height - 1 - i : i;
         reader.rows[i] = image.data + size_t{row} * image.bytesPerLine;
     }
     return true;
@@ -154,7 +155,7 @@ bool decode(PngReader &reader) {
 
 // The bytes of a whole file, to be released with free; null when it cannot be
 // opened, sized or read, or is empty.
-uint8 *readFile(const char *fileName, uint32 *size) {
+uint8_t *readFile(const char *fileName, uint32_t *size) {
     FileIODescriptor file;
     FileIO_Invalidate(&file);
     if (FileIO_Open(&file, fileName, FILEIO_ACCESS_READ, FILEIO_OPEN) != 0) {
@@ -165,30 +166,30 @@ uint8 *readFile(const char *fileName, uint32 *size) {
         FileIO_Close(&file);
         return nullptr;
     }
-    const uint32 wanted = static_cast<uint32>(fileSize); // the low 32 bits
+    const uint32_t wanted = static_cast<uint32_t>(fileSize); // the low 32 bits
     size_t actual = 0;
-    uint8 *buffer = static_cast<uint8 *>(UtilSafeCalloc0(1, wanted));
+    uint8_t *buffer = static_cast<uint8_t *>(UtilSafeCalloc0(1, wanted));
     const bool isRead = buffer != nullptr && FileIO_Read(&file, buffer, wanted, &actual) == 0;
     FileIO_Close(&file);
     if (!isRead) {
         std::free(buffer);
         return nullptr;
     }
-    *size = static_cast<uint32>(actual);
+    *size = static_cast<uint32_t>(actual);
     return buffer;
 }
 
 } // namespace
 
-bool ImageUtil_ReadPNG(ImageInfo *image, const char *fileName, uint32 flags) {
-    uint32 size = 0;
-    uint8 *const buffer = readFile(fileName, &size);
+bool ImageUtil_ReadPNG(ImageInfo *image, const char *fileName, uint32_t flags) {
+    uint32_t size = 0;
+    uint8_t *const buffer = readFile(fileName, &size);
     const bool isRead = ImageUtil_ReadPNGBuffer(image, buffer, size, flags);
     std::free(buffer);
     return isRead;
 }
 
-bool ImageUtil_ReadPNGBuffer(ImageInfo *image, const uint8 *buffer, uint32 size, uint32 flags) {
+bool ImageUtil_ReadPNGBuffer(ImageInfo *image, const uint8_t *buffer, uint32_t size, uint32_t flags) {
     if (buffer == nullptr || image == nullptr || size == 0) {
         return false;
     }
@@ -202,11 +203,11 @@ bool ImageUtil_ReadPNGBuffer(ImageInfo *image, const uint8 *buffer, uint32 size,
     return isRead;
 }
 
-void ImageUtilReadPngCallback(png_structp png, uint8 *dest, size_t length) {
+void ImageUtilReadPngCallback(png_structp png, uint8_t *dest, size_t length) {
     auto *const state = static_cast<ImageUtilPngReadState *>(png_get_io_ptr(png));
     if (state->offset > state->size || length > state->size - state->offset) {
         png_error(png, "Unexpected end of data");
     }
     std::memcpy(dest, state->buffer + state->offset, length);
-    state->offset += static_cast<uint32>(length);
+    state->offset += static_cast<uint32_t>(length);
 }

@@ -1,6 +1,7 @@
 // Writing PNG: one encoder, whose stream and memory its two entries choose.
 
-#include "imageRecord.h"
+#include <hearth/hearth.h>
+#include "image/imageRecord.h"
 
 #include <algorithm>
 #include <array>
@@ -15,7 +16,7 @@ using namespace quillon;
 namespace {
 
 constexpr ImageUtilPngOptions kDefaultOptions = {.compressionLevel = -1, .stripAlpha = true};
-constexpr uint32 kBestCompression = 9;
+constexpr uint32_t kBestCompression = 9;
 
 // All that an encoding holds, plain and outside the frame of the setjmp: a
 // libpng error jumps back without running destructors.
@@ -28,7 +29,7 @@ struct PngWriter {
     png_structp png;
     png_infop info;
     png_bytep *rows;  // in the order of the file
-    uint8 *converted; // the pixels at 24 bits, where the image has them at 16
+    uint8_t *converted; // the pixels at 24 bits, where the image has them at 16
 };
 
 void *allocate(const PngWriter &writer, size_t size) {
@@ -47,9 +48,9 @@ bool needsConversion(const ImageInfo &image) {
 // Whether the image has pixels that can be read: a row must not be shorter than
 // its pixels.
 bool isReadable(const ImageInfo &image) {
-    uint32 bytesPerPixel = std::max(image.bpp / 8, 1u);
+    uint32_t bytesPerPixel = std::max(image.bpp / 8, 1u);
     if (needsConversion(image)) {
-        const int32 depth = conversionDepth(image);
+        const int32_t depth = conversionDepth(image);
         if (!checkConvertible(depth, 24)) {
             return false;
         }
@@ -88,7 +89,7 @@ void closeWriter(PngWriter &writer) {
 }
 
 int colorTypeOf(const PngWriter &writer) {
-    const uint32 bpp = writer.image->bpp;
+    const uint32_t bpp = writer.image->bpp;
     if (bpp <= 8) {
         return PNG_COLOR_TYPE_PALETTE;
     }
@@ -98,8 +99,8 @@ int colorTypeOf(const PngWriter &writer) {
 void setPalette(const PngWriter &writer) {
     const ImageInfo &image = *writer.image;
     std::array<png_color, kMaxColors> colors;
-    const uint32 count = std::min(image.numColors, kMaxColors);
-    for (uint32 i = 0; i < count; ++i) {
+    const uint32_t count = std::min(image.numColors, kMaxColors);
+    for (uint32_t i = 0; i < count; ++i) {
         const ImageUtilColor &color = image.palette[i];
         colors[i] = png_color{color.red, color.green, color.blue};
     }
@@ -112,8 +113,8 @@ void setHeader(const PngWriter &writer) {
     png_set_IHDR(writer.png, writer.info, writer.image->width, writer.image->height, 8,
                  colorTypeOf(writer), PNG_INTERLACE_NONE, PNG_COMPRESSION_TYPE_DEFAULT,
                  PNG_FILTER_TYPE_DEFAULT);
-    const int32 level = writer.options.compressionLevel;
-    if (static_cast<uint32>(level) <= kBestCompression) {
+    const int32_t level = writer.options.compressionLevel;
+    if (static_cast<uint32_t>(level) <= kBestCompression) {
         png_set_compression_level(writer.png, level);
     }
     png_set_bgr(writer.png);
@@ -125,20 +126,20 @@ void setHeader(const PngWriter &writer) {
 // The image's pixels at 24 bits, in rows of pitch bytes.
 bool convertPixels(PngWriter &writer, size_t pitch) {
     const ImageInfo &image = *writer.image;
-    writer.converted = static_cast<uint8 *>(allocate(writer, pitch * image.height));
+    writer.converted = static_cast<uint8_t *>(allocate(writer, pitch * image.height));
     if (writer.converted == nullptr) {
         return false;
     }
-    Raster_ConvertPixels(writer.converted, static_cast<uint32>(pitch), 24, image.data,
+    Raster_ConvertPixels(writer.converted, static_cast<uint32_t>(pitch), 24, image.data,
                          image.bytesPerLine, conversionDepth(image), false, nullptr, 0, 0, 0, 0,
                          image.width, image.height);
     return true;
 }
 
-void fillRows(const PngWriter &writer, const uint8 *pixels, size_t pitch) {
+void fillRows(const PngWriter &writer, const uint8_t *pixels, size_t pitch) {
     const ImageInfo &image = *writer.image;
-    for (uint32 i = 0; i < image.height; ++i) {
-        const uint32 pictureRow = isBottomUp(image) ? image.height - 1 - i : i;
+    for (uint32_t i = 0; i < image.height; ++i) {
+        const uint32_t pictureRow = isBottomUp(image) ? image.height - 1 - i : i;
         // libpng asks for writable rows, and does not write to them.
         writer.rows[pictureRow] = const_cast<png_bytep>(pixels + i * pitch);
     }
@@ -202,7 +203,7 @@ void *ImageUtilDefaultRealloc(void * /*context*/, void *block, size_t size) {
 
 // Makes room for length more bytes.  A block that cannot grow stays in data.
 bool makeRoom(ImageUtilPngBuffer *buffer, size_t length) {
-    constexpr uint64_t kMaxSize = std::numeric_limits<uint32>::max();
+    constexpr uint64_t kMaxSize = std::numeric_limits<uint32_t>::max();
     if (length > kMaxSize - buffer->size) {
         return false;
     }
@@ -216,8 +217,8 @@ bool makeRoom(ImageUtilPngBuffer *buffer, size_t length) {
     if (data == nullptr) {
         return false;
     }
-    buffer->data = static_cast<uint8 *>(data);
-    buffer->capacity = static_cast<uint32>(capacity);
+    buffer->data = static_cast<uint8_t *>(data);
+    buffer->capacity = static_cast<uint32_t>(capacity);
     return true;
 }
 
@@ -239,8 +240,8 @@ bool ImageUtil_ConstructPNGBuffer(const ImageInfo *image, const ImageUtilPngOpti
 }
 
 bool ImageUtil_ConstructPNGBufferWithMemOps(const ImageInfo *image,
-                                            const ImageUtilPngOptions *options, uint8 **outData,
-                                            uint32 *outSize, const ImageUtilMemOps *memOps) {
+                                            const ImageUtilPngOptions *options, uint8_t **outData,
+                                            uint32_t *outSize, const ImageUtilMemOps *memOps) {
     ImageUtilPngBuffer buffer = {};
     buffer.memOps = memOps;
     if (!ImageUtilEncodePNG(image, options, &buffer, ImageUtilBufferWriteCallback, memOps)) {
@@ -253,14 +254,14 @@ bool ImageUtil_ConstructPNGBufferWithMemOps(const ImageInfo *image,
     return true;
 }
 
-void ImageUtilDynBufWriteCallback(png_structp png, uint8 *source, size_t length) {
+void ImageUtilDynBufWriteCallback(png_structp png, uint8_t *source, size_t length) {
     auto *const buffer = static_cast<DynBuf *>(png_get_io_ptr(png));
     if (!DynBuf_Append(buffer, source, length)) {
         png_error(png, "Unable to append data");
     }
 }
 
-void ImageUtilBufferWriteCallback(png_structp png, uint8 *source, size_t length) {
+void ImageUtilBufferWriteCallback(png_structp png, uint8_t *source, size_t length) {
     auto *const buffer = static_cast<ImageUtilPngBuffer *>(png_get_io_ptr(png));
     if (!makeRoom(buffer, length) || buffer->data == nullptr) {
         buffer->size = 0;
@@ -268,5 +269,5 @@ void ImageUtilBufferWriteCallback(png_structp png, uint8 *source, size_t length)
         png_error(png, "Unable to append data: Out of memory");
     }
     std::memcpy(buffer->data + buffer->size, source, length);
-    buffer->size += static_cast<uint32>(length);
+    buffer->size += static_cast<uint32_t>(length);
 }

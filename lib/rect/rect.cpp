@@ -2,7 +2,7 @@
 //
 // Outputs may be records that are inputs too, so everything is read before
 // anything is stored.
-#include "rect.h"
+#include <quillon/rect.h>
 
 #include "core/coordinates.h"
 
@@ -27,19 +27,19 @@ bool translate(Rect &dst, const Rect &src, int64_t dx, int64_t dy) {
 }
 
 // The last column or row inside; the smallest coordinate has none before it.
-int32 lastInside(int32 end) {
+int32_t lastInside(int32_t end) {
     return end == kCoordinateMin ? end : end - 1;
 }
 
 // a - b as a saturating sum with the wrapped negation of b, so that the smallest
 // coordinate moves a down instead of up.
-int32 gap(int32 a, int32 b) {
+int32_t gap(int32_t a, int32_t b) {
     return saturate(int64_t{a} + wrappingSubtract(0, b));
 }
 
 } // namespace
 
-void Rect_SetFromXYWH(Rect *rect, int32 x, int32 y, int32 width, int32 height) {
+void Rect_SetFromXYWH(Rect *rect, int32_t x, int32_t y, int32_t width, int32_t height) {
     *rect = {.left = x,
              .top = y,
              .right = saturate(int64_t{x} + std::max(width, 0)),
@@ -101,7 +101,7 @@ void Rect_BoundingBox(Rect *dst, const Rect *a, const Rect *b) {
             .bottom = std::max(a->bottom, b->bottom)};
 }
 
-int32 Rect_PointDistance(const Rect *rect, const RectPoint *point) {
+int32_t Rect_PointDistance(const Rect *rect, const RectPoint *point) {
     return std::max({gap(rect->top, point->y), gap(rect->left, point->x),
                      gap(point->y, lastInside(rect->bottom)),
                      gap(point->x, lastInside(rect->right))});

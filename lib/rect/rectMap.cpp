@@ -6,7 +6,7 @@
 //
 // Outputs may be records that are inputs too, so everything is read before
 // anything is stored.
-#include "rect.h"
+#include <quillon/rect.h>
 
 #include "core/coordinates.h"
 
@@ -18,12 +18,12 @@ namespace {
 
 // A rectangle on one axis.
 struct Range {
-    int32 lo;
-    int32 hi;
+    int32_t lo;
+    int32_t hi;
 
     bool empty() const { return lo >= hi; }
 
-    // Never negative; more than an int32 holds counts as its largest value.
+    // Never negative; more than an int32_t holds counts as its largest value.
     int64_t extent() const { return empty() ? 0 : saturate(int64_t{hi} - lo); }
 };
 
@@ -58,7 +58,7 @@ bool applyScaledDiff(Range &dst, Range range, Range from, Range to) {
     return isLoExact && isHiExact;
 }
 
-int32 scaleCoordinate(Range source, Range target, int32 coordinate) {
+int32_t scaleCoordinate(Range source, Range target, int32_t coordinate) {
     const int64_t s = source.extent();
     const int64_t t = target.extent();
     // Into a larger range the mapping runs from first pixel to first pixel and
@@ -72,8 +72,8 @@ int32 scaleCoordinate(Range source, Range target, int32 coordinate) {
 }
 
 // The size of a range that is not empty.
-int32 sizeOf(Range range) {
-    return static_cast<int32>(range.extent());
+int32_t sizeOf(Range range) {
+    return static_cast<int32_t>(range.extent());
 }
 
 void storeUnlessNull(Rect *dst, const Rect &value) {
@@ -84,7 +84,7 @@ void storeUnlessNull(Rect *dst, const Rect &value) {
 } // namespace
 
 bool Rect_ApplyDiff(Rect *dst, const Rect *newRect, const Rect *oldRect, const Rect *rect) {
-    const auto moved = [=](int32 Rect::*field) {
+    const auto moved = [=](int32_t Rect::*field) {
         return int64_t{rect->*field} + newRect->*field - oldRect->*field;
     };
     Rect result;

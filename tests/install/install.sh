@@ -13,9 +13,9 @@ mv "$work/first" "$work/moved"
 libDir=$(dirname "$(find "$work/moved" -name libquillon.so)")
 
 echo "Each header compiles by itself, as C99 and as C++17"
-strict=(-fsyntax-only -Wall -Wextra -Wpedantic -Werror)
-for header in "$work"/moved/include/quillon-1/*.h; do
-    "$cc" -std=c99 "${strict[@]}" -x c - <<<"#include \"$header\""
+strict=(-fsyntax-only -Wall -Wextra -Wpedantic -Werror -I"$work/moved/include/quillon-1")
+for header in "$work"/moved/include/quillon-1/{quillon,hearth}/*.h; do
+    "$cc" -std=c99 "${strict[@]}" -x c - <<<"#include \"$header\""$'\nint unused;'
     "$cxx" -std=c++17 "${strict[@]}" -x c++ - <<<"#include \"$header\""
 done
 

@@ -24,10 +24,10 @@ compare() { # WHAT EXPECTED ACTUAL
     diff <(echo "$2") <(echo "$3") || { echo "$1: lines with < are missing, with > too much"; failed=1; }
 }
 
-headers=$(declared QUILLON_API "$sourceDir"/include/*.h)
+headers=$(declared QUILLON_API "$sourceDir"/include/quillon/*.h)
 map=$(grep -oE '^ +\w+;' "$sourceDir/lib/quillon.map" | tr -d ' ;' | sort)
 compare "quillon.map against the headers" "$headers" "$map"
 compare "libquillon against quillon.map" "$map" "$(exported "$libquillon")"
-compare "libhearth against hearth.h" "$(declared HEARTH_API "$sourceDir/hearth/hearth.h")" \
+compare "libhearth against hearth.h" "$(declared HEARTH_API "$sourceDir/include/hearth/hearth.h")" \
     "$(exported "$libhearth")"
 exit $failed

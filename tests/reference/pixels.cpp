@@ -1,6 +1,6 @@
 #include "reference/pixels.h"
 
-#include "raster.h"
+#include <quillon/raster.h>
 
 #include <algorithm>
 #include <bit>
@@ -10,11 +10,11 @@ namespace quillon::reference {
 namespace {
 
 struct Layout {
-    int32 depth;
-    uint32 red, green, blue, alpha; // masks
+    int32_t depth;
+    uint32_t red, green, blue, alpha; // masks
 };
 
-const Layout &layoutOf(int32 depth) {
+const Layout &layoutOf(int32_t depth) {
     static const Layout layouts[] = {
         {3, 0x04, 0x20, 0x80, 0},
         {6, 0x30, 0x0C, 0x03, 0},
@@ -32,21 +32,21 @@ const Layout &layoutOf(int32 depth) {
 
 // The channel under a mask, widened to 8 bits by repeating its bits, of which the
 // top ones are put under the other mask.
-uint32 moved(uint32 pixel, uint32 from, uint32 to) {
+uint32_t moved(uint32_t pixel, uint32_t from, uint32_t to) {
     const int bits = std::popcount(from);
-    const uint32 value = (pixel & from) >> std::countr_zero(from);
-    uint32 repeated = 0;
+    const uint32_t value = (pixel & from) >> std::countr_zero(from);
+    uint32_t repeated = 0;
     int have = 0;
     for (; have < 8; have += bits)
         repeated = (repeated << bits) | value;
-    const uint32 channel = repeated >> (have - 8);
+    const uint32_t channel = repeated >> (have - 8);
     return (channel >> (8 - std::popcount(to))) << std::countr_zero(to);
 }
 
 } // namespace
 
-uint32 combined(uint32 rop, uint32 s, uint32 d) {
-    const uint32 results[][2] = {
+uint32_t combined(uint32_t rop, uint32_t s, uint32_t d) {
+    const uint32_t results[][2] = {
         {RASTER_ROP_CLEAR, 0},
         {RASTER_ROP_AND, s & d},
         {RASTER_ROP_AND_REVERSE, s & ~d},
@@ -62,7 +62,7 @@ uint32 combined(uint32 rop, uint32 s, uint32 d) {
         {RASTER_ROP_COPY_INVERTED, ~s},
         {RASTER_ROP_OR_INVERTED, ~s | d},
         {RASTER_ROP_NAND, ~(s & d)},
-        {RASTER_ROP_SET, ~uint32{0}},
+        {RASTER_ROP_SET, ~uint32_t{0}},
     };
     for (const auto &[code, result] : results)
         if (code == rop)
@@ -70,23 +70,23 @@ uint32 combined(uint32 rop, uint32 s, uint32 d) {
     return d;
 }
 
-uint32 blended(uint32 src, uint32 dst) {
-    uint32 result = dst & 0xFF000000;
+uint32_t blended(uint32_t src, uint32_t dst) {
+    uint32_t result = dst & 0xFF000000;
     for (int shift = 0; shift < 24; shift += 8) {
-        const uint32 shown = (dst >> shift & 0xFF) * (255 - (src >> 24)) / 255;
+        const uint32_t shown = (dst >> shift & 0xFF) * (255 - (src >> 24)) / 255;
         result |= std::min((src >> shift & 0xFF) + shown, 255u) << shift;
     }
     return result;
 }
 
-uint32 converted(uint32 pixel, int32 srcDepth, int32 dstDepth) {
+uint32_t converted(uint32_t pixel, int32_t srcDepth, int32_t dstDepth) {
     const Layout &src = layoutOf(srcDepth), &dst = layoutOf(dstDepth);
-    const uint32 color = moved(pixel, src.red, dst.red) | moved(pixel, src.green, dst.green) |
+    const uint32_t color = moved(pixel, src.red, dst.red) | moved(pixel, src.green, dst.green) |
                          moved(pixel, src.blue, dst.blue);
     return color | (src.alpha == 0 ? dst.alpha : pixel & dst.alpha);
 }
 
-uint32 convertedAlone(uint32 pixel, int32 srcDepth, int32 dstDepth) {
+uint32_t convertedAlone(uint32_t pixel, int32_t srcDepth, int32_t dstDepth) {
     // A 24-bit pixel in a word is taken for a 32-bit one: its top byte goes along.
     const bool areWords = std::min(srcDepth, dstDepth) >= 24;
     if (srcDepth == dstDepth || areWords)

@@ -2,19 +2,19 @@
 // to these; they are held to raster.h by reading.
 #pragma once
 
-#include "quillonTypes.h"
+#include <cstdint>
 
 namespace quillon::reference {
 
 // By a raster operation; a code that is none leaves dst as it is.
-uint32 combined(uint32 rop, uint32 src, uint32 dst);
+uint32_t combined(uint32_t rop, uint32_t src, uint32_t dst);
 
-uint32 blended(uint32 src, uint32 dst);
+uint32_t blended(uint32_t src, uint32_t dst);
 
 // In a rectangle: a layout without alpha counts as opaque.
-uint32 converted(uint32 pixel, int32 srcDepth, int32 dstDepth);
+uint32_t converted(uint32_t pixel, int32_t srcDepth, int32_t dstDepth);
 
 // By itself.
-uint32 convertedAlone(uint32 pixel, int32 srcDepth, int32 dstDepth);
+uint32_t convertedAlone(uint32_t pixel, int32_t srcDepth, int32_t dstDepth);
 
 } // namespace quillon::reference

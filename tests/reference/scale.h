@@ -2,7 +2,7 @@
 // from one row to the next but whole scaled rows.
 #pragma once
 
-#include "raster.h"
+#include <quillon/raster.h>
 
 namespace quillon::reference {
 

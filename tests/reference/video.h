@@ -2,14 +2,14 @@
 // this file.
 #pragma once
 
-#include <raster.h> // in brackets: there is a file of this name here
+#include <quillon/raster.h> // in brackets: there is a file of this name here
 
 namespace quillon::reference {
 
 // format and bppdepth have to be ones that there are.
-void yuvToRgb(const uint8 *srcBuffer, uint8 *dstBuffer, uint32 width, uint32 height, uint32 format,
-              int32 bppdepth);
+void yuvToRgb(const uint8_t *srcBuffer, uint8_t *dstBuffer, uint32_t width, uint32_t height, uint32_t format,
+              int32_t bppdepth);
 
-uint32 yuvToBgrx(int32 y, int32 u, int32 v);
+uint32_t yuvToBgrx(int32_t y, int32_t u, int32_t v);
 
 } // namespace quillon::reference

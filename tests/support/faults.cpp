@@ -1,6 +1,6 @@
 #include "support/faults.h"
 
-#include "hearth.h"
+#include <hearth/hearth.h>
 
 #include <cstdlib>
 #include <cstring>

@@ -6,6 +6,7 @@
 // UtilSafeMalloc0 come filled with kStale.
 #pragma once
 
+#include <hearth/hearth.h>
 #include <gtest/gtest.h>
 
 #include <cstdint>

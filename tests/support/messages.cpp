@@ -1,6 +1,6 @@
 #include "support/messages.h"
 
-#include "hearth.h"
+#include <hearth/hearth.h>
 
 #include <cstdarg>
 #include <cstdio>

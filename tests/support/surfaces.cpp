@@ -6,8 +6,8 @@
 namespace quillon::test {
 namespace {
 
-constexpr uint32 kFencedRows = 3;
-constexpr uint32 kMost = UINT32_MAX;
+constexpr uint32_t kFencedRows = 3;
+constexpr uint32_t kMost = UINT32_MAX;
 constexpr size_t kLargePages = 450; // more than is kept in the caches of a core
 
 // The largest step there is downwards, and a step that only unsigned line
@@ -25,20 +25,20 @@ int64_t rowStep(int64_t line, const Part &part) {
 }
 
 // Small, or up to the largest.
-uint32 randomCoordinate(Random &random) {
-    const uint32 small = random.below(100);
+uint32_t randomCoordinate(Random &random) {
+    const uint32_t small = random.below(100);
     return random.oneOf({0u, small, small, random.word(), kMost - small});
 }
 
-uint32 randomWidth(Random &random) {
-    const uint32 width =
+uint32_t randomWidth(Random &random) {
+    const uint32_t width =
         random.oneIn(16) ? 200 + random.below(600) : random.below(random.oneIn(4) ? 20 : 141);
     return random.oneIn(4) ? width & ~7u : width; // bitmap rows of whole bytes
 }
 
 // Fitting the row, padded, shorter than the row, next to none.
 int64_t randomLine(Random &random, size_t rowBytes) {
-    const auto row = static_cast<uint32>(rowBytes);
+    const auto row = static_cast<uint32_t>(rowBytes);
     return random.oneOf({row, row, row + random.below(10), row + random.below(10),
                          row + random.below(300), random.below(row + 1), random.below(5)});
 }
@@ -83,7 +83,7 @@ void drawCoordinates(Random &random, Case &c) {
     const bool isOneCorner = c.operation.isOneCorner;
     const bool isOneColumn = isOneCorner || random.oneIn(4);
     const bool isOneRow = isOneCorner || random.oneIn(2);
-    const uint32 x = randomCoordinate(random), y = randomCoordinate(random);
+    const uint32_t x = randomCoordinate(random), y = randomCoordinate(random);
     for (Surface &surface : c.at) {
         surface.x = isOneColumn ? x : randomCoordinate(random);
         surface.y = isOneRow ? y : randomCoordinate(random);
@@ -115,23 +115,23 @@ void drawLine(Random &random, Case &c, size_t i) {
 }
 
 // Where the first row that is walked begins.
-uint8 *drawFirst(Random &random, Case &c, size_t i, bool isFlushBehind, bool isNear) {
+uint8_t *drawFirst(Random &random, Case &c, size_t i, bool isFlushBehind, bool isNear) {
     TwinMemory &memory = *c.memories[i];
     if (c.isInRows)
         return memory.run(c.step(i) < 0 ? kFencedRows - 1 : 0) +
                (isFlushBehind ? memory.runBytes() - c.rowBytes(i) : 0);
     const Extent extent = c.extent(i);
-    uint8 *const lowest = memory.run(0) + extent.below;
+    uint8_t *const lowest = memory.run(0) + extent.below;
     const int64_t room = static_cast<int64_t>(memory.runBytes()) - extent.below - extent.above;
     if (isNear && i > 0)
         return std::clamp(c.at[0].first + random.between(-128, 128), lowest, lowest + room);
-    const int64_t anywhere = random.below(static_cast<uint32>(room) + 1);
+    const int64_t anywhere = random.below(static_cast<uint32_t>(room) + 1);
     return lowest + (isNear ? room / 2 : random.oneOf({int64_t{0}, room, room, anywhere}));
 }
 
 void drawPlaces(Random &random, Case &c) {
     const bool isFlushBehind = random.oneIn(2);
-    const uint32 nearest = c.at.size() < 3 ? 1 : 1 + random.below(3);
+    const uint32_t nearest = c.at.size() < 3 ? 1 : 1 + random.below(3);
     for (size_t i = 0; i < c.at.size(); ++i) {
         const Part &part = c.operation.parts[i];
         const bool isNear = c.isNear && (i == 0 || i == nearest || random.oneIn(2));
@@ -143,7 +143,7 @@ void drawPlaces(Random &random, Case &c) {
         const uint64_t row = uint64_t{surface.y} + (c.isUpwards ? c.size.height - 1 : 0);
         const int64_t line =
             part.rule == RowRule::kRounded ? rowStep(surface.line, part) : surface.line;
-        surface.buffer = reinterpret_cast<uint8 *>(reinterpret_cast<uintptr_t>(surface.first) -
+        surface.buffer = reinterpret_cast<uint8_t *>(reinterpret_cast<uintptr_t>(surface.first) -
                                                    row * static_cast<uint64_t>(line) -
                                                    uint64_t{surface.x} * part.bytes);
     }
@@ -154,12 +154,12 @@ void walk(const Case &c) {
     const std::vector<Part> &parts = c.operation.parts;
     const bool isRowByRow = c.operation.walk == Walk::kRowByRow;
     const bool isAway = c.operation.walk == Walk::kAwayFromSource;
-    const bool isSplit = parts[0].bytes > sizeof(uint32) || (isAway && parts[0].bytes == 3);
-    const uint32 split = isSplit ? parts[0].bytes : 1;
+    const bool isSplit = parts[0].bytes > sizeof(uint32_t) || (isAway && parts[0].bytes == 3);
+    const uint32_t split = isSplit ? parts[0].bytes : 1;
     const int64_t width = int64_t{c.size.width} * split, height = c.size.height;
     const bool isFromLast = isRowByRow && c.at[1].y < c.at[0].y && c.overlaps();
     for (int64_t i = 0; i < height; ++i) {
-        std::array<uint8 *, 4> rows = {};
+        std::array<uint8_t *, 4> rows = {};
         for (size_t k = 0; k < parts.size(); ++k)
             rows[k] = c.memories[k]->inModel(c.at[k].first +
                                              (isFromLast ? height - 1 - i : i) * c.step(k));
@@ -169,13 +169,13 @@ void walk(const Case &c) {
             const int64_t column = isLeftwards ? width - 1 - j : j;
             Pixels pixels = {};
             for (size_t k = 0; k < parts.size(); ++k) {
-                const uint32 bytes = parts[k].bytes / split;
+                const uint32_t bytes = parts[k].bytes / split;
                 if (bytes == 0)
                     pixels[k] = rows[k][column / 8] >> (7 - column % 8) & 1;
                 else if (parts[k].isTouched)
                     std::memcpy(&pixels[k], rows[k] + column * bytes, bytes);
             }
-            const uint32 result = c.operation.reference(pixels), bytes = parts[0].bytes / split;
+            const uint32_t result = c.operation.reference(pixels), bytes = parts[0].bytes / split;
             std::memcpy(rows[0] + column * bytes, &result, bytes);
         }
     }
@@ -195,12 +195,12 @@ void compare(Random &random, const Case &c) {
 }
 
 // Nothing is looked at when there is nothing to do, however large the rest.
-void callForNothing(Random &random, const Operation &operation, uint8 *nowhere) {
+void callForNothing(Random &random, const Operation &operation, uint8_t *nowhere) {
     Surfaces at(operation.parts.size());
     for (Surface &surface : at)
         surface = {nowhere, nowhere, 64, random.below(9), random.below(9)};
-    const uint32 any = random.oneOf({0u, 1u, kMost});
-    const uint32 none = operation.parts[0].isTouched ? 0 : random.oneOf({0u, 1u, 999u, kMost});
+    const uint32_t any = random.oneOf({0u, 1u, kMost});
+    const uint32_t none = operation.parts[0].isTouched ? 0 : random.oneOf({0u, 1u, 999u, kMost});
     operation.library(at, random.oneIn(2) ? Size{any, none} : Size{none, any});
 }
 
@@ -214,13 +214,13 @@ TwinMemory::TwinMemory(size_t runBytes, size_t runs, size_t spacing)
             mapping->open(pageSize() + i * spacing, runBytes);
 }
 
-void TwinMemory::refill(Random &random, uint32 low, uint32 count) {
+void TwinMemory::refill(Random &random, uint32_t low, uint32_t count) {
     for (size_t i = 0; i < runs_; ++i) {
-        uint8 *bytes = run(i);
+        uint8_t *bytes = run(i);
         random.fill(bytes, runBytes_);
         if (count < 256)
-            std::transform(bytes, bytes + runBytes_, bytes, [=](uint8 byte) {
-                return static_cast<uint8>(low + (byte * count >> 8));
+            std::transform(bytes, bytes + runBytes_, bytes, [=](uint8_t byte) {
+                return static_cast<uint8_t>(low + (byte * count >> 8));
             });
         std::copy_n(bytes, runBytes_, inModel(bytes));
     }
@@ -228,7 +228,7 @@ void TwinMemory::refill(Random &random, uint32 low, uint32 count) {
 
 testing::AssertionResult TwinMemory::agree() const {
     for (size_t i = 0; i < runs_; ++i) {
-        const uint8 *bytes = run(i), *model = inModel(run(i));
+        const uint8_t *bytes = run(i), *model = inModel(run(i));
         if (std::memcmp(bytes, model, runBytes_) == 0)
             continue;
         const auto at = std::mismatch(bytes, bytes + runBytes_, model).first - bytes;
@@ -255,7 +255,7 @@ void Arena::check(Random &random, const Operation &operation) {
     } else if (isLarge) {
         size.width = 256 + random.below(2000);
         const size_t rowBytes = operation.parts[0].rowBytes(size.width);
-        size.height = static_cast<uint32>(largeBlocks_[0].runBytes() / rowBytes);
+        size.height = static_cast<uint32_t>(largeBlocks_[0].runBytes() / rowBytes);
     } else if (isNear) {
         size = {random.below(100), 1 + random.below(4)};
     }

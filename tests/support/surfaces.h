@@ -2,7 +2,7 @@
 // fenced memory that has a model.
 #pragma once
 
-#include "quillonTypes.h"
+#include <cstdint>
 #include "support/fence.h"
 #include "support/targets.h"
 
@@ -20,15 +20,15 @@ class TwinMemory {
 public:
     TwinMemory(size_t runBytes, size_t runs, size_t spacing); // in whole pages
 
-    uint8 *run(size_t index) const { return pages_.data() + pageSize() + index * spacing_; }
-    uint8 *nowhere() const { return pages_.data(); }
+    uint8_t *run(size_t index) const { return pages_.data() + pageSize() + index * spacing_; }
+    uint8_t *nowhere() const { return pages_.data(); }
     size_t runBytes() const { return runBytes_; }
     int64_t spacing() const { return static_cast<int64_t>(spacing_); }
 
     // New bytes, from low to low + count - 1 each.
-    void refill(Random &random, uint32 low = 0, uint32 count = 256);
+    void refill(Random &random, uint32_t low = 0, uint32_t count = 256);
 
-    uint8 *inModel(uint8 *address) const { return model_.data() + (address - pages_.data()); }
+    uint8_t *inModel(uint8_t *address) const { return model_.data() + (address - pages_.data()); }
 
     testing::AssertionResult agree() const;
 
@@ -42,28 +42,28 @@ enum class RowRule { kExact, kRoundedSteps, kRounded };
 
 // A surface, and a rectangle on it: its corner, and the address of its first pixel.
 struct Surface {
-    uint8 *buffer; // of pixel (0, 0), which may lie outside of memory
-    uint8 *first;
+    uint8_t *buffer; // of pixel (0, 0), which may lie outside of memory
+    uint8_t *first;
     int64_t line;
-    uint32 x, y;
+    uint32_t x, y;
 
-    int32 signedLine() const { return static_cast<int32>(line); }
-    uint32 unsignedLine() const { return static_cast<uint32>(line); }
+    int32_t signedLine() const { return static_cast<int32_t>(line); }
+    uint32_t unsignedLine() const { return static_cast<uint32_t>(line); }
 };
 using Surfaces = std::vector<Surface>;
 
 struct Size {
-    uint32 width, height;
+    uint32_t width, height;
 };
 
 // What a surface is to an operation.
 struct Part {
-    uint32 bytes; // per pixel, or 0: the pixels are bits
+    uint32_t bytes; // per pixel, or 0: the pixels are bits
     RowRule rule = RowRule::kExact;
-    uint32 low = 0, count = 256; // the values that bytes may have
+    uint32_t low = 0, count = 256; // the values that bytes may have
     bool isTouched = true;
 
-    size_t rowBytes(uint32 width) const {
+    size_t rowBytes(uint32_t width) const {
         return bytes == 0 ? (size_t{width} + 7) / 8 : size_t{width} * bytes;
     }
 };
@@ -80,7 +80,7 @@ enum class Walk {
     kRowByRow,
 };
 
-using Pixels = std::array<uint32, 4>; // of each surface
+using Pixels = std::array<uint32_t, 4>; // of each surface
 
 // A call with all its arguments but the surfaces, of which the first is the
 // destination, and the size.
@@ -88,7 +88,7 @@ struct Operation {
     std::string name;
     std::vector<Part> parts;
     std::function<void(const Surfaces &, Size)> library;
-    std::function<uint32(const Pixels &)> reference; // the pixel that is stored
+    std::function<uint32_t(const Pixels &)> reference; // the pixel that is stored
     Walk walk = Walk::kForwards;
     bool mayOverlap = true;
     bool isSigned = true;     // the line increments

@@ -1,12 +1,12 @@
 /* A C program with nothing of its own: fills a surface and makes a BMP of it. */
-#include <imageUtil.h>
-#include <raster.h>
+#include <quillon/imageUtil.h>
+#include <quillon/raster.h>
 
 #include <stdio.h>
 #include <string.h>
 
 int main(void) {
-    uint8 pixels[2 * 8] = {0};
+    uint8_t pixels[2 * 8] = {0};
     ImageInfo image = {0};
     DynBuf file;
 

@@ -1,7 +1,7 @@
 // A host that puts its own functions in the place of libhearth's: failures come
 // as exceptions, and warnings are kept.
-#include <hearth.h>
-#include <raster.h>
+#include <hearth/hearth.h>
+#include <quillon/raster.h>
 
 #include <cstdarg>
 #include <cstdio>
@@ -32,7 +32,7 @@ void Warning(const char *format, ...) {
 }
 
 int main() {
-    uint8 surface[64] = {};
+    uint8_t surface[64] = {};
     try {
         Raster_RectFill(surface, 16, 5, 0, 0, 0, 2, 2);
     } catch (const std::runtime_error &error) {

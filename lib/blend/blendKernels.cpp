@@ -1,0 +1,124 @@
+#include "blend/blendKernels.h"
+
+#include "blend/blendPlain.h"
+#include "simd/thresholds.h"
+
+#undef HWY_TARGET_INCLUDE
+#define HWY_TARGET_INCLUDE "blend/blendKernels.cpp"
+#include "hwy/foreach_target.h"
+#include "hwy/highway.h"
+
+#include "simd/rowLoop-inl.h"
+
+HWY_BEFORE_NAMESPACE();
+namespace quillon::HWY_NAMESPACE {
+namespace {
+
+#if QUILLON_HAS_VECTORS
+
+// blendOverPixel in vectors.
+//
+// With a the source's alpha, channel * (255 - a) / 255 is the upper half of
+// channel * (65536 - 257 * a), exactly, unless a is 0 (docs/numbers.md).  A
+// channel in the upper byte of 16 bits gives it in the upper byte again, with the
+// rest below.
+template <class D, class V>
+HWY_INLINE V blendOver(D d, V src, V dst) {
+    const hn::Repartition<uint8_t, D> d8;
+    const hn::Repartition<uint16_t, D> d16;
+    HWY_ALIGN static constexpr uint8_t kAlphas[16] = {3,  3,  3,  3,  7,  7,  7,  7,
+                                                      11, 11, 11, 11, 15, 15, 15, 15};
+    const auto alphas = hn::TableLookupBytes(hn::BitCast(d8, src), hn::LoadDup128(d8, kAlphas));
+    const auto factor = hn::Sub(hn::Zero(d16), hn::BitCast(d16, alphas));
+    const auto low = hn::Set(d16, 0x00FF);
+    const auto dst16 = hn::BitCast(d16, dst);
+    const auto blueRed = hn::MulHigh(hn::And(dst16, low), factor);
+    const auto green = hn::MulHigh(hn::AndNot(low, dst16), factor);
+    const auto under = hn::OrAnd(blueRed, green, hn::Set(d16, 0xFF00));
+
+    const auto isUncovered = hn::Eq(hn::BitCast(d, factor), hn::Zero(d));
+    const auto kept = hn::IfThenElse(isUncovered, dst, hn::BitCast(d, under));
+    const auto sum = hn::SaturatedAdd(hn::BitCast(d8, src), hn::BitCast(d8, kept));
+    return hn::IfVecThenElse(hn::Set(d, 0x00FFFFFF), hn::BitCast(d, sum), dst);
+}
+
+template <bool kPrefetches>
+struct BlendBody {
+    uint8_t *dst;
+    const uint8_t *src;
+    PrefetchDistance distance;
+
+    template <class C, class Access>
+    HWY_INLINE void operator()(C /*chunk*/, size_t i, Access access) const {
+        const hn::CappedTag<uint32_t, C::kUnits> d;
+        uint8_t *pixels = dst + 4 * i;
+        const uint8_t *from = src + 4 * i;
+        if constexpr (kPrefetches) {
+            hwy::Prefetch(advance(pixels, static_cast<uint64_t>(distance.dst)));
+            hwy::Prefetch(advance(from, static_cast<uint64_t>(distance.src)));
+        }
+        const auto over = access.load(d, from);
+        // Much of what lies over a picture is clear, in long runs, and changes
+        // nothing.  A look at one pixel is cheaper than one at a vector.
+        if (isClear(from) && hn::AllTrue(d, hn::Eq(over, hn::Zero(d))))
+            return;
+        access.store(d, blendOver(d, over, access.load(d, pixels)), pixels);
+    }
+
+private:
+    HWY_INLINE static bool isClear(const uint8_t *from) {
+        uint32_t pixel;
+        hwy::CopyBytes<4>(from, &pixel);
+        return pixel == 0;
+    }
+};
+
+template <bool kPrefetches>
+void blendRowsBy(DstRows dst, SrcRows src, Extent extent, PrefetchDistance distance) {
+    for (size_t y = 0; y < extent.height; ++y) {
+        const BlendBody<kPrefetches> body = {dst.row(y), src.row(y), distance};
+        if (hasOverlapHazard(body.dst, body.src, kVectorBytes))
+            blendOverRowPlain(body.dst, body.src, extent.width);
+        else
+            walkRowOnce<4>(extent.width, body);
+    }
+}
+
+void blendKernel(DstRows dst, SrcRows src, Extent extent) {
+    const size_t rowBytes = 4 * extent.width;
+    if (areContiguous(dst, rowBytes) && areContiguous(src, rowBytes))
+        extent = asOneRow(extent);
+    const ByteExtent bytes = inBytes(extent, 4);
+    const ptrdiff_t ahead = isNonTemporal(bytes) ? kPrefetchBlendUncached : kPrefetchInCaches;
+    if (extent.width >= kPrefetchLongRow)
+        blendRowsBy<true>(dst, src, extent, {ahead, ahead});
+    else if (extent.width >= kPrefetchNextRow)
+        blendRowsBy<true>(dst, src, extent, {dst.stride, src.stride});
+    else
+        blendRowsBy<false>(dst, src, extent, {});
+}
+
+#else
+
+void blendKernel(DstRows dst, SrcRows src, Extent extent) {
+    for (size_t y = 0; y < extent.height; ++y)
+        blendOverRowPlain(dst.row(y), src.row(y), extent.width);
+}
+
+#endif
+
+} // namespace
+} // namespace quillon::HWY_NAMESPACE
+HWY_AFTER_NAMESPACE();
+
+#if HWY_ONCE
+namespace quillon {
+
+HWY_EXPORT(blendKernel);
+
+void blendOverRows(DstRows dst, SrcRows src, Extent extent) {
+    HWY_DYNAMIC_DISPATCH(blendKernel)(dst, src, extent);
+}
+
+} // namespace quillon
+#endif

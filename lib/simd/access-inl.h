@@ -1,0 +1,170 @@
+// How a kernel reaches memory.  The row loop hands every call of a body one of
+// these, by which the body loads and stores: one signature, whatever the policy.
+//
+// Included once per instruction set; the usual guards do not apply.
+
+#if defined(QUILLON_SIMD_ACCESS_INL_H) == defined(HWY_TARGET_TOGGLE)
+#ifdef QUILLON_SIMD_ACCESS_INL_H
+#undef QUILLON_SIMD_ACCESS_INL_H
+#else
+#define QUILLON_SIMD_ACCESS_INL_H
+#endif
+
+#include "hwy/cache_control.h"
+#include "hwy/highway.h"
+
+#include "core/surface.h"
+#include "simd/target-inl.h"
+#include "simd/thresholds.h"
+
+#include <type_traits>
+
+HWY_BEFORE_NAMESPACE();
+namespace quillon::HWY_NAMESPACE {
+#if QUILLON_HAS_VECTORS
+
+template <class D>
+HWY_INLINE hn::Vec<D> loadBytes(D d, const uint8_t *from) {
+    return hn::LoadU(d, reinterpret_cast<const hn::TFromD<D> *>(from));
+}
+template <class D>
+HWY_INLINE void storeBytes(D d, hn::Vec<D> v, uint8_t *to) {
+    hn::StoreU(v, d, reinterpret_cast<hn::TFromD<D> *>(to));
+}
+
+// Whole vectors at any address, through the caches.
+struct Unaligned {
+    template <class D>
+    HWY_INLINE static hn::Vec<D> load(D d, const uint8_t *from) {
+        return loadBytes(d, from);
+    }
+    template <class D>
+    HWY_INLINE static void store(D d, hn::Vec<D> v, uint8_t *to) {
+        storeBytes(d, v, to);
+    }
+};
+
+// The same where the destination of every chunk begins a cache line: a body can
+// rely on it that no whole vector lies across two lines.
+struct Aligned : Unaligned {};
+
+// Stores around the caches; the destination of every chunk begins a cache line.
+// Call hwy::FlushStream() once, after the last row.
+struct NonTemporal : Unaligned {
+    template <class D>
+    HWY_INLINE static void store(D d, hn::Vec<D> v, uint8_t *to) {
+        // Vectors of less than a block have no such stores.
+        if constexpr (kBytesOf<D> >= 16)
+            hn::Stream(v, d, reinterpret_cast<hn::TFromD<D> *>(to));
+        else
+            storeBytes(d, v, to);
+    }
+};
+
+// Only the first lanes of a vector, of 8 or 32 bits.  Memory of the others is not
+// touched.
+struct FirstLanes {
+    size_t count;
+
+#if QUILLON_X86_AVX512
+    template <class D>
+    HWY_INLINE hn::Vec<D> load(D d, const uint8_t *from) const {
+        static_assert(kBytesOf<D> == 64);
+        const auto mask = hn::FirstN(d, count).raw;
+        if constexpr (sizeof(hn::TFromD<D>) == 1)
+            return hn::Vec<D>{_mm512_maskz_loadu_epi8(mask, from)};
+        else
+            return hn::Vec<D>{_mm512_maskz_loadu_epi32(mask, from)};
+    }
+    template <class D>
+    HWY_INLINE void store(D d, hn::Vec<D> v, uint8_t *to) const {
+        static_assert(kBytesOf<D> == 64);
+        const auto mask = hn::FirstN(d, count).raw;
+        if constexpr (sizeof(hn::TFromD<D>) == 1)
+            _mm512_mask_storeu_epi8(to, mask, v.raw);
+        else
+            _mm512_mask_storeu_epi32(to, mask, v.raw);
+    }
+#else
+    template <class D>
+    HWY_INLINE hn::Vec<D> load(D d, const uint8_t *from) const {
+        HWY_ALIGN hn::TFromD<D> lanes[kLanes<D>] = {};
+        __builtin_memcpy(lanes, from, count * sizeof(lanes[0]));
+        return hn::Load(d, lanes);
+    }
+    template <class D>
+    HWY_INLINE void store(D d, hn::Vec<D> v, uint8_t *to) const {
+        HWY_ALIGN hn::TFromD<D> lanes[kLanes<D>];
+        hn::Store(v, d, lanes);
+        __builtin_memcpy(to, lanes, count * sizeof(lanes[0]));
+    }
+#endif
+};
+
+// Stores the lanes, of 8 or 32 bits in a whole vector, that the mask selects.
+// Memory of the others is not touched.
+template <class D>
+HWY_INLINE void storeSelected(D d, hn::Mask<D> mask, hn::Vec<D> v, uint8_t *to) {
+    static_assert(kBytesOf<D> == kVectorBytes);
+    constexpr size_t kLaneBytes = sizeof(hn::TFromD<D>);
+#if QUILLON_X86_AVX512
+    if constexpr (kLaneBytes == 1)
+        _mm512_mask_storeu_epi8(to, mask.raw, v.raw);
+    else
+        _mm512_mask_storeu_epi32(to, mask.raw, v.raw);
+#else
+#if QUILLON_X86_AVX2
+    if constexpr (kLaneBytes == 4) {
+        _mm256_maskstore_epi32(reinterpret_cast<int *>(to), mask.raw, v.raw);
+        return;
+    }
+#endif
+    // One by one: other threads may write to the lanes that are left out.
+    HWY_ALIGN hn::TFromD<D> lanes[kLanes<D>], selected[kLanes<D>];
+    hn::Store(v, d, lanes);
+    hn::Store(hn::VecFromMask(d, mask), d, selected);
+    for (size_t i = 0; i < kLanes<D>; ++i)
+        if (selected[i] != 0)
+            hwy::CopyBytes<kLaneBytes>(&lanes[i], to + i * kLaneBytes);
+#endif
+}
+
+inline constexpr size_t kLineBytes = 64; // of a cache line
+
+// How far ahead of the chunk at hand to ask for memory, in bytes; 0 not at all.
+// The processor itself asks ahead inside a page, but not beyond, and not for the
+// next row.
+struct PrefetchDistance {
+    ptrdiff_t dst, src;
+};
+
+// Prefetches the cache lines of a range that lies so far ahead.
+HWY_INLINE void prefetchLines(const uint8_t *from, size_t bytes, ptrdiff_t distance) {
+    if (distance == 0)
+        return;
+    const uint8_t *line = advance(from, static_cast<uint64_t>(distance));
+    for (size_t i = 0; i < bytes; i += kLineBytes)
+        hwy::Prefetch(advance(line, i));
+}
+
+// The units from dst on to the first one that begins a cache line, kNoLine where
+// none does.
+inline constexpr size_t kNoLine = kLineBytes;
+
+template <size_t kUnitBytes>
+HWY_INLINE size_t unitsToLine(const uint8_t *dst) {
+    const size_t bytes = (kLineBytes - reinterpret_cast<uintptr_t>(dst) % kLineBytes) % kLineBytes;
+    if constexpr (kUnitBytes % 2 != 0) {
+        // An odd size is invertible modulo 64: 1, 3.
+        static_assert(kUnitBytes == 1 || kUnitBytes == 3);
+        return bytes * (kUnitBytes == 3 ? 43 : 1) % kLineBytes;
+    } else {
+        return bytes % kUnitBytes == 0 ? bytes / kUnitBytes : kNoLine;
+    }
+}
+
+#endif
+} // namespace quillon::HWY_NAMESPACE
+HWY_AFTER_NAMESPACE();
+
+#endif

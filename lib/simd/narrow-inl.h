@@ -1,0 +1,260 @@
+// Vectors of wide lanes narrowed to one of narrow lanes, sums of products of
+// bytes, and the widening of 16-bit lanes in pairs.
+//
+// Included once per instruction set; the usual guards do not apply.
+
+#if defined(QUILLON_SIMD_NARROW_INL_H) == defined(HWY_TARGET_TOGGLE)
+#ifdef QUILLON_SIMD_NARROW_INL_H
+#undef QUILLON_SIMD_NARROW_INL_H
+#else
+#define QUILLON_SIMD_NARROW_INL_H
+#endif
+
+#include "hwy/highway.h"
+
+#include "simd/access-inl.h"
+#include "simd/target-inl.h"
+
+HWY_BEFORE_NAMESPACE();
+namespace quillon::HWY_NAMESPACE {
+#if QUILLON_HAS_VECTORS
+
+// ---- Intrinsics by size of vector -----------------------------------------
+
+namespace detail {
+
+// multiplyBytes: unsigned bytes of a by signed bytes of b, the products of each
+// 16-bit lane added with signed saturation.  addPairs: the products of signed
+// 16-bit lanes added in each 32-bit lane.  pack...: the lanes of a block of a, then
+// those of the same block of b, saturated.
+#if QUILLON_X86_SSSE3
+HWY_INLINE __m128i multiplyBytes(__m128i a, __m128i b) {
+    return _mm_maddubs_epi16(a, b);
+}
+HWY_INLINE __m128i addPairs(__m128i a, __m128i b) {
+    return _mm_madd_epi16(a, b);
+}
+HWY_INLINE __m128i packSigned16(__m128i a, __m128i b) {
+    return _mm_packs_epi16(a, b);
+}
+#endif
+#if QUILLON_X86_AVX2
+HWY_INLINE __m256i multiplyBytes(__m256i a, __m256i b) {
+    return _mm256_maddubs_epi16(a, b);
+}
+HWY_INLINE __m256i addPairs(__m256i a, __m256i b) {
+    return _mm256_madd_epi16(a, b);
+}
+HWY_INLINE __m256i packSigned16(__m256i a, __m256i b) {
+    return _mm256_packs_epi16(a, b);
+}
+HWY_INLINE __m128i packUnsigned32(__m128i a, __m128i b) {
+    return _mm_packus_epi32(a, b);
+}
+HWY_INLINE __m256i packUnsigned32(__m256i a, __m256i b) {
+    return _mm256_packus_epi32(a, b);
+}
+HWY_INLINE __m128i packUnsigned16(__m128i a, __m128i b) {
+    return _mm_packus_epi16(a, b);
+}
+HWY_INLINE __m256i packUnsigned16(__m256i a, __m256i b) {
+    return _mm256_packus_epi16(a, b);
+}
+#endif
+#if QUILLON_X86_AVX512
+HWY_INLINE __m512i multiplyBytes(__m512i a, __m512i b) {
+    return _mm512_maddubs_epi16(a, b);
+}
+HWY_INLINE __m512i addPairs(__m512i a, __m512i b) {
+    return _mm512_madd_epi16(a, b);
+}
+HWY_INLINE __m512i packSigned16(__m512i a, __m512i b) {
+    return _mm512_packs_epi16(a, b);
+}
+HWY_INLINE __m512i packUnsigned32(__m512i a, __m512i b) {
+    return _mm512_packus_epi32(a, b);
+}
+HWY_INLINE __m512i packUnsigned16(__m512i a, __m512i b) {
+    return _mm512_packus_epi16(a, b);
+}
+#endif
+
+} // namespace detail
+
+// ---- Sums of products -----------------------------------------------------
+
+// Of each 32-bit lane the sum of its lower three bytes, each by two factors: its
+// own byte in bytes, and the half of pairs that the sum of two bytes is multiplied
+// by.  Sums of two bytes stay below 32768.  The highest byte is zero.
+template <class D>
+HWY_INLINE hn::Vec<D> weightedByteSum(D d, hn::Vec<D> v, uint32_t bytes, uint32_t pairs) {
+#if QUILLON_X86_SSSE3
+    const auto sums = detail::multiplyBytes(v.raw, hn::Set(d, bytes).raw);
+    return hn::Vec<D>{detail::addPairs(sums, hn::Set(d, pairs).raw)};
+#else
+    const uint32_t lower = pairs & 0xFFFF, upper = pairs >> 16;
+    const auto byte = hn::Set(d, 0xFF);
+    const auto first = hn::Mul(hn::And(v, byte), hn::Set(d, (bytes & 0xFF) * lower));
+    const auto second =
+        hn::Mul(hn::And(hn::ShiftRight<8>(v), byte), hn::Set(d, (bytes >> 8 & 0xFF) * lower));
+    const auto third = hn::Mul(hn::ShiftRight<16>(v), hn::Set(d, (bytes >> 16) * upper));
+    return hn::Add(hn::Add(first, second), third);
+#endif
+}
+
+// Of each 16-bit lane the sum of its two signed bytes by an unsigned factor each,
+// which fits 16 bits.
+template <uint8_t kLower, uint8_t kUpper, class D16>
+HWY_INLINE hn::Vec<D16> weightedPairSum(D16 d, hn::Vec<D16> v) {
+#if QUILLON_X86_SSSE3
+    const auto factors = hn::Set(d, static_cast<int16_t>(kUpper << 8 | kLower));
+    return hn::Vec<D16>{detail::multiplyBytes(factors.raw, v.raw)};
+#else
+    const auto lower = hn::ShiftRight<8>(hn::ShiftLeft<8>(v));
+    return hn::Add(hn::Mul(lower, hn::Set(d, kLower)),
+                   hn::Mul(hn::ShiftRight<8>(v), hn::Set(d, kUpper)));
+#endif
+}
+
+// ---- Narrowing ------------------------------------------------------------
+
+// Whether narrowing pairs of vectors leaves the blocks of both interleaved.
+inline constexpr bool kPacksWithinBlocks = QUILLON_X86_SSSE3;
+
+// Signed 16-bit lanes to signed bytes, saturated.  Where kPacksWithinBlocks, each
+// block has the lanes of first's block and then those of second's.
+template <class D8, class D16 = hn::Repartition<int16_t, D8>>
+HWY_INLINE hn::Vec<D8> narrowSaturated([[maybe_unused]] D8 d8, hn::Vec<D16> first,
+                                       hn::Vec<D16> second) {
+#if QUILLON_X86_SSSE3
+    return hn::Vec<D8>{detail::packSigned16(first.raw, second.raw)};
+#else
+    const hn::RebindToSigned<D8> signed8;
+    const hn::Half<decltype(signed8)> half;
+    return hn::BitCast(
+        d8, hn::Combine(signed8, hn::DemoteTo(half, second), hn::DemoteTo(half, first)));
+#endif
+}
+
+#if QUILLON_X86_AVX2
+
+namespace detail {
+
+// Packing takes a piece of each vector in turn within a block.  These 32-bit
+// indices bring the pieces of the first vector in front.
+template <size_t kWords, size_t kVectors>
+struct PackedOrder {
+    alignas(64) uint32_t words[kWords] = {};
+    constexpr PackedOrder() {
+        constexpr size_t kPiece = 4 / kVectors, kBlocks = kWords / 4;
+        for (size_t i = 0; i < kWords; ++i) {
+            const size_t piece = i / kPiece;
+            const size_t from = piece % kBlocks * kVectors + piece / kBlocks;
+            words[i] = static_cast<uint32_t>(from * kPiece + i % kPiece);
+        }
+    }
+};
+template <size_t kWords, size_t kVectors>
+inline constexpr PackedOrder<kWords, kVectors> kPackedOrder;
+
+template <size_t kVectors, class D>
+HWY_INLINE hn::Vec<D> inPackedOrder(D d, hn::Vec<D> packed) {
+    const hn::Repartition<uint32_t, D> d32;
+    constexpr size_t n = kLanes<decltype(d32)>;
+    if constexpr (n == 4)
+        return packed;
+    else
+        return hn::BitCast(
+            d, hn::TableLookupLanes(hn::BitCast(d32, packed),
+                                    hn::SetTableIndices(d32, kPackedOrder<n, kVectors>.words)));
+}
+
+} // namespace detail
+
+// Two vectors of 32-bit lanes, of values that fit, to 16 bits.
+template <class D16, class V>
+HWY_INLINE hn::Vec<D16> narrowTo16(D16 d16, V a, V b) {
+    return detail::inPackedOrder<2>(d16, hn::Vec<D16>{detail::packUnsigned32(a.raw, b.raw)});
+}
+
+// Two vectors of 16-bit lanes, of values that fit, to 8 bits.
+template <class D8, class V>
+HWY_INLINE hn::Vec<D8> narrowTo8(D8 d8, V a, V b) {
+    return detail::inPackedOrder<2>(d8, hn::Vec<D8>{detail::packUnsigned16(a.raw, b.raw)});
+}
+
+// Four vectors of 32-bit lanes, of values that fit, to 8 bits.
+template <class D8, class V>
+HWY_INLINE hn::Vec<D8> narrowTo8(D8 d8, const V (&v)[4]) {
+    const auto halves = detail::packUnsigned16(detail::packUnsigned32(v[0].raw, v[1].raw),
+                                               detail::packUnsigned32(v[2].raw, v[3].raw));
+    return detail::inPackedOrder<4>(d8, hn::Vec<D8>{halves});
+}
+
+#else
+
+template <class D, class V>
+HWY_INLINE hn::Vec<D> narrowPair(D d, V a, V b) {
+    const hn::Half<D> half;
+    return hn::Combine(d, hn::TruncateTo(half, b), hn::TruncateTo(half, a));
+}
+template <class D16, class V>
+HWY_INLINE hn::Vec<D16> narrowTo16(D16 d16, V a, V b) {
+    return narrowPair(d16, a, b);
+}
+template <class D8, class V>
+HWY_INLINE hn::Vec<D8> narrowTo8(D8 d8, V a, V b) {
+    return narrowPair(d8, a, b);
+}
+template <class D8, class V>
+HWY_INLINE hn::Vec<D8> narrowTo8(D8 d8, const V (&v)[4]) {
+    const hn::Repartition<uint16_t, D8> d16;
+    return narrowPair(d8, narrowPair(d16, v[0], v[1]), narrowPair(d16, v[2], v[3]));
+}
+
+#endif
+
+// ---- Widening -------------------------------------------------------------
+
+// 32-bit indices that put the 8-byte pieces of a vector's first half in the lower
+// halves of its blocks, and those of its second half in the upper ones.
+template <size_t kWords>
+struct WideningOrder {
+    alignas(64) uint32_t words[kWords] = {};
+    constexpr WideningOrder() {
+        for (size_t i = 0; i < kWords; ++i) {
+            const size_t block = i / 4, half = i / 2 % 2;
+            words[i] = static_cast<uint32_t>(half * kWords / 2 + block * 2 + i % 2);
+        }
+    }
+};
+template <size_t kWords>
+inline constexpr WideningOrder<kWords> kWideningOrder;
+
+// 16-bit lanes in the order that interleaving within blocks makes consecutive.
+template <class D16>
+HWY_INLINE hn::Vec<D16> loadForInterleave(D16 d16, const uint8_t *src) {
+    const auto v = loadBytes(d16, src);
+    const hn::Repartition<uint32_t, D16> d32;
+    constexpr size_t n = kLanes<decltype(d32)>;
+    if constexpr (n <= 4)
+        return v;
+    else
+        return hn::BitCast(
+            d16, hn::TableLookupLanes(hn::BitCast(d32, v),
+                                      hn::SetTableIndices(d32, kWideningOrder<n>.words)));
+}
+
+// Two vectors of 32-bit lanes from their halves, which are in that order.
+template <class D, class V>
+HWY_INLINE void interleaveHalves(D d, V low, V high, hn::Vec<D> &first, hn::Vec<D> &second) {
+    const hn::Repartition<uint16_t, D> d16;
+    first = hn::BitCast(d, hn::InterleaveLower(d16, low, high));
+    second = hn::BitCast(d, hn::InterleaveUpper(d16, low, high));
+}
+
+#endif
+} // namespace quillon::HWY_NAMESPACE
+HWY_AFTER_NAMESPACE();
+
+#endif

@@ -1,0 +1,225 @@
+// The walk along a row, written once for all kernels.
+//
+// A row is counted in units: pixels or bytes, as the kernel sees fit.  A kernel is
+// a body: a struct that holds what is constant along the row, and whose
+//
+//     template <class C, class Access>
+//     void operator()(C chunk, size_t i, Access access) const
+//
+// handles the units i to i + C::kUnits - 1, loading and storing through access
+// (see access-inl.h).  A body whose rows are aligned also has
+//
+//     uint8_t *dst;                          // the row's first unit
+//     static constexpr size_t kDstBytes;     // of a unit
+//
+// and one that prefetches has
+//
+//     template <class C> void prefetch(C chunk, size_t i, PrefetchDistance) const
+//
+// A row is a head up to the first cache line, whole chunks, and a tail.  All three
+// run the same body, so that there is no second algorithm for the ends of rows,
+// and no byte outside the row is touched.
+//
+// Included once per instruction set; the usual guards do not apply.
+
+#if defined(QUILLON_SIMD_ROW_LOOP_INL_H) == defined(HWY_TARGET_TOGGLE)
+#ifdef QUILLON_SIMD_ROW_LOOP_INL_H
+#undef QUILLON_SIMD_ROW_LOOP_INL_H
+#else
+#define QUILLON_SIMD_ROW_LOOP_INL_H
+#endif
+
+#include "hwy/highway.h"
+
+#include "simd/access-inl.h"
+#include "simd/target-inl.h"
+
+#include <type_traits>
+#include <utility>
+
+HWY_BEFORE_NAMESPACE();
+namespace quillon::HWY_NAMESPACE {
+#if QUILLON_HAS_VECTORS
+
+// The units that one call of a body handles, and which of the calls of an
+// unrolled loop it is.
+template <size_t kUnitsIn, size_t kTurnIn = 0>
+struct Chunk {
+    static constexpr size_t kUnits = kUnitsIn;
+    static constexpr size_t kTurn = kTurnIn;
+};
+
+// What becomes of the units behind the last whole chunk.
+enum class Tail {
+    // One more chunk that ends with the row, over units that are done already: for
+    // bodies that store the same bytes when run again.
+    kOverlap,
+    // Each unit once: a chunk of which only the first lanes are touched, where
+    // kHasMaskedTails, else chunks of half the size, a quarter and so on.
+    kExact,
+    // Left to the caller.
+    kNone,
+};
+
+struct RowPolicy {
+    Tail tail = Tail::kOverlap;
+    size_t unroll = 1;
+    bool prefetches = false;
+};
+
+// Calls use with the first of the chunk sizes, which fall, that is not above kMost
+// and fits in count units.  The last size has to fit.
+template <size_t kMost, size_t kSize, size_t... kSmaller, class Use>
+HWY_INLINE void withWidestChunk(size_t count, const Use &use) {
+    if constexpr (sizeof...(kSmaller) != 0 && kSize > kMost) {
+        withWidestChunk<kMost, kSmaller...>(count, use);
+    } else {
+        if constexpr (sizeof...(kSmaller) != 0) {
+            if (count < kSize)
+                return withWidestChunk<kMost, kSmaller...>(count, use);
+        }
+        use(Chunk<kSize>());
+    }
+}
+
+// The rest of a row of which less than 2 * kUnits units are left, each smaller
+// chunk at most once.
+template <size_t kUnits, class Body>
+HWY_INLINE void walkHalves(size_t i, size_t end, const Body &body) {
+    if ((end - i) & kUnits) {
+        body(Chunk<kUnits>(), i, Unaligned());
+        i += kUnits;
+    }
+    if constexpr (kUnits > 1)
+        walkHalves<kUnits / 2>(i, end, body);
+}
+
+template <class Access, size_t kUnits, class Body, size_t... kTurns>
+HWY_INLINE void walkTurns(size_t i, const Body &body, std::index_sequence<kTurns...> /*turns*/) {
+    (body(Chunk<kUnits, kTurns>(), i + kTurns * kUnits, Access()), ...);
+}
+
+// Whole chunks, fewer than kUnroll.  Returns where they end.
+template <class Access, size_t kUnits, size_t kUnroll, size_t kTurn, class Body>
+HWY_INLINE size_t walkRestOfTurns(size_t i, size_t end, const Body &body) {
+    if constexpr (kTurn + 1 < kUnroll) {
+        if (end - i >= kUnits) {
+            body(Chunk<kUnits, kTurn>(), i, Access());
+            return walkRestOfTurns<Access, kUnits, kUnroll, kTurn + 1>(i + kUnits, end, body);
+        }
+    }
+    return i;
+}
+
+// Whole chunks from begin on, and the tail.  Tail::kOverlap needs end to be kUnits
+// or more.  Returns where the whole chunks end.
+template <RowPolicy kPolicy, class Access, size_t kUnits, class Body>
+HWY_INLINE size_t walkFrom(Chunk<kUnits> chunk, size_t begin, size_t end, const Body &body,
+                           [[maybe_unused]] PrefetchDistance distance = {}) {
+    constexpr size_t kStep = kPolicy.unroll * kUnits;
+    size_t i = begin;
+    for (; end - i >= kStep; i += kStep) {
+        if constexpr (kPolicy.prefetches)
+            body.prefetch(Chunk<kStep>(), i, distance);
+        walkTurns<Access, kUnits>(i, body, std::make_index_sequence<kPolicy.unroll>());
+    }
+    i = walkRestOfTurns<Access, kUnits, kPolicy.unroll, 0>(i, end, body);
+
+    if constexpr (kPolicy.tail == Tail::kOverlap) {
+        if (i != end)
+            body(chunk, end - kUnits, Unaligned());
+    } else if constexpr (kPolicy.tail == Tail::kExact) {
+        if constexpr (kHasMaskedTails) {
+            if (i != end)
+                body(chunk, i, FirstLanes{end - i});
+        } else if constexpr (kUnits > 1) {
+            walkHalves<kUnits / 2>(i, end, body);
+        }
+    }
+    return i;
+}
+
+// A row of at least kUnits units at any address.
+template <RowPolicy kPolicy = RowPolicy{}, size_t kUnits, class Body>
+HWY_INLINE void walkRow(Chunk<kUnits> chunk, size_t count, const Body &body,
+                        PrefetchDistance distance = {}) {
+    walkFrom<kPolicy, Unaligned>(chunk, 0, count, body, distance);
+}
+
+// The same, whose whole chunks begin with a cache line and have the given access.
+// Rows of which no unit begins a line, and short ones, are walked as they come.
+template <class Access, RowPolicy kPolicy = RowPolicy{}, size_t kUnits, class Body>
+HWY_INLINE void walkAlignedRow(Chunk<kUnits> chunk, size_t count, const Body &body,
+                               PrefetchDistance distance = {}) {
+    static_assert(kPolicy.tail == Tail::kOverlap, "the head is one, too");
+    const size_t head = unitsToLine<Body::kDstBytes>(body.dst);
+    if (head == kNoLine || count < kLineBytes + kUnits)
+        return walkRow<kPolicy>(chunk, count, body, distance);
+    for (size_t i = 0; i < head; i += kUnits)
+        body(chunk, i, Unaligned());
+    walkFrom<kPolicy, Access>(chunk, head, count, body, distance);
+}
+
+// A row of any length, each unit of kUnitBytes bytes once, in rising order: for
+// bodies that read what they write.
+template <size_t kUnitBytes, class Body>
+HWY_INLINE void walkRowOnce(size_t count, const Body &body) {
+    constexpr size_t kUnits = kVectorBytes / kUnitBytes;
+    const Chunk<kUnits> chunk;
+    if constexpr (kHasMaskedTails) {
+        constexpr RowPolicy kPolicy = {.tail = Tail::kExact};
+        if (count < 4)
+            return walkHalves<2>(0, count, body);
+        size_t begin = 0;
+        // Vectors that lie across two cache lines cost double.
+        if (HWY_UNLIKELY(count >= 8 * kUnits)) {
+            const size_t past = reinterpret_cast<uintptr_t>(body.dst) % kVectorBytes;
+            if (past != 0 && past % kUnitBytes == 0) {
+                begin = kUnits - past / kUnitBytes;
+                body(chunk, 0, FirstLanes{begin});
+            }
+        }
+        walkFrom<kPolicy, Unaligned>(chunk, begin, count, body);
+    } else {
+        constexpr RowPolicy kPolicy = {.tail = Tail::kExact, .unroll = 2};
+        walkFrom<kPolicy, Unaligned>(chunk, 0, count, body);
+    }
+}
+
+// The same in falling order.
+template <size_t kUnits, class Body>
+HWY_INLINE void walkHalvesBackward(size_t count, const Body &body) {
+    if (count & kUnits)
+        body(Chunk<kUnits>(), count &= ~kUnits, Unaligned());
+    if constexpr (kUnits > 1)
+        walkHalvesBackward<kUnits / 2>(count & (kUnits - 1), body);
+}
+
+template <size_t kUnitBytes, class Body>
+HWY_INLINE void walkRowOnceBackward(size_t count, const Body &body) {
+    constexpr size_t kUnits = kVectorBytes / kUnitBytes;
+    const Chunk<kUnits> chunk;
+    for (; count >= kUnits; count -= kUnits)
+        body(chunk, count - kUnits, Unaligned());
+    if constexpr (kHasMaskedTails) {
+        if (count != 0)
+            body(chunk, 0, FirstLanes{count});
+    } else {
+        walkHalvesBackward<kUnits / 2>(count, body);
+    }
+}
+
+#endif
+
+// Overlap hazard: whether a vector of the given size reads a byte that a walk
+// pixel by pixel would have written before.  That is so where the destination
+// lies ahead of the source by less than the vector.
+HWY_INLINE bool hasOverlapHazard(const uint8_t *dst, const uint8_t *src, size_t vectorBytes) {
+    const uintptr_t ahead = reinterpret_cast<uintptr_t>(dst) - reinterpret_cast<uintptr_t>(src);
+    return ahead != 0 && ahead < vectorBytes;
+}
+
+} // namespace quillon::HWY_NAMESPACE
+HWY_AFTER_NAMESPACE();
+
+#endif

@@ -1,0 +1,66 @@
+// Lookups in registers and in memory.
+//
+// Included once per instruction set; the usual guards do not apply.
+
+#if defined(QUILLON_SIMD_SHUFFLE_INL_H) == defined(HWY_TARGET_TOGGLE)
+#ifdef QUILLON_SIMD_SHUFFLE_INL_H
+#undef QUILLON_SIMD_SHUFFLE_INL_H
+#else
+#define QUILLON_SIMD_SHUFFLE_INL_H
+#endif
+
+#include "hwy/highway.h"
+
+#include "simd/target-inl.h"
+
+HWY_BEFORE_NAMESPACE();
+namespace quillon::HWY_NAMESPACE {
+#if QUILLON_HAS_VECTORS
+
+// 32-bit lanes by their index in two vectors that lie end to end.  Only the low
+// bits of an index count.
+template <class D>
+HWY_INLINE hn::Vec<D> lookupInTwo(D d, hn::Vec<D> low, hn::Vec<D> high, hn::Vec<D> index) {
+    constexpr auto n = static_cast<uint32_t>(kLanes<D>);
+#if QUILLON_X86_AVX512
+    if constexpr (n == 16)
+        return {_mm512_permutex2var_epi32(low.raw, index.raw, high.raw)};
+    else if constexpr (n == 8)
+        return {_mm256_permutex2var_epi32(low.raw, index.raw, high.raw)};
+    else if constexpr (n == 4)
+        return {_mm_permutex2var_epi32(low.raw, index.raw, high.raw)};
+#endif
+    const auto lane = hn::IndicesFromVec(d, hn::And(index, hn::Set(d, n - 1)));
+    const auto isLow = hn::Eq(hn::And(index, hn::Set(d, n)), hn::Zero(d));
+    return hn::IfThenElse(isLow, hn::TableLookupLanes(low, lane), hn::TableLookupLanes(high, lane));
+}
+
+// table[index] of each lane, four or more; no index is negative.
+//
+// A gather keeps what its register held in the lanes that are masked out, so that
+// it waits for that even where there are none.  A compiler that sees that there
+// are none leaves any register, at worst the last result; hence a mask that is
+// computed.
+template <class D, class Index>
+HWY_INLINE hn::Vec<D> gather(D d, const uint32_t *table, Index index) {
+    static_assert(kLanes<D> >= 4, "shorter gathers would look up lanes that are not there");
+#if QUILLON_X86_AVX512
+    if constexpr (kLanes<D> == 16) {
+        const __m512i zero = _mm512_setzero_si512();
+        const __mmask16 all = _mm512_cmpge_epi32_mask(index.raw, zero);
+        return hn::Vec<D>{_mm512_mask_i32gather_epi32(zero, all, index.raw, table, 4)};
+    }
+#elif QUILLON_X86_AVX2
+    if constexpr (kLanes<D> == 8)
+        return hn::Vec<D>{_mm256_mask_i32gather_epi32(_mm256_setzero_si256(),
+                                                      reinterpret_cast<const int *>(table),
+                                                      index.raw, hn::Not(index).raw, 4)};
+#endif
+    return hn::GatherIndex(d, table, index);
+}
+
+#endif
+} // namespace quillon::HWY_NAMESPACE
+HWY_AFTER_NAMESPACE();
+
+#endif

@@ -1,0 +1,80 @@
+// What the instruction set at hand can do.  Kernels ask these constants, and
+// never for a target: a newer Highway has targets that this source does not know,
+// and what fits one of them by its name would be wrong on the next.
+//
+// This folder is the only one that has intrinsics, .raw and conditions on
+// targets, each in a function that has a portable form beside it.
+//
+// Included once per instruction set; the usual guards do not apply.
+
+#if defined(QUILLON_SIMD_TARGET_INL_H) == defined(HWY_TARGET_TOGGLE)
+#ifdef QUILLON_SIMD_TARGET_INL_H
+#undef QUILLON_SIMD_TARGET_INL_H
+#else
+#define QUILLON_SIMD_TARGET_INL_H
+#endif
+
+#include "hwy/highway.h"
+
+#include <cstddef>
+#include <cstdint>
+
+// Whether there are vectors.  Without, a kernel file has plain loops in their
+// place: it asks once, for its whole body.
+#undef QUILLON_HAS_VECTORS
+#if HWY_TARGET == HWY_SCALAR || HWY_TARGET == HWY_EMU128
+#define QUILLON_HAS_VECTORS 0
+#else
+#define QUILLON_HAS_VECTORS 1
+#endif
+
+#if QUILLON_HAS_VECTORS && HWY_HAVE_SCALABLE
+#error "The size of a vector has to be known when a kernel is compiled"
+#endif
+
+// Intrinsics to write for, inside this folder only.  Better targets have lower
+// values, and a family's are next to each other.
+#undef QUILLON_X86_SSSE3
+#undef QUILLON_X86_AVX2
+#undef QUILLON_X86_AVX512
+#define QUILLON_X86_SSSE3 (HWY_ARCH_X86 && HWY_TARGET <= HWY_SSSE3)
+#define QUILLON_X86_AVX2 (QUILLON_X86_SSSE3 && HWY_CAP_GE256)
+#define QUILLON_X86_AVX512 (QUILLON_X86_AVX2 && HWY_CAP_GE512)
+
+HWY_BEFORE_NAMESPACE();
+namespace quillon::HWY_NAMESPACE {
+namespace hn = hwy::HWY_NAMESPACE;
+
+// The widest tag of lanes T.
+template <class T>
+using Widest = hn::ScalableTag<T>;
+
+template <class D>
+inline constexpr size_t kLanes = hn::MaxLanes(D());
+
+template <class D>
+inline constexpr size_t kBytesOf = kLanes<D> * sizeof(hn::TFromD<D>);
+
+// The bytes of the widest vector.
+inline constexpr size_t kVectorBytes = kBytesOf<Widest<uint8_t>>;
+
+// Loads and stores that leave out any lanes of 8 or 32 bits, and take no longer
+// for it: the tail of a row is one vector then.
+inline constexpr bool kHasMaskedTails = QUILLON_X86_AVX512;
+
+// Stores that leave out lanes of so many bytes.
+template <size_t kLaneBytes>
+inline constexpr bool kHasMaskedStores =
+    QUILLON_X86_AVX512 || (QUILLON_X86_AVX2 && kLaneBytes == 4);
+
+// Whether a gather is faster than to load its lanes one by one.
+inline constexpr bool kHasFastGather = QUILLON_X86_AVX512;
+
+// A vector's blocks are 128 bits.  Shuffles across blocks cost more than those
+// within them, so that what can be done by either is worth two forms.
+inline constexpr bool kHasManyBlocks = kVectorBytes > 16;
+
+} // namespace quillon::HWY_NAMESPACE
+HWY_AFTER_NAMESPACE();
+
+#endif

@@ -1,0 +1,52 @@
+// Where one way of walking a rectangle becomes faster than another.  All such
+// numbers of all rooms stand here, each with what set it: measured on Sapphire
+// Rapids (AVX-512 and AVX2) unless it says otherwise.  `scripts/bench --growth` and
+// `--sweep` show a number that does not fit a processor as a step or a slow point.
+#pragma once
+
+#include "core/surface.h"
+
+namespace quillon {
+
+// ---- Stores around the caches ---------------------------------------------
+
+// Destinations that are not read are written around the caches from this size on.
+// A store through the caches reads its line first and drives another one out.
+// That pays as long as the surface stays in the caches of the core: 24 GB/s around
+// them against 9 GB/s through them beyond that size, and a tenth slower where all
+// of it would have stayed in the next cache.
+inline constexpr size_t kNonTemporalBytes = size_t{3} << 19;
+
+// Shorter rows are not worth the alignment that such stores need.
+inline constexpr size_t kNonTemporalRowBytes = 256;
+
+constexpr bool isNonTemporal(ByteExtent dst) {
+    return dst.rowBytes >= kNonTemporalRowBytes && dst.rowBytes * dst.height >= kNonTemporalBytes;
+}
+
+// ---- Prefetch distances, in bytes -----------------------------------------
+
+// Ahead in long rows of a surface that is in some cache.
+inline constexpr ptrdiff_t kPrefetchInCaches = 768;
+
+// The same for the blend of surfaces that are not.
+inline constexpr ptrdiff_t kPrefetchBlendUncached = 2048;
+
+// ---- Lengths of rows, in bytes ---------------------------------------------
+
+// The copy: rows up to here are held in registers, where the call of memmove would
+// take longer than the row.
+inline constexpr size_t kCopyShortRow = 128;
+
+// Rows up to here are copied by a loop of our own, 1.2 to 1.5 times as fast as
+// memcpy, which has more means for longer ones.
+inline constexpr size_t kCopyMediumRow = 8192;
+
+// ---- Lengths of rows, in pixels --------------------------------------------
+
+// The blend: rows from here on prefetch the same place of the next row, which the
+// processor does not do of itself, and longer ones prefetch ahead in the row.
+inline constexpr size_t kPrefetchNextRow = 64;
+inline constexpr size_t kPrefetchLongRow = 1024;
+
+} // namespace quillon

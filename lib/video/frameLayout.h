@@ -1,0 +1,20 @@
+// How a video frame lies in memory.
+#pragma once
+
+#include <cstddef>
+#include <cstdint>
+
+namespace quillon {
+
+// The bytes of a frame; for the planar format also the pitch of each of its
+// three planes (bytes from row to row) and its offset from the frame's first
+// byte.  All at pointer width: the last planes of a large frame lie beyond 4 GiB.
+//
+// pitches and offsets have three entries and may be null.  A packed format sets
+// offsets[0] alone, to 0, and no pitch.
+//
+// An unknown format gives false and a size of 0, and is logged the first time.
+bool RasterComputeVideoAttributes(uint32_t format, uint32_t width, uint32_t height, size_t *size,
+                                  size_t *pitches, size_t *offsets);
+
+} // namespace quillon
