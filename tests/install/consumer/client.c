@@ -1,4 +1,5 @@
 /* A C program with nothing of its own: fills a surface and makes a BMP of it. */
+#include <hearth/hearth.h>
 #include <quillon/imageUtil.h>
 #include <quillon/raster.h>
 
