@@ -174,7 +174,8 @@ typedef struct ImageUtilMemOps {
  *                 DynBuf_Destroy; after a failure it is empty.
  */
 QUILLON_API bool ImageUtil_ConstructPNGBuffer(const ImageInfo *image,
-                                              const ImageUtilPngOptions *options, struct DynBuf *buffer);
+                                              const ImageUtilPngOptions *options,
+                                              struct DynBuf *buffer);
 
 /** Encodes an image as PNG into memory that the caller's operations provide.
  *
@@ -246,7 +247,8 @@ QUILLON_API bool ImageUtil_ConstructBMPBuffer(const ImageInfo *image, struct Dyn
  *                IMAGEUTIL_FORMAT_BMP; any other value is a Panic, before
  *                anything else is looked at
  */
-QUILLON_API bool ImageUtil_WriteImage(const ImageInfo *image, const char *fileName, uint32_t format);
+QUILLON_API bool ImageUtil_WriteImage(const ImageInfo *image, const char *fileName,
+                                      uint32_t format);
 
 /** Writes an image to a PNG file, as ImageUtil_WriteImage does, with options. */
 QUILLON_API bool ImageUtil_WritePNG(const ImageInfo *image, const char *fileName,

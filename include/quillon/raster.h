@@ -54,7 +54,8 @@ QUILLON_BEGIN_DECLS
  *                       byte first
  */
 QUILLON_API void Raster_RectFill(uint8_t *frameBuffer, int32_t lineIncrement, int32_t bytesPerPixel,
-                                 uint32_t pixel, uint32_t x, uint32_t y, uint32_t width, uint32_t height);
+                                 uint32_t pixel, uint32_t x, uint32_t y, uint32_t width,
+                                 uint32_t height);
 
 /** Copies a rectangle between two surfaces or within one.
  *
@@ -68,10 +69,10 @@ QUILLON_API void Raster_RectFill(uint8_t *frameBuffer, int32_t lineIncrement, in
  * @param bytesPerPixel  scales byte counts and is not checked; 0 or less copies
  *                       nothing
  */
-QUILLON_API void Raster_RectCopy(uint8_t *dstBuffer, int32_t dstLineIncrement, const uint8_t *srcBuffer,
-                                 int32_t srcLineIncrement, int32_t bytesPerPixel, uint32_t srcX,
-                                 uint32_t srcY, uint32_t dstX, uint32_t dstY, uint32_t width,
-                                 uint32_t height);
+QUILLON_API void Raster_RectCopy(uint8_t *dstBuffer, int32_t dstLineIncrement,
+                                 const uint8_t *srcBuffer, int32_t srcLineIncrement,
+                                 int32_t bytesPerPixel, uint32_t srcX, uint32_t srcY, uint32_t dstX,
+                                 uint32_t dstY, uint32_t width, uint32_t height);
 
 /** Sets the alpha byte of 32-bit pixels; their colour stays.
  *
@@ -93,9 +94,9 @@ QUILLON_API void Raster_RectFillAlpha(uint8_t *frameBuffer, int32_t lineIncremen
  * Rows: exact.
  */
 QUILLON_API void Raster_AlphaBlendOver(uint8_t *dstBuffer, uint32_t dstX, uint32_t dstY,
-                                       int32_t dstLineIncrement, const uint8_t *srcBuffer, uint32_t srcX,
-                                       uint32_t srcY, int32_t srcLineIncrement, uint32_t width,
-                                       uint32_t height);
+                                       int32_t dstLineIncrement, const uint8_t *srcBuffer,
+                                       uint32_t srcX, uint32_t srcY, int32_t srcLineIncrement,
+                                       uint32_t width, uint32_t height);
 
 /** @} */
 
@@ -138,9 +139,9 @@ enum {
  * @param pixel          S, of which the low bytesPerPixel bytes count
  * @param rop            the code, all 32 bits of it
  */
-QUILLON_API void Raster_RectROPfill(uint8_t *frameBuffer, int32_t lineIncrement, int32_t bytesPerPixel,
-                                    uint32_t pixel, uint32_t rop, uint32_t x, uint32_t y, uint32_t width,
-                                    uint32_t height);
+QUILLON_API void Raster_RectROPfill(uint8_t *frameBuffer, int32_t lineIncrement,
+                                    int32_t bytesPerPixel, uint32_t pixel, uint32_t rop, uint32_t x,
+                                    uint32_t y, uint32_t width, uint32_t height);
 
 /** Combines a rectangle with one of another surface or of the same one.
  *
@@ -165,8 +166,9 @@ QUILLON_API void Raster_RectROPfill(uint8_t *frameBuffer, int32_t lineIncrement,
  */
 QUILLON_API void Raster_RectROPcopy(uint8_t *dstBuffer, int32_t dstLineIncrement,
                                     const uint8_t *srcBuffer, int32_t srcLineIncrement,
-                                    int32_t bytesPerPixel, uint32_t srcX, uint32_t srcY, uint32_t rop,
-                                    uint32_t dstX, uint32_t dstY, uint32_t width, uint32_t height);
+                                    int32_t bytesPerPixel, uint32_t srcX, uint32_t srcY,
+                                    uint32_t rop, uint32_t dstX, uint32_t dstY, uint32_t width,
+                                    uint32_t height);
 
 /** @} */
 
@@ -189,14 +191,15 @@ QUILLON_API void Raster_RectROPcopy(uint8_t *dstBuffer, int32_t dstLineIncrement
  * @param bytesPerPixel  1 to 4; anything else writes nothing
  * @param foreground, background  of which the low bytesPerPixel bytes are stored
  */
-QUILLON_API void Raster_BitsToPixels(const uint8_t *srcBits, int32_t srcLineIncrement, uint8_t *dstBuffer,
-                                     int32_t dstLineIncrement, int32_t bytesPerPixel, int32_t width,
-                                     uint32_t height, uint32_t foreground, uint32_t background);
+QUILLON_API void Raster_BitsToPixels(const uint8_t *srcBits, int32_t srcLineIncrement,
+                                     uint8_t *dstBuffer, int32_t dstLineIncrement,
+                                     int32_t bytesPerPixel, int32_t width, uint32_t height,
+                                     uint32_t foreground, uint32_t background);
 
 /** Raster_BitsToPixels at 1 byte per pixel. */
-QUILLON_API void RasterBitsToPixels8(const uint8_t *srcBits, int32_t srcLineIncrement, uint8_t *dstBuffer,
-                                     int32_t dstLineIncrement, int32_t width, uint32_t height,
-                                     uint32_t foreground, uint32_t background);
+QUILLON_API void RasterBitsToPixels8(const uint8_t *srcBits, int32_t srcLineIncrement,
+                                     uint8_t *dstBuffer, int32_t dstLineIncrement, int32_t width,
+                                     uint32_t height, uint32_t foreground, uint32_t background);
 
 /** Raster_BitsToPixels at 2 bytes per pixel. */
 QUILLON_API void RasterBitsToPixels16(const uint8_t *srcBits, int32_t srcLineIncrement,
@@ -228,23 +231,23 @@ QUILLON_API void Raster_BitsToPixelsStencil(const uint8_t *srcBits, int32_t srcL
 
 /** Raster_BitsToPixelsStencil at 1 byte per pixel. */
 QUILLON_API void RasterBitsToPixelsStencil8(const uint8_t *srcBits, int32_t srcLineIncrement,
-                                            uint8_t *dstBuffer, int32_t dstLineIncrement, int32_t width,
-                                            uint32_t height, uint32_t pixel);
+                                            uint8_t *dstBuffer, int32_t dstLineIncrement,
+                                            int32_t width, uint32_t height, uint32_t pixel);
 
 /** Raster_BitsToPixelsStencil at 2 bytes per pixel. */
 QUILLON_API void RasterBitsToPixelsStencil16(const uint8_t *srcBits, int32_t srcLineIncrement,
-                                             uint8_t *dstBuffer, int32_t dstLineIncrement, int32_t width,
-                                             uint32_t height, uint32_t pixel);
+                                             uint8_t *dstBuffer, int32_t dstLineIncrement,
+                                             int32_t width, uint32_t height, uint32_t pixel);
 
 /** Raster_BitsToPixelsStencil at 3 bytes per pixel. */
 QUILLON_API void RasterBitsToPixelsStencil24(const uint8_t *srcBits, int32_t srcLineIncrement,
-                                             uint8_t *dstBuffer, int32_t dstLineIncrement, int32_t width,
-                                             uint32_t height, uint32_t pixel);
+                                             uint8_t *dstBuffer, int32_t dstLineIncrement,
+                                             int32_t width, uint32_t height, uint32_t pixel);
 
 /** Raster_BitsToPixelsStencil at 4 bytes per pixel. */
 QUILLON_API void RasterBitsToPixelsStencil32(const uint8_t *srcBits, int32_t srcLineIncrement,
-                                             uint8_t *dstBuffer, int32_t dstLineIncrement, int32_t width,
-                                             uint32_t height, uint32_t pixel);
+                                             uint8_t *dstBuffer, int32_t dstLineIncrement,
+                                             int32_t width, uint32_t height, uint32_t pixel);
 
 /** @} */
 
@@ -291,7 +294,7 @@ QUILLON_API bool Raster_IsModeReasonable(int32_t depth, int32_t bitsPerPixel, bo
  * @param dstDepth  one of the seven layouts; else a Panic
  */
 QUILLON_API uint32_t Raster_ConvertOnePixel(uint32_t pixel, int32_t srcDepth, int32_t dstDepth,
-                                          bool pseudoColor, const uint32_t *palette);
+                                            bool pseudoColor, const uint32_t *palette);
 
 /** How to place a colour component in a channel:
  * ((component * multiplier) >> shift) & mask, multiplied modulo 2^32.
@@ -312,7 +315,8 @@ typedef struct RasterRGBParam {
  * @param mask           neither 0 nor all ones; the channel's bits, rounded up
  *                       to a multiple of componentBits, must not be above 31
  */
-QUILLON_API void RasterRGB_MakeRGBParam(RasterRGBParam *param, int32_t componentBits, uint32_t mask);
+QUILLON_API void RasterRGB_MakeRGBParam(RasterRGBParam *param, int32_t componentBits,
+                                        uint32_t mask);
 
 /** @} */
 
@@ -338,11 +342,12 @@ QUILLON_API void RasterRGB_MakeRGBParam(RasterRGBParam *param, int32_t component
  *                  copy; or at most 8 with pseudoColor, one byte an index
  * @param palette   must cover every index in the rectangle
  */
-QUILLON_API void Raster_ConvertPixels(uint8_t *dstBuffer, uint32_t dstLineIncrement, int32_t dstDepth,
-                                      const uint8_t *srcBuffer, uint32_t srcLineIncrement,
-                                      int32_t srcDepth, bool pseudoColor, const uint32_t *palette,
-                                      uint32_t srcX, uint32_t srcY, uint32_t dstX, uint32_t dstY,
-                                      uint32_t width, uint32_t height);
+QUILLON_API void Raster_ConvertPixels(uint8_t *dstBuffer, uint32_t dstLineIncrement,
+                                      int32_t dstDepth, const uint8_t *srcBuffer,
+                                      uint32_t srcLineIncrement, int32_t srcDepth, bool pseudoColor,
+                                      const uint32_t *palette, uint32_t srcX, uint32_t srcY,
+                                      uint32_t dstX, uint32_t dstY, uint32_t width,
+                                      uint32_t height);
 
 /** Converts a rectangle of any source layout to 32 bits.
  *
@@ -350,9 +355,10 @@ QUILLON_API void Raster_ConvertPixels(uint8_t *dstBuffer, uint32_t dstLineIncrem
  */
 QUILLON_API void Raster_ConvertPixelsTo32(uint8_t *dstBuffer, uint32_t dstLineIncrement,
                                           const uint8_t *srcBuffer, uint32_t srcLineIncrement,
-                                          int32_t srcDepth, bool pseudoColor, const uint32_t *palette,
-                                          uint32_t srcX, uint32_t srcY, uint32_t dstX, uint32_t dstY,
-                                          uint32_t width, uint32_t height);
+                                          int32_t srcDepth, bool pseudoColor,
+                                          const uint32_t *palette, uint32_t srcX, uint32_t srcY,
+                                          uint32_t dstX, uint32_t dstY, uint32_t width,
+                                          uint32_t height);
 
 /** Converts a rectangle of 32-bit pixels to any layout.
  *
@@ -361,7 +367,8 @@ QUILLON_API void Raster_ConvertPixelsTo32(uint8_t *dstBuffer, uint32_t dstLineIn
 QUILLON_API void Raster_ConvertPixelsFrom32(uint8_t *dstBuffer, uint32_t dstLineIncrement,
                                             int32_t dstDepth, const uint8_t *srcBuffer,
                                             uint32_t srcLineIncrement, uint32_t srcX, uint32_t srcY,
-                                            uint32_t dstX, uint32_t dstY, uint32_t width, uint32_t height);
+                                            uint32_t dstX, uint32_t dstY, uint32_t width,
+                                            uint32_t height);
 
 /** Expands palette indices to whole palette entries, top byte included.
  *
@@ -370,7 +377,8 @@ QUILLON_API void Raster_ConvertPixelsFrom32(uint8_t *dstBuffer, uint32_t dstLine
 QUILLON_API void Raster_ConvertIndexTo32(uint8_t *dstBuffer, uint32_t dstLineIncrement,
                                          const uint8_t *srcBuffer, uint32_t srcLineIncrement,
                                          const uint32_t *palette, uint32_t srcX, uint32_t srcY,
-                                         uint32_t dstX, uint32_t dstY, uint32_t width, uint32_t height);
+                                         uint32_t dstX, uint32_t dstY, uint32_t width,
+                                         uint32_t height);
 
 /** Copies a rectangle between surfaces of one layout; overlap is safe as in
  * Raster_RectCopy.
@@ -380,9 +388,10 @@ QUILLON_API void Raster_ConvertIndexTo32(uint8_t *dstBuffer, uint32_t dstLineInc
  * @param depth  not checked: 3 and 6 are one byte a pixel, 15 is two, anything
  *               else depth / 8, truncated; 0 or less copies nothing
  */
-QUILLON_API void RasterCopyPixels(uint8_t *dstBuffer, uint32_t dstLineIncrement, const uint8_t *srcBuffer,
-                                  uint32_t srcLineIncrement, int32_t depth, uint32_t srcX, uint32_t srcY,
-                                  uint32_t dstX, uint32_t dstY, uint32_t width, uint32_t height);
+QUILLON_API void RasterCopyPixels(uint8_t *dstBuffer, uint32_t dstLineIncrement,
+                                  const uint8_t *srcBuffer, uint32_t srcLineIncrement,
+                                  int32_t depth, uint32_t srcX, uint32_t srcY, uint32_t dstX,
+                                  uint32_t dstY, uint32_t width, uint32_t height);
 
 /** @} */
 
@@ -422,9 +431,10 @@ QUILLON_API void RasterCopyPixels(uint8_t *dstBuffer, uint32_t dstLineIncrement,
  *         the scratch memory cannot be had
  */
 QUILLON_API uint32_t Raster_Scale(uint8_t *dstBuffer, int32_t dstLineIncrement, uint32_t dstWidth,
-                                uint32_t dstHeight, int32_t left, int32_t top, int32_t right, int32_t bottom,
-                                const uint8_t *srcBuffer, int32_t srcLineIncrement, uint32_t srcWidth,
-                                uint32_t srcHeight, double scaleX, double scaleY, uint32_t filter);
+                                  uint32_t dstHeight, int32_t left, int32_t top, int32_t right,
+                                  int32_t bottom, const uint8_t *srcBuffer,
+                                  int32_t srcLineIncrement, uint32_t srcWidth, uint32_t srcHeight,
+                                  double scaleX, double scaleY, uint32_t filter);
 
 /** Maps a rectangle of source coordinates to the destination pixels that depend
  * on it when the source is scaled: scaled, grown by one source pixel (at least
@@ -494,7 +504,7 @@ QUILLON_API void Raster_ClearRectList(RasterRectList *list);
  *         was when width or height is 0, or when the box cannot be stored
  */
 QUILLON_API uint32_t Raster_AddRect(RasterRectList *list, int32_t x, int32_t y, int32_t width,
-                                  int32_t height);
+                                    int32_t height);
 
 /** Cuts a rectangle out of a region.
  *
@@ -512,7 +522,7 @@ QUILLON_API uint32_t Raster_AddRect(RasterRectList *list, int32_t x, int32_t y, 
  *         was when width or height is 0, or when the region cannot be stored
  */
 QUILLON_API uint32_t Raster_SubRect(RasterRectList *list, int32_t x, int32_t y, int32_t width,
-                                  int32_t height);
+                                    int32_t height);
 
 /** @} */
 

@@ -98,7 +98,8 @@ QUILLON_API uint32_t Raster_CalculateCursorSize(uint32_t width, uint32_t height,
  *                   written, whatever dstSize is.
  */
 QUILLON_API void Raster_ExpandCursorBitPlane(uint32_t width, uint32_t height, uint32_t depth,
-                                             const uint8_t *bits, uint8_t *dstBuffer, uint32_t dstSize);
+                                             const uint8_t *bits, uint8_t *dstBuffer,
+                                             uint32_t dstSize);
 
 /** Brings both planes of a cursor to one depth.
  *
@@ -116,8 +117,8 @@ QUILLON_API void Raster_ExpandCursorBitPlane(uint32_t width, uint32_t height, ui
  */
 QUILLON_API void Raster_ExpandPlanarCursorData(uint32_t width, uint32_t height, uint32_t andDepth,
                                                const uint8_t *andData, uint32_t xorDepth,
-                                               const uint8_t *xorData, uint32_t depth, uint8_t *dstBuffer,
-                                               uint32_t dstSize);
+                                               const uint8_t *xorData, uint32_t depth,
+                                               uint8_t *dstBuffer, uint32_t dstSize);
 
 /** @} */
 
@@ -136,8 +137,8 @@ QUILLON_API void Raster_ExpandPlanarCursorData(uint32_t width, uint32_t height, 
  * @return 1 when some part of the cursor is on the screen, 0 otherwise
  */
 QUILLON_API uint32_t Raster_ComputeCursorBox(const RasterCursorScreen *screen,
-                                           const RasterCursor *cursor, int32_t x, int32_t y,
-                                           RasterCursorBox *box);
+                                             const RasterCursor *cursor, int32_t x, int32_t y,
+                                             RasterCursorBox *box);
 
 /** Composes a cursor over a 32-bit surface.
  *
@@ -158,9 +159,9 @@ QUILLON_API uint32_t Raster_ComputeCursorBox(const RasterCursorScreen *screen,
  *                not drawn, and nothing is copied.
  * @param box     of Raster_ComputeCursorBox for this cursor and surface
  */
-QUILLON_API void Raster_DrawCursor(uint8_t *frameBuffer, int32_t lineIncrement, uint8_t *composeBuffer,
-                                   int32_t composeLineIncrement, const RasterCursor *cursor,
-                                   const RasterCursorBox *box);
+QUILLON_API void Raster_DrawCursor(uint8_t *frameBuffer, int32_t lineIncrement,
+                                   uint8_t *composeBuffer, int32_t composeLineIncrement,
+                                   const RasterCursor *cursor, const RasterCursorBox *box);
 
 /** @} */
 

@@ -116,8 +116,8 @@ QUILLON_API void Raster_ApplyColorKey(const uint8_t *background, uint8_t *dstBuf
                                       const uint8_t *overlay, const uint8_t *keySurface,
                                       int32_t backgroundLineIncrement, int32_t dstLineIncrement,
                                       int32_t overlayLineIncrement, int32_t keyLineIncrement,
-                                      uint32_t key, uint32_t x, uint32_t y, uint32_t width, uint32_t height,
-                                      uint32_t keyDepth);
+                                      uint32_t key, uint32_t x, uint32_t y, uint32_t width,
+                                      uint32_t height, uint32_t keyDepth);
 
 /** @} */
 

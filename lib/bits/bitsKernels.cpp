@@ -412,8 +412,8 @@ namespace quillon {
 HWY_EXPORT(BitsToPixels);
 HWY_EXPORT(StencilRows);
 
-void bitsToPixelRows(DstRows dst, SrcRows bits, Size size, int32_t bytesPerPixel, uint32_t foreground,
-                     uint32_t background) {
+void bitsToPixelRows(DstRows dst, SrcRows bits, Size size, int32_t bytesPerPixel,
+                     uint32_t foreground, uint32_t background) {
     HWY_DYNAMIC_DISPATCH(BitsToPixels)(dst, bits, size, bytesPerPixel, foreground, background);
 }
 

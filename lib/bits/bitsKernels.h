@@ -7,8 +7,8 @@
 namespace quillon {
 
 // Foreground for a set bit, background for a clear one.
-void bitsToPixelRows(DstRows dst, SrcRows bits, Size size, int32_t bytesPerPixel, uint32_t foreground,
-                     uint32_t background);
+void bitsToPixelRows(DstRows dst, SrcRows bits, Size size, int32_t bytesPerPixel,
+                     uint32_t foreground, uint32_t background);
 
 // The pixel for a set bit; memory under a clear one is not touched.
 void stencilRows(DstRows dst, SrcRows bits, Size size, int32_t bytesPerPixel, uint32_t pixel);

@@ -20,7 +20,8 @@ inline uint32_t blendOverPixel(uint32_t dst, uint32_t src) {
     return blended;
 }
 
-inline void blendOverRowPlain(uint8_t *dst, const uint8_t *src, size_t width) {
+// Not to be inlined: it is rare, and would take registers from the kernel.
+[[gnu::noinline]] inline void blendOverRowPlain(uint8_t *dst, const uint8_t *src, size_t width) {
     for (size_t i = 0; i < 4 * width; i += 4) {
         uint32_t under, over;
         std::memcpy(&under, dst + i, 4);

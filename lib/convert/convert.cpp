@@ -2,11 +2,11 @@
 
 #include <quillon/raster.h>
 
-#include "core/failure.h"
-#include "legacy/surface.h"
-#include "legacy/copyRows.h"
-#include "convert/pixelFormats.h"
 #include "convert/convertKernels.h"
+#include "convert/pixelFormats.h"
+#include "core/failure.h"
+#include "legacy/copyRows.h"
+#include "legacy/surface.h"
 
 #include <bit>
 
@@ -78,7 +78,8 @@ struct Transfer {
 };
 
 // Line increments count in whole pixels of their layout, from the first row on.
-void convert(Layout dstLayout, Layout srcLayout, const uint32_t *palette, const Transfer &transfer) {
+void convert(Layout dstLayout, Layout srcLayout, const uint32_t *palette,
+             const Transfer &transfer) {
     if (transfer.size().empty())
         return;
     const int32_t dstBytes = bytesPerPixelOf(dstLayout);
@@ -165,8 +166,8 @@ bool Raster_IsModeReasonable(int32_t depth, int32_t bitsPerPixel, bool pseudoCol
     }
 }
 
-uint32_t Raster_ConvertOnePixel(uint32_t pixel, int32_t srcDepth, int32_t dstDepth, bool pseudoColor,
-                              const uint32_t *palette) {
+uint32_t Raster_ConvertOnePixel(uint32_t pixel, int32_t srcDepth, int32_t dstDepth,
+                                bool pseudoColor, const uint32_t *palette) {
     if (pseudoColor) {
         if (srcDepth != 8) {
             reject(kBadPseudoDepth, srcDepth);
@@ -242,10 +243,11 @@ void Raster_ConvertPixels(uint8_t *dstBuffer, uint32_t dstLineIncrement, int32_t
     }
 }
 
-void Raster_ConvertPixelsTo32(uint8_t *dstBuffer, uint32_t dstLineIncrement, const uint8_t *srcBuffer,
-                              uint32_t srcLineIncrement, int32_t srcDepth, bool pseudoColor,
-                              const uint32_t *palette, uint32_t srcX, uint32_t srcY, uint32_t dstX,
-                              uint32_t dstY, uint32_t width, uint32_t height) {
+void Raster_ConvertPixelsTo32(uint8_t *dstBuffer, uint32_t dstLineIncrement,
+                              const uint8_t *srcBuffer, uint32_t srcLineIncrement, int32_t srcDepth,
+                              bool pseudoColor, const uint32_t *palette, uint32_t srcX,
+                              uint32_t srcY, uint32_t dstX, uint32_t dstY, uint32_t width,
+                              uint32_t height) {
     convertTo32(srcDepth, pseudoColor, palette,
                 {dstBuffer, dstLineIncrement, srcBuffer, srcLineIncrement, srcX, srcY, dstX, dstY,
                  width, height});
@@ -259,16 +261,17 @@ void Raster_ConvertPixelsFrom32(uint8_t *dstBuffer, uint32_t dstLineIncrement, i
                              dstX, dstY, width, height});
 }
 
-void Raster_ConvertIndexTo32(uint8_t *dstBuffer, uint32_t dstLineIncrement, const uint8_t *srcBuffer,
-                             uint32_t srcLineIncrement, const uint32_t *palette, uint32_t srcX,
-                             uint32_t srcY, uint32_t dstX, uint32_t dstY, uint32_t width, uint32_t height) {
+void Raster_ConvertIndexTo32(uint8_t *dstBuffer, uint32_t dstLineIncrement,
+                             const uint8_t *srcBuffer, uint32_t srcLineIncrement,
+                             const uint32_t *palette, uint32_t srcX, uint32_t srcY, uint32_t dstX,
+                             uint32_t dstY, uint32_t width, uint32_t height) {
     convertIndexTo32(palette, {dstBuffer, dstLineIncrement, srcBuffer, srcLineIncrement, srcX, srcY,
                                dstX, dstY, width, height});
 }
 
 void RasterCopyPixels(uint8_t *dstBuffer, uint32_t dstLineIncrement, const uint8_t *srcBuffer,
-                      uint32_t srcLineIncrement, int32_t depth, uint32_t srcX, uint32_t srcY, uint32_t dstX,
-                      uint32_t dstY, uint32_t width, uint32_t height) {
+                      uint32_t srcLineIncrement, int32_t depth, uint32_t srcX, uint32_t srcY,
+                      uint32_t dstX, uint32_t dstY, uint32_t width, uint32_t height) {
     copy(depth, {dstBuffer, dstLineIncrement, srcBuffer, srcLineIncrement, srcX, srcY, dstX, dstY,
                  width, height});
 }

@@ -7,8 +7,8 @@
 #include "hwy/foreach_target.h"
 #include "hwy/highway.h"
 
-#include "legacy/kernels-inl.h"
 #include "convert/pixelFormats-inl.h"
+#include "legacy/kernels-inl.h"
 #include "legacy/streaming-inl.h"
 
 // A conversion goes over a row in blocks, as many pixels as a vector has bytes.  It

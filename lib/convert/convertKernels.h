@@ -1,8 +1,8 @@
 // The lower floor of the pixel conversions.
 #pragma once
 
-#include "legacy/surface.h"
 #include "convert/pixelFormats.h"
+#include "legacy/surface.h"
 
 namespace quillon {
 

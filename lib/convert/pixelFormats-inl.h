@@ -14,10 +14,10 @@
 
 #include "hwy/highway.h"
 
+#include "convert/pixelFormats.h"
 #include "legacy/kernels-inl.h"
 #include "legacy/narrowing-inl.h"
 #include "legacy/packed24-inl.h"
-#include "convert/pixelFormats.h"
 #include "legacy/streaming-inl.h"
 
 #include <bit>

@@ -18,5 +18,5 @@ void Raster_RectCopy(uint8_t *dstBuffer, int32_t dstLineIncrement, const uint8_t
     const DstRows dst = {pixelAddress(dstBuffer, dstLineIncrement, bytesPerPixel, dstX, dstY),
                          dstLineIncrement};
     copyRows(dst, src, inBytes(extent, bytesPerPixel),
-                 srcY < dstY ? RowOrder::kUpward : RowOrder::kDownward);
+             srcY < dstY ? RowOrder::kUpward : RowOrder::kDownward);
 }

@@ -193,7 +193,8 @@ bool scalePadded(const ScaledShape &shape, uint8_t *dst, uint32_t width, uint32_
 //
 // The border keeps the cursor's own pixels away from the edges, where the scaler
 // has rules of its own.
-Block<uint8_t> RasterScaleCursorImage(const ScaledShape &shape, const uint8_t *image, ImageKind kind) {
+Block<uint8_t> RasterScaleCursorImage(const ScaledShape &shape, const uint8_t *image,
+                                      ImageKind kind) {
     const uint32_t width = shape.x.dstSize, height = shape.y.dstSize;
     Block<uint8_t> scaled = allocateImage(width, height);
     if (scaled == nullptr)
@@ -267,8 +268,8 @@ uint32_t Raster_CalculateCursorSize(uint32_t width, uint32_t height, uint32_t de
     return size > std::numeric_limits<uint32_t>::max() ? kNoSize : static_cast<uint32_t>(size);
 }
 
-void Raster_ExpandCursorBitPlane(uint32_t width, uint32_t height, uint32_t depth, const uint8_t *bits,
-                                 uint8_t *dstBuffer, uint32_t dstSize) {
+void Raster_ExpandCursorBitPlane(uint32_t width, uint32_t height, uint32_t depth,
+                                 const uint8_t *bits, uint8_t *dstBuffer, uint32_t dstSize) {
     const Plane plane = {width, height, depth, Raster_CalculateCursorSize(width, height, depth)};
     if (plane.size > dstSize) {
         panicVerify(kUnit);
@@ -280,8 +281,9 @@ void Raster_ExpandCursorBitPlane(uint32_t width, uint32_t height, uint32_t depth
 }
 
 void Raster_ExpandPlanarCursorData(uint32_t width, uint32_t height, uint32_t andDepth,
-                                   const uint8_t *andData, uint32_t xorDepth, const uint8_t *xorData,
-                                   uint32_t depth, uint8_t *dstBuffer, uint32_t dstSize) {
+                                   const uint8_t *andData, uint32_t xorDepth,
+                                   const uint8_t *xorData, uint32_t depth, uint8_t *dstBuffer,
+                                   uint32_t dstSize) {
     Plane plane = {width, height, depth, Raster_CalculateCursorSize(width, height, depth)};
     const bool hasTotal = plane.size <= kNoSize / 2;
     if (dstSize < (hasTotal ? 2 * plane.size : kNoSize)) {
@@ -303,7 +305,7 @@ void Raster_ExpandPlanarCursorData(uint32_t width, uint32_t height, uint32_t and
 }
 
 uint32_t Raster_ComputeCursorBox(const RasterCursorScreen *screen, const RasterCursor *cursor,
-                               int32_t x, int32_t y, RasterCursorBox *box) {
+                                 int32_t x, int32_t y, RasterCursorBox *box) {
     const auto columns =
         findVisible(static_cast<uint32_t>(x) - cursor->hotspotX, cursor->width, screen->width);
     if (!columns)

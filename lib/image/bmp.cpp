@@ -1,7 +1,7 @@
 // Writing BMP: 8-bit images with their palette, everything else at 24 bits.
 
-#include <hearth/hearth.h>
 #include "image/imageRecord.h"
+#include <hearth/hearth.h>
 
 #include <algorithm>
 #include <array>

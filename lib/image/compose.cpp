@@ -23,9 +23,9 @@ struct Overlay {
 // What is common to all images of one canvas.
 struct Canvas {
     ImageInfo info;
-    Rect bounds;     // of all the images, in the caller's coordinates
-    int32_t srcDepth;  // of the images, where they are converted
-    bool needsAlpha; // 32 bits, made from images without alpha
+    Rect bounds;      // of all the images, in the caller's coordinates
+    int32_t srcDepth; // of the images, where they are converted
+    bool needsAlpha;  // 32 bits, made from images without alpha
 };
 
 // An axis of the canvas.  The bounds can be wider than an int32_t tells.
@@ -53,7 +53,8 @@ Canvas planCanvas(const ImageInfo *images, const RectPoint *positions, uint32_t 
     uint64_t coveredArea = 0;
     for (uint32_t i = 0; i < count; ++i) {
         Rect rect;
-        Rect_SetFromXYWH(&rect, positions[i].x, positions[i].y, static_cast<int32_t>(images[i].width),
+        Rect_SetFromXYWH(&rect, positions[i].x, positions[i].y,
+                         static_cast<int32_t>(images[i].width),
                          static_cast<int32_t>(images[i].height));
         Rect_Union(&canvas.bounds, &rect);
         coveredArea += areaOf(images[i]);
@@ -96,8 +97,8 @@ bool arePaintable(const Canvas &canvas, const ImageInfo *images, uint32_t count)
 // the image's rows, whatever its width says.
 Overlay clipToCanvas(const Canvas &canvas, const ImageInfo &image, RectPoint position) {
     const uint32_t srcBytesPerPixel = !canvas.needsAlpha     ? bytesPerPixel(canvas.info)
-                                    : canvas.srcDepth <= 8 ? 1
-                                                           : bytesAtDepth(canvas.srcDepth);
+                                      : canvas.srcDepth <= 8 ? 1
+                                                             : bytesAtDepth(canvas.srcDepth);
     const uint32_t inRow = srcBytesPerPixel == 0 ? 0 : image.bytesPerLine / srcBytesPerPixel;
     const int64_t left = int64_t{position.x} - canvas.bounds.left;
     const int64_t top = int64_t{position.y} - canvas.bounds.top;
@@ -142,8 +143,9 @@ void paintWithAlpha(const Canvas &canvas, const ImageInfo &image, const Overlay 
 void paintPlain(const Canvas &canvas, const ImageInfo &image, const Overlay &part) {
     const ImageInfo &info = canvas.info;
     Raster_RectCopy(info.data, static_cast<int32_t>(info.bytesPerLine), image.data,
-                    static_cast<int32_t>(image.bytesPerLine), static_cast<int32_t>(bytesPerPixel(info)),
-                    part.srcX, part.srcY, part.dstX, part.dstY, part.width, part.height);
+                    static_cast<int32_t>(image.bytesPerLine),
+                    static_cast<int32_t>(bytesPerPixel(info)), part.srcX, part.srcY, part.dstX,
+                    part.dstY, part.width, part.height);
 }
 
 } // namespace
@@ -251,9 +253,10 @@ bool scaleCrop(uint8_t *block, size_t pitch, const uint8_t *first, const ImageIn
 
 } // namespace
 
-bool ImageUtil_CropAndScaleImage(const ImageInfo *src, int32_t srcLeft, int32_t srcTop, int32_t srcRight,
-                                 int32_t srcBottom, int32_t dstLeft, int32_t dstTop, int32_t dstRight,
-                                 int32_t dstBottom, ImageInfo *result) {
+bool ImageUtil_CropAndScaleImage(const ImageInfo *src, int32_t srcLeft, int32_t srcTop,
+                                 int32_t srcRight, int32_t srcBottom, int32_t dstLeft,
+                                 int32_t dstTop, int32_t dstRight, int32_t dstBottom,
+                                 ImageInfo *result) {
     Crop crop = {};
     if (!resolveEdges(srcLeft, srcRight, src->width, &crop.left, &crop.width) ||
         !resolveEdges(srcTop, srcBottom, src->height, &crop.top, &crop.height) || dstLeft != 0 ||

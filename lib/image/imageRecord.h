@@ -2,16 +2,15 @@
 // from one.
 #pragma once
 
+#include "convert/pixelFormats.h"
 #include <hearth/hearth.h>
 #include <quillon/imageUtil.h>
 #include <quillon/raster.h>
-#include "convert/pixelFormats.h"
 
 #include <cstddef>
 #include <cstdint>
 
 namespace quillon {
-
 
 inline constexpr uint32_t kMaxColors = 256;
 

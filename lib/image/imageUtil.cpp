@@ -1,7 +1,7 @@
 // The image record, and image files: what reading, writing and composing share.
 
-#include <hearth/hearth.h>
 #include "image/imageRecord.h"
+#include <hearth/hearth.h>
 
 #include "core/failure.h"
 

@@ -1,7 +1,7 @@
 // Reading PNG: which files are taken, and how libpng is asked for their pixels.
 
-#include <hearth/hearth.h>
 #include "image/imageRecord.h"
+#include <hearth/hearth.h>
 
 #include <algorithm>
 #include <csetjmp>
@@ -189,7 +189,8 @@ bool ImageUtil_ReadPNG(ImageInfo *image, const char *fileName, uint32_t flags) {
     return isRead;
 }
 
-bool ImageUtil_ReadPNGBuffer(ImageInfo *image, const uint8_t *buffer, uint32_t size, uint32_t flags) {
+bool ImageUtil_ReadPNGBuffer(ImageInfo *image, const uint8_t *buffer, uint32_t size,
+                             uint32_t flags) {
     if (buffer == nullptr || image == nullptr || size == 0) {
         return false;
     }

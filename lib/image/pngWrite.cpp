@@ -1,7 +1,7 @@
 // Writing PNG: one encoder, whose stream and memory its two entries choose.
 
-#include <hearth/hearth.h>
 #include "image/imageRecord.h"
+#include <hearth/hearth.h>
 
 #include <algorithm>
 #include <array>
@@ -28,7 +28,7 @@ struct PngWriter {
     png_rw_ptr writeFunction;
     png_structp png;
     png_infop info;
-    png_bytep *rows;  // in the order of the file
+    png_bytep *rows;    // in the order of the file
     uint8_t *converted; // the pixels at 24 bits, where the image has them at 16
 };
 

@@ -511,7 +511,7 @@ uint32_t storeBoundingBox(RasterRectList &list, const SweepBoxes &boxes) {
 // What is left of the entries, apart from them, so that their short ways save no
 // registers and make no room for this one.
 [[gnu::noinline]] uint32_t addToList(RasterRectList &list, int32_t x, int32_t y, int32_t width,
-                                   int32_t height) {
+                                     int32_t height) {
     const Rect rect = boxOf(x, y, width, height);
     Survey survey;
     surveyList(list, rect, survey);

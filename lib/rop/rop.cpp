@@ -25,8 +25,9 @@ void combineWithConstant(DstRows dst, Extent extent, int32_t bytesPerPixel, uint
 
 using namespace quillon;
 
-void Raster_RectROPfill(uint8_t *frameBuffer, int32_t lineIncrement, int32_t bytesPerPixel, uint32_t pixel,
-                        uint32_t rop, uint32_t x, uint32_t y, uint32_t width, uint32_t height) {
+void Raster_RectROPfill(uint8_t *frameBuffer, int32_t lineIncrement, int32_t bytesPerPixel,
+                        uint32_t pixel, uint32_t rop, uint32_t x, uint32_t y, uint32_t width,
+                        uint32_t height) {
     if (rop == RASTER_ROP_COPY) {
         Raster_RectFill(frameBuffer, lineIncrement, bytesPerPixel, pixel, x, y, width, height);
         return;
@@ -45,8 +46,9 @@ void Raster_RectROPfill(uint8_t *frameBuffer, int32_t lineIncrement, int32_t byt
 }
 
 void Raster_RectROPcopy(uint8_t *dstBuffer, int32_t dstLineIncrement, const uint8_t *srcBuffer,
-                        int32_t srcLineIncrement, int32_t bytesPerPixel, uint32_t srcX, uint32_t srcY,
-                        uint32_t rop, uint32_t dstX, uint32_t dstY, uint32_t width, uint32_t height) {
+                        int32_t srcLineIncrement, int32_t bytesPerPixel, uint32_t srcX,
+                        uint32_t srcY, uint32_t rop, uint32_t dstX, uint32_t dstY, uint32_t width,
+                        uint32_t height) {
     if (rop == RASTER_ROP_COPY) {
         Raster_RectCopy(dstBuffer, dstLineIncrement, srcBuffer, srcLineIncrement, bytesPerPixel,
                         srcX, srcY, dstX, dstY, width, height);

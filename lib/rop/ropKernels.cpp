@@ -141,8 +141,8 @@ void copyInvertedNonTemporal(DstRows dst, SrcRows src, ByteExtent extent) {
     hwy::FlushStream();
 }
 
-void ropCopyKernel(DstRows dst, SrcRows src, ByteExtent extent, int32_t bytesPerPixel,
-                   uint32_t rop, RowDirection direction) {
+void ropCopyKernel(DstRows dst, SrcRows src, ByteExtent extent, int32_t bytesPerPixel, uint32_t rop,
+                   RowDirection direction) {
     if (direction == RowDirection::kLeftToRight && areContiguous(dst, extent.rowBytes) &&
         areContiguous(src, extent.rowBytes))
         extent = asOneRow(extent);
@@ -166,8 +166,8 @@ void ropFillKernel(DstRows dst, ByteExtent extent, int32_t bytesPerPixel, RopCon
         }
 }
 
-void ropCopyKernel(DstRows dst, SrcRows src, ByteExtent extent, int32_t bytesPerPixel,
-                   uint32_t rop, RowDirection direction) {
+void ropCopyKernel(DstRows dst, SrcRows src, ByteExtent extent, int32_t bytesPerPixel, uint32_t rop,
+                   RowDirection direction) {
     for (size_t y = 0; y < extent.height; ++y)
         ropRowPlain(rop, dst.row(y), src.row(y), extent.rowBytes, bytesPerPixel, direction);
 }

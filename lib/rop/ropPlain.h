@@ -26,9 +26,11 @@ void ropRowPlain(uint32_t rop, uint8_t *dst, const uint8_t *src, size_t rowBytes
     }
 }
 
-// By the size of a pixel.  Three bytes count one by one.
-inline void ropRowPlain(uint32_t rop, uint8_t *dst, const uint8_t *src, size_t rowBytes,
-                        int32_t bytesPerPixel, RowDirection direction) {
+// By the size of a pixel.  Three bytes count one by one.  Not to be inlined: it is
+// rare, and would take registers from the kernels.
+[[gnu::noinline]] inline void ropRowPlain(uint32_t rop, uint8_t *dst, const uint8_t *src,
+                                          size_t rowBytes, int32_t bytesPerPixel,
+                                          RowDirection direction) {
     if (bytesPerPixel == 2)
         ropRowPlain<uint16_t>(rop, dst, src, rowBytes, direction);
     else if (bytesPerPixel == 4)

@@ -98,7 +98,8 @@ struct QuarterBody {
         auto above = QuarterMix::complementsAt<kToEnd>(d, upper + offset);
         auto below = QuarterMix::complementsAt<kToEnd>(d, lower + offset);
         if constexpr (kToEnd) {
-            const auto isWhole = hn::Lt(hn::Iota(d, 0), hn::Set(d, whole - static_cast<uint32_t>(i)));
+            const auto isWhole =
+                hn::Lt(hn::Iota(d, 0), hn::Set(d, whole - static_cast<uint32_t>(i)));
             const auto black = hn::Set(d, 0xFFFFFFFFu); // its complement
             above.right = hn::IfThenElse(isWhole, above.right, black);
             below.right = hn::IfThenElse(isWhole, below.right, black);
@@ -157,7 +158,7 @@ private:
         const auto below = hn::Not(loadPixels(d, lower + offset));
         const auto mixed = QuarterMix::of(d, {d, above, above}, {d, below, below});
         walkAgain<uint32_t>(count_ - averaged_,
-                          FillBody{dst + size_t{averaged_} * kPixelBytes, hn::GetLane(mixed)});
+                            FillBody{dst + size_t{averaged_} * kPixelBytes, hn::GetLane(mixed)});
     }
 
     uint32_t first_, last_, count_;
@@ -226,7 +227,8 @@ struct BoxBody {
         const auto middle = hn::IfThenElse(isLast, tail, hn::Set(d, 256u));
         const auto behind = hn::IfThenZeroElse(isLast, tail);
 
-        const uint32_t base = std::min(start >> 16, axis.srcSize - kWindows - kWindows * kPixels<D>);
+        const uint32_t base =
+            std::min(start >> 16, axis.srcSize - kWindows - kWindows * kPixels<D>);
         const auto offset = hn::Sub(first, hn::Set(d, base));
         const uint8_t *window = src + size_t{base} * kPixelBytes;
         ChannelSums<D> sums;
@@ -339,8 +341,8 @@ public:
 private:
     HWY_INLINE void averageInside(uint8_t *dst, const uint8_t *src, size_t count) const {
         if (axis_.isHalf())
-            return walkAgain<uint32_t>(count,
-                                     HalfBody{dst, src + size_t{axis_.start >> 16} * kPixelBytes});
+            return walkAgain<uint32_t>(
+                count, HalfBody{dst, src + size_t{axis_.start >> 16} * kPixelBytes});
         // Steps of whole pixels begin on whole pixels.
         const uint8_t *first = src + size_t{axis_.start >> 16} * kPixelBytes;
         if (axis_.step == 4 * kScaleOne)
@@ -365,7 +367,8 @@ private:
 
     // False when the source row is too short for windows.
     template <uint32_t kWhole>
-    HWY_INLINE bool averageClose(uint32_t whole, uint8_t *dst, const uint8_t *src, size_t count) const {
+    HWY_INLINE bool averageClose(uint32_t whole, uint8_t *dst, const uint8_t *src,
+                                 size_t count) const {
         if constexpr (kWhole == 0) {
             return false;
         } else {
@@ -390,7 +393,8 @@ private:
             sum = hn::Add(sum, sums.run(span.first + 1, whole));
             sum = hn::Add(sum, sums.weighted(middle, isLast ? span.tail : 256));
             sum = hn::Add(sum, sums.weighted(span.last, isLast ? 0 : span.tail));
-            hn::StoreU(normalised(sum, axis_.normaliser), hn::CappedTag<uint8_t, 4>(), dst + channel);
+            hn::StoreU(normalised(sum, axis_.normaliser), hn::CappedTag<uint8_t, 4>(),
+                       dst + channel);
         }
     }
 

@@ -98,7 +98,7 @@ struct RasterScaleRowClose : NearestRow {
             return walkWindows(count_, srcSize_ / kWindows, toEnd);
         if constexpr (!std::is_same_v<Store, ThroughCaches>)
             return walkStreaming<uint32_t, kPixelBytes>(dst, count_, toEnd,
-                                                      body<Store, true>(dst, src));
+                                                        body<Store, true>(dst, src));
         const auto inside = body<ThroughCaches, false>(dst, src);
         uint32_t i = 0;
         for (; inner_ - i >= n; i += n)
@@ -135,7 +135,7 @@ private:
         } else {
 #if HWY_TARGET != HWY_SCALAR
             HWY_ALIGN static constexpr uint32_t kTwice[16] = {0, 0, 1, 1, 2, 2, 3, 3,
-                                                            4, 4, 5, 5, 6, 6, 7, 7};
+                                                              4, 4, 5, 5, 6, 6, 7, 7};
             const auto half = loadPixels(hn::Half<D>(), from);
             return hn::TableLookupLanes(hn::ZeroExtendVector(d, half),
                                         hn::SetTableIndices(d, kTwice));
@@ -199,7 +199,7 @@ struct RasterScaleRowWhole : NearestRow {
             walkAgain<uint32_t>(whole_, body);
         else
             walkStreaming<uint32_t, kPixelBytes>(dst, whole_, body,
-                                               FirstOfEachBody<kDoublings, Store>{dst, from});
+                                                 FirstOfEachBody<kDoublings, Store>{dst, from});
         if (whole_ != count_)
             writeEnd(dst, src);
     }
@@ -245,7 +245,7 @@ struct RasterScaleRowSparse : NearestRow {
             walkAgain<uint32_t>(inner_, body);
         else
             walkStreaming<uint32_t, kPixelBytes>(dst, inner_, body,
-                                               GatherBody<Store>{dst, src, start_, step_});
+                                                 GatherBody<Store>{dst, src, start_, step_});
 #else
         pickSingly(dst, src);
 #endif

@@ -1,10 +1,10 @@
 // The scaler's entries: checks, and the fixed point that the kernels work in.
 
 #include "core/extended.h"
-#include <hearth/hearth.h>
-#include <quillon/raster.h>
 #include "legacy/copyRows.h"
 #include "scale/scaleKernels.h"
+#include <hearth/hearth.h>
+#include <quillon/raster.h>
 
 #include <bit>
 #include <cmath>
@@ -76,10 +76,10 @@ void scaleRange(int32_t &first, int32_t &end, uint32_t srcSize, double scale) {
 
 using namespace quillon;
 
-uint32_t Raster_Scale(uint8_t *dstBuffer, int32_t dstLineIncrement, uint32_t dstWidth, uint32_t dstHeight,
-                    int32_t left, int32_t top, int32_t right, int32_t bottom, const uint8_t *srcBuffer,
-                    int32_t srcLineIncrement, uint32_t srcWidth, uint32_t srcHeight, double scaleX,
-                    double scaleY, uint32_t filter) {
+uint32_t Raster_Scale(uint8_t *dstBuffer, int32_t dstLineIncrement, uint32_t dstWidth,
+                      uint32_t dstHeight, int32_t left, int32_t top, int32_t right, int32_t bottom,
+                      const uint8_t *srcBuffer, int32_t srcLineIncrement, uint32_t srcWidth,
+                      uint32_t srcHeight, double scaleX, double scaleY, uint32_t filter) {
     if (srcHeight > kMaxSize || srcWidth > kMaxSize || dstHeight > kMaxSize || dstWidth > kMaxSize)
         return 0;
     if (!isValidScale(scaleX) || !isValidScale(scaleY))

@@ -16,10 +16,10 @@
 
 #include "hwy/highway.h"
 #include "legacy/kernels-inl.h"
+#include "legacy/streaming-inl.h"
 #include "scale/boxRows-inl.h"
 #include "scale/nearestRows-inl.h"
 #include "scale/scaleVectors-inl.h"
-#include "legacy/streaming-inl.h"
 
 HWY_BEFORE_NAMESPACE();
 namespace quillon::HWY_NAMESPACE {
@@ -45,7 +45,7 @@ public:
         mask_ = static_cast<uint32_t>(shape.slots - 2);
         const auto behindSlots = reinterpret_cast<uintptr_t>(slots_ + shape.slots);
         auto *pixels = reinterpret_cast<uint8_t *>((behindSlots + ScaleCacheShape::kAlignment - 1) &
-                                                 -ScaleCacheShape::kAlignment);
+                                                   -ScaleCacheShape::kAlignment);
         for (size_t i = 0; i < shape.slots; ++i)
             slots_[i] = {pixels + i * shape.rowBytes, kScaleNoRow};
     }

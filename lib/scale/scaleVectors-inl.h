@@ -16,8 +16,8 @@
 #endif
 
 #include "legacy/kernels-inl.h"
-#include "scale/scaleKernels.h"
 #include "legacy/streaming-inl.h"
+#include "scale/scaleKernels.h"
 
 #include "hwy/highway.h"
 

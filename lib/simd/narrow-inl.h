@@ -131,8 +131,8 @@ HWY_INLINE hn::Vec<D8> narrowSaturated([[maybe_unused]] D8 d8, hn::Vec<D16> firs
 #else
     const hn::RebindToSigned<D8> signed8;
     const hn::Half<decltype(signed8)> half;
-    return hn::BitCast(
-        d8, hn::Combine(signed8, hn::DemoteTo(half, second), hn::DemoteTo(half, first)));
+    return hn::BitCast(d8,
+                       hn::Combine(signed8, hn::DemoteTo(half, second), hn::DemoteTo(half, first)));
 #endif
 }
 
@@ -240,9 +240,9 @@ HWY_INLINE hn::Vec<D16> loadForInterleave(D16 d16, const uint8_t *src) {
     if constexpr (n <= 4)
         return v;
     else
-        return hn::BitCast(
-            d16, hn::TableLookupLanes(hn::BitCast(d32, v),
-                                      hn::SetTableIndices(d32, kWideningOrder<n>.words)));
+        return hn::BitCast(d16,
+                           hn::TableLookupLanes(hn::BitCast(d32, v),
+                                                hn::SetTableIndices(d32, kWideningOrder<n>.words)));
 }
 
 // Two vectors of 32-bit lanes from their halves, which are in that order.

@@ -99,44 +99,44 @@ HWY_INLINE void walkTurns(size_t i, const Body &body, std::index_sequence<kTurns
     (body(Chunk<kUnits, kTurns>(), i + kTurns * kUnits, Access()), ...);
 }
 
-// Whole chunks, fewer than kUnroll.  Returns where they end.
+// Whole chunks, fewer than kUnroll.
 template <class Access, size_t kUnits, size_t kUnroll, size_t kTurn, class Body>
-HWY_INLINE size_t walkRestOfTurns(size_t i, size_t end, const Body &body) {
+HWY_INLINE void walkRestOfTurns(size_t i, size_t end, const Body &body) {
     if constexpr (kTurn + 1 < kUnroll) {
-        if (end - i >= kUnits) {
+        if (i != end) {
             body(Chunk<kUnits, kTurn>(), i, Access());
-            return walkRestOfTurns<Access, kUnits, kUnroll, kTurn + 1>(i + kUnits, end, body);
+            walkRestOfTurns<Access, kUnits, kUnroll, kTurn + 1>(i + kUnits, end, body);
         }
     }
-    return i;
 }
 
 // Whole chunks from begin on, and the tail.  Tail::kOverlap needs end to be kUnits
-// or more.  Returns where the whole chunks end.
+// or more.
 template <RowPolicy kPolicy, class Access, size_t kUnits, class Body>
-HWY_INLINE size_t walkFrom(Chunk<kUnits> chunk, size_t begin, size_t end, const Body &body,
-                           [[maybe_unused]] PrefetchDistance distance = {}) {
+HWY_INLINE void walkFrom(Chunk<kUnits> chunk, size_t begin, size_t end, const Body &body,
+                         [[maybe_unused]] PrefetchDistance distance = {}) {
     constexpr size_t kStep = kPolicy.unroll * kUnits;
+    // Computed ahead, so that it is hoisted out of the loop over the rows.
+    const size_t tail = end - (end - begin) % kUnits;
     size_t i = begin;
-    for (; end - i >= kStep; i += kStep) {
+    for (; tail - i >= kStep; i += kStep) {
         if constexpr (kPolicy.prefetches)
             body.prefetch(Chunk<kStep>(), i, distance);
         walkTurns<Access, kUnits>(i, body, std::make_index_sequence<kPolicy.unroll>());
     }
-    i = walkRestOfTurns<Access, kUnits, kPolicy.unroll, 0>(i, end, body);
+    walkRestOfTurns<Access, kUnits, kPolicy.unroll, 0>(i, tail, body);
 
     if constexpr (kPolicy.tail == Tail::kOverlap) {
-        if (i != end)
+        if (tail != end)
             body(chunk, end - kUnits, Unaligned());
     } else if constexpr (kPolicy.tail == Tail::kExact) {
         if constexpr (kHasMaskedTails) {
-            if (i != end)
-                body(chunk, i, FirstLanes{end - i});
+            if (tail != end)
+                body(chunk, tail, FirstLanes{end - tail});
         } else if constexpr (kUnits > 1) {
-            walkHalves<kUnits / 2>(i, end, body);
+            walkHalves<kUnits / 2>(tail, end, body);
         }
     }
-    return i;
 }
 
 // A row of at least kUnits units at any address.
@@ -170,16 +170,15 @@ HWY_INLINE void walkRowOnce(size_t count, const Body &body) {
         constexpr RowPolicy kPolicy = {.tail = Tail::kExact};
         if (count < 4)
             return walkHalves<2>(0, count, body);
-        size_t begin = 0;
-        // Vectors that lie across two cache lines cost double.
-        if (HWY_UNLIKELY(count >= 8 * kUnits)) {
-            const size_t past = reinterpret_cast<uintptr_t>(body.dst) % kVectorBytes;
-            if (past != 0 && past % kUnitBytes == 0) {
-                begin = kUnits - past / kUnitBytes;
-                body(chunk, 0, FirstLanes{begin});
-            }
-        }
-        walkFrom<kPolicy, Unaligned>(chunk, begin, count, body);
+        // Vectors that lie across two cache lines cost double: rows of some length
+        // are aligned.
+        const size_t past = reinterpret_cast<uintptr_t>(body.dst) % kVectorBytes;
+        if (count < 8 * kUnits || past % kUnitBytes != 0)
+            return walkRow<kPolicy>(chunk, count, body);
+        const size_t head = past == 0 ? 0 : kUnits - past / kUnitBytes;
+        if (head != 0)
+            body(chunk, 0, FirstLanes{head});
+        walkFrom<kPolicy, Unaligned>(chunk, head, count, body);
     } else {
         constexpr RowPolicy kPolicy = {.tail = Tail::kExact, .unroll = 2};
         walkFrom<kPolicy, Unaligned>(chunk, 0, count, body);

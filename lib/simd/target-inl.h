@@ -64,8 +64,8 @@ inline constexpr bool kHasMaskedTails = QUILLON_X86_AVX512;
 
 // Stores that leave out lanes of so many bytes.
 template <size_t kLaneBytes>
-inline constexpr bool kHasMaskedStores =
-    QUILLON_X86_AVX512 || (QUILLON_X86_AVX2 && kLaneBytes == 4);
+inline constexpr bool kHasMaskedStores = QUILLON_X86_AVX512 ||
+                                         (QUILLON_X86_AVX2 && kLaneBytes == 4);
 
 // Whether a gather is faster than to load its lanes one by one.
 inline constexpr bool kHasFastGather = QUILLON_X86_AVX512;

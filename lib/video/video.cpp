@@ -4,9 +4,9 @@
 
 #include "core/latch.h"
 #include "legacy/surface.h"
-#include <hearth/hearth.h>
-#include "video/videoKernels.h"
 #include "video/frameLayout.h"
+#include "video/videoKernels.h"
+#include <hearth/hearth.h>
 
 #include <algorithm>
 
