@@ -2,6 +2,7 @@
 
 #include <quillon/raster.h>
 
+#include "convert/convert.h"
 #include "convert/convertKernels.h"
 #include "convert/pixelFormats.h"
 #include "core/failure.h"
@@ -99,7 +100,7 @@ void convertChecked(int32_t dstDepth, Layout srcLayout, const uint32_t *palette,
 }
 
 void copy(int32_t depth, const Transfer &transfer) {
-    const int32_t bytesPerPixel = bytesPerPixelOf(depth);
+    const int32_t bytesPerPixel = bytesPerPixelAt(depth);
     if (transfer.size().empty() || bytesPerPixel <= 0)
         return;
     const Size bytes = {transfer.size().width * static_cast<size_t>(bytesPerPixel),
@@ -148,6 +149,14 @@ void convertFrom32(int32_t dstDepth, const Transfer &transfer) {
 }
 
 } // namespace
+
+bool checkSourceDepth(int32_t depth, int line) {
+    if (depth == 15 || depth == 16 || depth == 24 || depth == 32)
+        return true;
+    reject(kBadSrcDepth, depth, line);
+    return false;
+}
+
 } // namespace quillon
 
 using namespace quillon;

@@ -74,15 +74,16 @@ constexpr bool isSmallDepth(int32_t depth) {
     return depth == 3 || depth == 6 || depth == 8;
 }
 
-// Bytes a pixel for a copy between equal layouts.  Any depth has an answer.
-constexpr int32_t bytesPerPixelOf(int32_t depth) {
+// The bytes of a pixel at a depth.  Depths that name no format have an answer, too,
+// by which pixels of equal depths are copied.
+constexpr int32_t bytesPerPixelAt(int32_t depth) {
     if (depth == 3 || depth == 6)
         return 1;
     return depth == 15 ? 2 : depth / 8;
 }
 
 constexpr int32_t bytesPerPixelOf(Layout layout) {
-    return layout == Layout::Index ? 1 : bytesPerPixelOf(static_cast<int32_t>(layout));
+    return layout == Layout::Index ? 1 : bytesPerPixelAt(static_cast<int32_t>(layout));
 }
 
 } // namespace quillon

@@ -26,7 +26,7 @@ inline int32_t conversionDepth(const ImageInfo &image) {
 
 // The bytes of a pixel that Raster_ConvertPixels reads at a depth.
 constexpr uint32_t bytesAtDepth(int32_t depth) {
-    return static_cast<uint32_t>(bytesPerPixelOf(depth));
+    return static_cast<uint32_t>(bytesPerPixelAt(depth));
 }
 
 // True when Raster_ConvertPixels widens pixels of the depth.  Otherwise it is
