@@ -1,7 +1,8 @@
-// Reading PNG: which files are taken, and how libpng is asked for their pixels.
+// Reading PNG: which files are accepted, and how libpng delivers their pixels.
+#include <hearth/hearth.h>
+#include <quillon/imageUtil.h>
 
 #include "image/imageRecord.h"
-#include <hearth/hearth.h>
 
 #include <algorithm>
 #include <csetjmp>
@@ -15,32 +16,29 @@ namespace {
 
 constexpr uint32_t kSignatureBytes = 8;
 
-// All that a decoding holds.  A libpng error jumps back over the frames between
-// without running destructors, so what has to be released is kept here, plain,
-// and outside the frame of the setjmp.
+// The state of one decoding.  An error in libpng is a longjmp, which runs no
+// destructors, so everything that has to be released is a plain pointer here, outside
+// the frame of the setjmp.
 struct PngReader {
     ImageInfo *image;
     uint32_t flags;
     ImageUtilPngReadState *state;
     png_structp png;
     png_infop info;
-    png_bytep *rows; // in the order of the file
+    png_bytep *rows; // from the top of the picture
 };
 
 bool openReader(PngReader &reader, const uint8_t *buffer, uint32_t size) {
     reader.state =
         static_cast<ImageUtilPngReadState *>(UtilSafeCalloc0(1, sizeof(ImageUtilPngReadState)));
-    if (reader.state == nullptr) {
+    if (reader.state == nullptr)
         return false;
-    }
     *reader.state = ImageUtilPngReadState{buffer, 0, size};
-    if (size < kSignatureBytes || png_sig_cmp(buffer, 0, kSignatureBytes) != 0) {
+    if (size < kSignatureBytes || png_sig_cmp(buffer, 0, kSignatureBytes) != 0)
         return false;
-    }
     reader.png = png_create_read_struct(PNG_LIBPNG_VER_STRING, nullptr, nullptr, nullptr);
-    if (reader.png == nullptr) {
+    if (reader.png == nullptr)
         return false;
-    }
     reader.info = png_create_info_struct(reader.png);
     return reader.info != nullptr;
 }
@@ -57,13 +55,13 @@ void takePalette(const PngReader &reader) {
     int count = 0;
     png_get_PLTE(reader.png, reader.info, &colors, &count);
     image.numColors = std::min(static_cast<uint32_t>(count), kMaxColors);
-    for (uint32_t i = 0; i < image.numColors; ++i) {
+    for (uint32_t i = 0; i < image.numColors; ++i)
         image.palette[i] = ImageUtilColor{colors[i].blue, colors[i].green, colors[i].red, 0};
-    }
 }
 
-// Reads everything ahead of the pixels, and has libpng deliver them as one of
-// the three formats of the record.  False for a grey file.
+// Reads the chunks ahead of the pixels, fills the record but for its stride and
+// pixels, and sets libpng up to deliver one of the record's three formats.  False
+// for a grey file.
 bool readHeader(const PngReader &reader) {
     png_structp png = reader.png;
     png_infop info = reader.info;
@@ -74,28 +72,24 @@ bool readHeader(const PngReader &reader) {
     const bool isPalette = colorType == PNG_COLOR_TYPE_PALETTE;
     const bool isRgb = colorType == PNG_COLOR_TYPE_RGB;
     const bool isRgba = colorType == PNG_COLOR_TYPE_RGB_ALPHA;
-    if (!isPalette && !isRgb && !isRgba) {
+    if (!isPalette && !isRgb && !isRgba)
         return false;
-    }
 
     const bool reduce = png_get_bit_depth(png, info) == 16;
     const bool dropAlpha = isRgba && (reader.flags & IMAGEUTIL_READ_KEEP_ALPHA) == 0;
     const bool addAlpha = isRgb && (reader.flags & IMAGEUTIL_READ_ADD_ALPHA) != 0;
     const bool unpack = isPalette && png_get_bit_depth(png, info) < 8;
-    if (reduce) {
+    if (reduce)
         png_set_scale_16(png);
-    }
-    if (dropAlpha) {
+    if (dropAlpha)
         png_set_strip_alpha(png);
-    }
-    if (addAlpha) {
+    if (addAlpha)
         png_set_add_alpha(png, 255, PNG_FILLER_AFTER);
-    }
-    if (unpack) {
+    if (unpack)
         png_set_packing(png);
-    }
     if (reduce || dropAlpha || addAlpha || unpack) {
-        // Without the first call png_read_image warns about interlaced files.
+        // After the second call png_read_image warns about interlaced files unless
+        // their handling is on.
         png_set_interlace_handling(png);
         png_read_update_info(png, info);
     }
@@ -105,70 +99,66 @@ bool readHeader(const PngReader &reader) {
     image.bpp = 8u * png_get_channels(png, info);
     image.width = png_get_image_width(png, info);
     image.height = png_get_image_height(png, info);
-    if (isPalette) {
+    if (isPalette)
         takePalette(reader);
-    }
     png_set_bgr(png);
     return true;
 }
 
-// Takes the pixel block, and points libpng's rows into it.
+// Allocates the pixels and the pointers to their rows.  Only when both are there does
+// the record get its stride and its pixels.
 bool prepareRows(PngReader &reader) {
     ImageInfo &image = *reader.image;
-    const uint64_t bytesPerLine = roundUpTo4(png_get_rowbytes(reader.png, reader.info));
-    if (bytesPerLine > UINT32_MAX / image.height) {
-        return false; // the block would pass 4 GiB
-    }
-    image.bytesPerLine = static_cast<uint32_t>(bytesPerLine);
+    const uint64_t stride = roundUpTo4(png_get_rowbytes(reader.png, reader.info));
+    if (stride > UINT32_MAX / image.height)
+        return false; // the pixels would exceed 4 GiB
 
-    image.data = static_cast<uint8_t *>(UtilSafeMalloc0(size_t{image.height} * image.bytesPerLine));
-    if (image.data == nullptr) {
+    auto *const pixels = static_cast<uint8_t *>(UtilSafeMalloc0(image.height * stride));
+    if (pixels == nullptr)
         return false;
-    }
     reader.rows =
         static_cast<png_bytep *>(UtilSafeMalloc0(size_t{image.height} * sizeof(png_bytep)));
     if (reader.rows == nullptr) {
-        ImageUtil_FreeImageData(&image);
+        std::free(pixels);
         return false;
     }
+    image.bytesPerLine = static_cast<uint32_t>(stride);
+    image.data = pixels;
 
     const bool bottomUp = (reader.flags & IMAGEUTIL_READ_BOTTOM_UP) != 0;
     for (uint32_t i = 0; i < image.height; ++i) {
         const uint32_t row = bottomUp ? image.height - 1 - i : i;
-        reader.rows[i] = image.data + size_t{row} * image.bytesPerLine;
+        reader.rows[i] = pixels + row * stride;
     }
     return true;
 }
 
-// The one frame that errors inside libpng come back to.
+// The frame that an error in libpng jumps back to.
 bool decode(PngReader &reader) {
-    if (setjmp(png_jmpbuf(reader.png)) != 0) {
+    if (setjmp(png_jmpbuf(reader.png)) != 0)
         return false;
-    }
-    if (!readHeader(reader) || !prepareRows(reader)) {
+    if (!readHeader(reader) || !prepareRows(reader))
         return false;
-    }
     png_read_image(reader.png, reader.rows);
     png_read_end(reader.png, nullptr);
     return true;
 }
 
-// The bytes of a whole file, to be released with free; null when it cannot be
-// opened, sized or read, or is empty.
+// The contents of a file, to be released with free; null when it cannot be opened,
+// sized or read, or is empty.
 uint8_t *readFile(const char *fileName, uint32_t *size) {
     FileIODescriptor file;
     FileIO_Invalidate(&file);
-    if (FileIO_Open(&file, fileName, FILEIO_ACCESS_READ, FILEIO_OPEN) != 0) {
+    if (FileIO_Open(&file, fileName, FILEIO_ACCESS_READ, FILEIO_OPEN) != 0)
         return nullptr;
-    }
     const int64_t fileSize = FileIO_GetSize(&file);
     if (fileSize < 0) {
         FileIO_Close(&file);
         return nullptr;
     }
-    const uint32_t wanted = static_cast<uint32_t>(fileSize); // the low 32 bits
+    const auto wanted = static_cast<uint32_t>(fileSize); // the low 32 bits
     size_t actual = 0;
-    uint8_t *buffer = static_cast<uint8_t *>(UtilSafeCalloc0(1, wanted));
+    auto *const buffer = static_cast<uint8_t *>(UtilSafeCalloc0(1, wanted));
     const bool isRead = buffer != nullptr && FileIO_Read(&file, buffer, wanted, &actual) == 0;
     FileIO_Close(&file);
     if (!isRead) {
@@ -191,9 +181,8 @@ bool ImageUtil_ReadPNG(ImageInfo *image, const char *fileName, uint32_t flags) {
 
 bool ImageUtil_ReadPNGBuffer(ImageInfo *image, const uint8_t *buffer, uint32_t size,
                              uint32_t flags) {
-    if (buffer == nullptr || image == nullptr || size == 0) {
+    if (buffer == nullptr || image == nullptr || size == 0)
         return false;
-    }
     std::memset(image, 0, sizeof *image);
 
     PngReader reader = {};
@@ -206,9 +195,8 @@ bool ImageUtil_ReadPNGBuffer(ImageInfo *image, const uint8_t *buffer, uint32_t s
 
 void ImageUtilReadPngCallback(png_structp png, uint8_t *dest, size_t length) {
     auto *const state = static_cast<ImageUtilPngReadState *>(png_get_io_ptr(png));
-    if (state->offset > state->size || length > state->size - state->offset) {
+    if (state->offset > state->size || length > state->size - state->offset)
         png_error(png, "Unexpected end of data");
-    }
     std::memcpy(dest, state->buffer + state->offset, length);
     state->offset += static_cast<uint32_t>(length);
 }
