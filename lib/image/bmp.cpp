@@ -1,7 +1,9 @@
 // Writing BMP: 8-bit images with their palette, everything else at 24 bits.
-
-#include "image/imageRecord.h"
 #include <hearth/hearth.h>
+#include <quillon/imageUtil.h>
+#include <quillon/raster.h>
+
+#include "image/imageConversion.h"
 
 #include <algorithm>
 #include <array>
@@ -16,7 +18,7 @@ constexpr uint32_t kFileHeaderBytes = 14;
 constexpr uint32_t kInfoHeaderBytes = 40;
 constexpr uint32_t kHeaderBytes = kFileHeaderBytes + kInfoHeaderBytes;
 
-// The sizes of a file: 64 bits hold them while width and height are below 2^31.
+// The sizes of a file.  They fit 64 bits while width and height are below 2^31.
 struct BmpLayout {
     bool hasPalette;
     uint32_t numColors;
@@ -38,8 +40,8 @@ BmpLayout layoutOf(const ImageInfo &image) {
     return layout;
 }
 
-// Whether there is a file for the image: its sizes fit the header's fields, of
-// which width and height are signed, and there are pixels.
+// Whether the image can be a BMP file: its sizes fit the header's fields, of which
+// width and height are signed, and it has pixels.
 bool hasBmpForm(const ImageInfo &image, const BmpLayout &layout) {
     return image.bpp >= 8 && image.width <= INT32_MAX && image.height <= INT32_MAX &&
            layout.fileBytes() <= UINT32_MAX && (layout.imageBytes == 0 || image.data != nullptr);
@@ -58,9 +60,8 @@ public:
 
 private:
     void put(uint64_t value, uint32_t bytes) {
-        for (uint32_t i = 0; i < bytes; ++i) {
+        for (uint32_t i = 0; i < bytes; ++i)
             *next++ = static_cast<uint8_t>(value >> (8 * i));
-        }
     }
     uint8_t *next;
 };
@@ -83,25 +84,25 @@ BmpHeaders makeHeaders(const ImageInfo &image, const BmpLayout &layout) {
     fields.put16(layout.hasPalette ? 8 : 24);
     fields.put32(0); // not compressed
     fields.put32(layout.imageBytes);
-    fields.put32(0); // pixels per metre, horizontally and vertically
+    fields.put32(0); // pixels per metre, across and down: unknown
     fields.put32(0);
     fields.put32(layout.numColors);
     fields.put32(0); // all colours are important
     return headers;
 }
 
-// One row of the file, without what follows the pixels.  Neither way reads behind
-// the end of the source row.  Gives the number of bytes.
+// Writes the pixels of one row of the file and returns the number of bytes written.
+// Nothing behind the end of the source row is read.
 uint64_t fillRow(uint8_t *fileRow, const BmpLayout &layout, const ImageInfo &image, uint32_t row) {
     const uint8_t *const source = rowAt(image, row);
     if (isCopied(image)) {
-        // With the source's padding, as far as the file's row has room for it.
+        // The source's padding goes into that of the file's row.
         const uint64_t bytes = std::min<uint64_t>(layout.rowBytes, image.bytesPerLine);
         std::memcpy(fileRow, source, bytes);
         return bytes;
     }
     const int32_t depth = conversionDepth(image);
-    const uint32_t width = std::min(image.width, image.bytesPerLine / bytesAtDepth(depth));
+    const uint32_t width = std::min(image.width, image.bytesPerLine / sourcePixelBytes(depth));
     Raster_ConvertPixels(fileRow, static_cast<uint32_t>(layout.rowBytes), 24, source,
                          image.bytesPerLine, depth, false, nullptr, 0, 0, 0, 0, width, 1);
     return uint64_t{width} * 3;
@@ -119,19 +120,17 @@ void fillRows(uint8_t *block, const BmpLayout &layout, const ImageInfo &image) {
 } // namespace
 
 bool ImageUtil_ConstructBMPBuffer(const ImageInfo *image, DynBuf *buffer) {
-    if (buffer == nullptr || image == nullptr) {
+    if (buffer == nullptr || image == nullptr)
         return false;
-    }
     const BmpLayout layout = layoutOf(*image);
     if (!hasBmpForm(*image, layout) ||
-        (!isCopied(*image) && !checkConvertible(conversionDepth(*image), 24))) {
+        (!isCopied(*image) && !checkSourceDepth(conversionDepth(*image)))) {
         return false;
     }
     const BmpHeaders headers = makeHeaders(*image, layout);
-    uint8_t *const block = static_cast<uint8_t *>(std::malloc(layout.imageBytes));
-    if (block == nullptr) {
+    auto *const block = static_cast<uint8_t *>(std::malloc(layout.imageBytes));
+    if (block == nullptr)
         return false;
-    }
     fillRows(block, layout, *image);
 
     DynBuf_Init(buffer);
@@ -141,8 +140,7 @@ bool ImageUtil_ConstructBMPBuffer(const ImageInfo *image, DynBuf *buffer) {
         (layout.paletteBytes == 0 || DynBuf_Append(buffer, image->palette, layout.paletteBytes)) &&
         DynBuf_Append(buffer, block, layout.imageBytes);
     std::free(block);
-    if (!isComplete) {
+    if (!isComplete)
         DynBuf_Destroy(buffer);
-    }
     return isComplete;
 }

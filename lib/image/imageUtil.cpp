@@ -1,7 +1,6 @@
-// The image record, and image files: what reading, writing and composing share.
-
-#include "image/imageRecord.h"
+// The image record, and image files.
 #include <hearth/hearth.h>
+#include <quillon/imageUtil.h>
 
 #include "core/failure.h"
 
@@ -10,22 +9,22 @@
 
 using namespace quillon;
 
-// Hosts in other languages rely on where the fields are.
-static_assert(sizeof(ImageUtilColor) == 4);
-static_assert(offsetof(ImageInfo, palette) == 28);
+// The layout of the records is part of the interface.
+static_assert(sizeof(ImageUtilColor) == 4 && offsetof(ImageUtilColor, red) == 2);
+static_assert(offsetof(ImageInfo, numColors) == 24 && offsetof(ImageInfo, palette) == 28);
 static_assert(sizeof(void *) != 8 || offsetof(ImageInfo, data) == 1056);
 static_assert(sizeof(void *) != 8 || sizeof(ImageInfo) == 1064);
-
-void ImageUtil_FreeImageData(ImageInfo *image) {
-    if (image->data != nullptr) {
-        std::free(image->data);
-        image->data = nullptr;
-    }
-}
+static_assert(offsetof(ImageUtilPngOptions, stripAlpha) == 4 && sizeof(ImageUtilPngOptions) == 8);
+static_assert(sizeof(void *) != 8 || offsetof(ImageUtilMemOps, realloc) == 24);
+static_assert(sizeof(void *) != 8 || sizeof(ImageUtilMemOps) == 32);
+static_assert(sizeof(void *) != 8 || offsetof(ImageUtilPngReadState, offset) == 8);
+static_assert(sizeof(void *) != 8 || sizeof(ImageUtilPngReadState) == 16);
+static_assert(sizeof(void *) != 8 || offsetof(ImageUtilPngBuffer, memOps) == 16);
+static_assert(sizeof(void *) != 8 || sizeof(ImageUtilPngBuffer) == 24);
 
 namespace {
 
-// Writes the bytes of a buffer to a file, and logs what keeps it from that.
+// Writes the bytes of a buffer to a file; logs a failure.
 bool ImageUtilWriteBuf(const DynBuf *buffer, const char *fileName) {
     constexpr char kFunction[] = "ImageUtilWriteBuf";
     FileIODescriptor file;
@@ -53,6 +52,13 @@ bool ImageUtilWriteBuf(const DynBuf *buffer, const char *fileName) {
 }
 
 } // namespace
+
+void ImageUtil_FreeImageData(ImageInfo *image) {
+    if (image->data == nullptr)
+        return;
+    std::free(image->data);
+    image->data = nullptr;
+}
 
 bool ImageUtil_WriteImage(const ImageInfo *image, const char *fileName, uint32_t format) {
     DynBuf buffer = {};
