@@ -1,5 +1,4 @@
 // Files, on the system's descriptors.
-
 #include <hearth/hearth.h>
 
 #include <cerrno>
@@ -10,7 +9,7 @@
 
 namespace {
 
-constexpr mode_t kNewFileMode = 0666; // cut down by the process's umask
+constexpr mode_t kNewFileMode = 0666; // less the process's umask
 
 // The flags of open for an access, or -1 for an access that does not exist.
 int openFlags(int access) {
@@ -26,26 +25,25 @@ int openFlags(int access) {
     }
 }
 
-// Calls transfer(offset, rest) until count bytes have gone, the file ends (a
-// transfer of 0), or an error other than an interruption.
+// Calls transfer(offset, rest) until count bytes are transferred, the file ends (a
+// transfer of 0 bytes), or an error other than an interruption.
 template <class Transfer>
 int transferAll(size_t count, size_t *actual, Transfer transfer) {
     size_t done = 0;
     int status = 0;
     while (done < count) {
-        const ssize_t step = transfer(done, count - done);
-        if (step > 0) {
-            done += static_cast<size_t>(step);
-        } else if (step == 0) {
+        const ssize_t moved = transfer(done, count - done);
+        if (moved > 0) {
+            done += static_cast<size_t>(moved);
+        } else if (moved == 0) {
             break;
         } else if (errno != EINTR) {
             status = errno;
             break;
         }
     }
-    if (actual != nullptr) {
+    if (actual != nullptr)
         *actual = done;
-    }
     return status;
 }
 
@@ -57,20 +55,17 @@ void FileIO_Invalidate(FileIODescriptor *file) {
 
 int FileIO_Open(FileIODescriptor *file, const char *name, int access, int action) {
     int flags = openFlags(access);
-    if (flags < 0 || (action != FILEIO_OPEN && action != FILEIO_OPEN_CREATE)) {
+    if (flags < 0 || (action != FILEIO_OPEN && action != FILEIO_OPEN_CREATE))
         return EINVAL;
-    }
     flags |= O_CLOEXEC;
-    if (action == FILEIO_OPEN_CREATE) {
+    if (action == FILEIO_OPEN_CREATE)
         flags |= O_CREAT | O_TRUNC;
-    }
     int fd = -1;
     do {
         fd = open(name, flags, kNewFileMode);
     } while (fd < 0 && errno == EINTR);
-    if (fd < 0) {
+    if (fd < 0)
         return errno;
-    }
     file->fd = fd;
     return 0;
 }
@@ -93,10 +88,9 @@ int FileIO_Write(FileIODescriptor *file, const void *source, size_t count, size_
 }
 
 int FileIO_Close(FileIODescriptor *file) {
-    if (file->fd < 0) {
+    if (file->fd < 0)
         return 0;
-    }
-    // The descriptor is gone whatever close says; trying again after an
+    // close releases the descriptor even when it fails.  Closing again after an
     // interruption could close a file that another thread has opened since.
     const int result = close(file->fd);
     file->fd = -1;

@@ -1,5 +1,4 @@
 // Messages to standard error.
-
 #include <hearth/hearth.h>
 
 #include <cstdarg>
