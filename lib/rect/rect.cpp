@@ -1,14 +1,18 @@
 // Rectangles and points: construction, comparison, translation, clipping.
 //
-// Outputs may be records that are inputs too, so everything is read before
-// anything is stored.
+// An output may be an input too, so all inputs are read before anything is stored.
 #include <quillon/rect.h>
 
 #include "core/coordinates.h"
 
 #include <algorithm>
+#include <cstddef>
 
 using namespace quillon;
+
+// The layout of the records is part of the interface.
+static_assert(offsetof(Rect, bottom) == 12 && sizeof(Rect) == 16);
+static_assert(offsetof(RectPoint, y) == 4 && sizeof(RectPoint) == 8);
 
 namespace {
 
@@ -26,13 +30,13 @@ bool translate(Rect &dst, const Rect &src, int64_t dx, int64_t dy) {
     return isLeftExact && isTopExact && isRightExact && isBottomExact;
 }
 
-// The last column or row inside; the smallest coordinate has none before it.
+// The last column or row inside.  There is none before the smallest coordinate.
 int32_t lastInside(int32_t end) {
     return end == kCoordinateMin ? end : end - 1;
 }
 
-// a - b as a saturating sum with the wrapped negation of b, so that the smallest
-// coordinate moves a down instead of up.
+// a - b, saturated, with the negation of b wrapping: the smallest coordinate, as b,
+// makes the result smaller than a.
 int32_t gap(int32_t a, int32_t b) {
     return saturate(int64_t{a} + wrappingSubtract(0, b));
 }

@@ -1,11 +1,9 @@
-// What carries a change, or a position, from one rectangle to another.
+// Changes and positions applied from one rectangle to another.
 //
-// The two axes are alike, and most of the work is told once, for one axis.
-// Products and sums stay within 64 bits: a difference of coordinates is below
-// 2^32 and an extent below 2^31.
+// Most functions handle one axis, as both are alike.  Products and sums fit 64 bits: a
+// difference of coordinates is below 2^32 and an extent below 2^31.
 //
-// Outputs may be records that are inputs too, so everything is read before
-// anything is stored.
+// An output may be an input too, so all inputs are read before anything is stored.
 #include <quillon/rect.h>
 
 #include "core/coordinates.h"
@@ -23,7 +21,7 @@ struct Range {
 
     bool empty() const { return lo >= hi; }
 
-    // Never negative; more than an int32_t holds counts as its largest value.
+    // From 0 to the largest int32_t.
     int64_t extent() const { return empty() ? 0 : saturate(int64_t{hi} - lo); }
 };
 
@@ -38,16 +36,16 @@ Rect fromRanges(Range x, Range y) {
     return {.left = x.lo, .top = y.lo, .right = x.hi, .bottom = y.hi};
 }
 
-// delta * numerator / denominator, truncated.  Equal extents, and an extent of
-// 0 to divide by, leave it as it is.
+// delta * numerator / denominator, truncated; delta itself when the two are equal or
+// the denominator is 0.
 int64_t scaled(int64_t delta, int64_t numerator, int64_t denominator) {
     if (numerator == denominator || denominator == 0)
         return delta;
     return delta * numerator / denominator;
 }
 
-// The range moved on both ends as from changes into to, in proportion to the
-// sizes of range and from.  True when nothing was clamped.
+// Applies the change of a range, from one to another, in proportion to the sizes of
+// range and from.  True when nothing was clamped.
 bool applyScaledDiff(Range &dst, Range range, Range from, Range to) {
     const int64_t n = range.extent();
     const int64_t d = from.extent();
@@ -119,8 +117,8 @@ bool Rect_IntersectPair(Rect *dstSource, const Rect *source, const Rect *clip, R
     Rect part;
     if (Rect_Intersect(&part, source, clip) && !columns(*target).empty() &&
         !rows(*target).empty()) {
-        // The part lies within the source, so its edges move inward and
-        // truncation rounds them outward: what is seen at all keeps a pixel.
+        // The part lies within the source, so its edges move inward and truncation
+        // rounds them outward: a part of less than one pixel maps to one pixel.
         Range x;
         Range y;
         applyScaledDiff(x, columns(*target), columns(*source), columns(part));
