@@ -1,14 +1,12 @@
 /** @file hearth.h
  *
- * libhearth: what libquillon asks of its surroundings: messages, memory, a
- * growable byte buffer, files.
+ * libhearth: messages, memory, a growable byte buffer and files for libquillon.
  *
- * It is a library of its own, linked dynamically and without symbol versions,
- * so that a host can put its own function in the place of any of these: a host
- * whose executable defines, say, Panic has its own called by libquillon.
+ * It is a separate shared library without symbol versions, so that a host can replace any
+ * of its functions: libquillon calls the one that the host's executable defines.
  *
- * A Panic of the host's may throw a C++ exception or longjmp out of the call:
- * libquillon holds nothing at that moment that would leak.
+ * A host's Panic may throw a C++ exception or longjmp out of the call: libquillon holds no
+ * memory at that moment that would leak.
  */
 #ifndef HEARTH_H
 #define HEARTH_H
@@ -36,30 +34,38 @@ extern "C" {
 
 /** Writes the message to standard error and aborts the process.
  *
- * A replacement must not return either.  One that does has the failing call
- * end at once, without effect, wherever libquillon calls it.
+ * A replacement should not return.  If it does, the function of libquillon that called it
+ * returns at once.
+ *
+ * @param format  for printf, with its arguments
  */
 HEARTH_API void Panic(const char *format, ...) HEARTH_PRINTF;
 
-/** Writes the message to standard error. */
+/** Writes the message, of an error in the caller, to standard error.
+ *
+ * @param format  for printf, with its arguments
+ */
 HEARTH_API void Warning(const char *format, ...) HEARTH_PRINTF;
 
-/** Writes the message to standard error. */
+/** Writes the message, of a failure at run time, to standard error.
+ *
+ * @param format  for printf, with its arguments
+ */
 HEARTH_API void Log(const char *format, ...) HEARTH_PRINTF;
 
 /** @} */
 
 /** @name Memory
- * Both give a block that free() releases, or null when there is none to be had
- * or the size is 0.
+ * Both return a block that the caller releases with free(), or null when memory cannot be
+ * allocated or the size is 0.
  * @{
  */
 
-/** A block of size bytes, not cleared. */
+/** Allocates a block of size bytes, not cleared. */
 HEARTH_API void *UtilSafeMalloc0(size_t size);
 
-/** A zeroed block for count items of size bytes; null too when the product
- * does not fit a size_t.
+/** Allocates a block of count items of size bytes, cleared; null too when the product does
+ * not fit a size_t.
  */
 HEARTH_API void *UtilSafeCalloc0(size_t count, size_t size);
 
@@ -72,20 +78,23 @@ HEARTH_API void *UtilSafeCalloc0(size_t count, size_t size);
 /** Bytes that grow by appending.  All-zero memory is a valid empty buffer. */
 typedef struct DynBuf {
     char *data;       /**< the bytes; null while nothing is allocated */
-    size_t size;      /**< how many bytes there are */
-    size_t allocated; /**< how many bytes data has room for */
+    size_t size;      /**< bytes in use */
+    size_t allocated; /**< bytes allocated */
 } DynBuf;
 
-/** Makes buffer an empty one, without looking at what it held. */
+/** Sets a buffer to the empty one without releasing what it held. */
 HEARTH_API void DynBuf_Init(DynBuf *buffer);
 
-/** Appends length bytes of source, which must not lie inside the buffer.
+/** Appends bytes.
  *
- * @return false, with the buffer as it was, when memory cannot be had
+ * @param buffer  the buffer
+ * @param source  the bytes; only read; not inside the buffer; may be null when length is 0
+ * @param length  how many
+ * @return false, with the buffer unchanged, when memory cannot be allocated
  */
 HEARTH_API bool DynBuf_Append(DynBuf *buffer, const void *source, size_t length);
 
-/** Releases the memory and leaves an empty buffer, safe to destroy again. */
+/** Releases the memory and sets the buffer to the empty one; may be called again. */
 HEARTH_API void DynBuf_Destroy(DynBuf *buffer);
 
 /** @} */
@@ -100,56 +109,66 @@ typedef struct FileIODescriptor {
     int fd; /**< -1 while no file is open */
 } FileIODescriptor;
 
-enum {
-    FILEIO_ACCESS_READ = 1, /**< open for reading */
-    FILEIO_ACCESS_WRITE = 2 /**< open for writing */
-};
+/** What a file is opened for, combined with |. */
+typedef enum FileIOAccess {
+    FILEIO_ACCESS_READ = 1, /**< reading */
+    FILEIO_ACCESS_WRITE = 2 /**< writing */
+} FileIOAccess;
 
-enum {
-    FILEIO_OPEN = 0,       /**< the file must exist */
-    FILEIO_OPEN_CREATE = 4 /**< the file is created, or emptied when it exists */
-};
+/** What opening a file does. */
+typedef enum FileIOAction {
+    FILEIO_OPEN = 0,       /**< opens a file that exists */
+    FILEIO_OPEN_CREATE = 4 /**< creates the file, or truncates it when it exists */
+} FileIOAction;
 
-/** Makes file a record of no file, ready for FileIO_Open. */
+/** Sets a record to no file.  Done first, it makes FileIO_Close safe in every case. */
 HEARTH_API void FileIO_Invalidate(FileIODescriptor *file);
 
-/** Opens the named file.
+/** Opens a file.
  *
- * @param access  FILEIO_ACCESS_READ, FILEIO_ACCESS_WRITE, or both or-ed
- * @param action  FILEIO_OPEN or FILEIO_OPEN_CREATE
- * @return 0, or the errno value of the failure; EINVAL for an unknown access or
- *         action
+ * @param file    output; unchanged on failure
+ * @param name    path of the file
+ * @param access  FileIOAccess bits, at least one
+ * @param action  a FileIOAction
+ * @return 0 or an errno value; EINVAL for an unknown access or action
  */
 HEARTH_API int FileIO_Open(FileIODescriptor *file, const char *name, int access, int action);
 
-/** The size of an open file in bytes, or -1. */
+/** Returns the size of an open file in bytes, or -1. */
 HEARTH_API int64_t FileIO_GetSize(const FileIODescriptor *file);
 
-/** Reads up to count bytes, going on over short transfers and interruptions
- * until all are there or the file ends.
+/** Reads count bytes, or as many as there are before the end of the file.
  *
- * @param actual  gets the number of bytes read, also on failure; may be null
- * @return 0, also when the file ends early, or an errno value
+ * Short transfers and interruptions are continued.
+ *
+ * @param file    the file
+ * @param buffer  receives the bytes
+ * @param count   how many
+ * @param actual  receives the number of bytes read, also on failure; may be null
+ * @return 0, also at the end of the file, or an errno value
  */
 HEARTH_API int FileIO_Read(FileIODescriptor *file, void *buffer, size_t count, size_t *actual);
 
-/** Writes count bytes, going on over short transfers and interruptions.
+/** Writes count bytes.
  *
- * @param actual  gets the number of bytes written, also on failure; may be null
+ * Short transfers and interruptions are continued.
+ *
+ * @param file    the file
+ * @param source  the bytes; only read
+ * @param count   how many
+ * @param actual  receives the number of bytes written, also on failure; may be null
  * @return 0 or an errno value
  */
 HEARTH_API int FileIO_Write(FileIODescriptor *file, const void *source, size_t count,
                             size_t *actual);
 
-/** Closes the file.  Does nothing when none is open.
+/** Closes a file; does nothing when none is open.
  *
  * @return 0 or an errno value
  */
 HEARTH_API int FileIO_Close(FileIODescriptor *file);
 
-/** The English text of a status code; "Success" for 0.  The text is valid for
- * the life of the process.
- */
+/** Returns the English text of a status code, "Success" for 0.  The text is never freed. */
 HEARTH_API const char *FileIO_ErrorEnglish(int status);
 
 /** @} */

@@ -1,12 +1,10 @@
 /** @file rasterCursor.h
  *
- * Mouse cursors: their planes, where they lie on the screen, drawing, scaling.
+ * Mouse cursors: the size and expansion of their planes, clipping to the screen, drawing
+ * and scaling.  Part of raster.h, which includes this header and states the conventions.
  *
- * A cursor is one 32-bit image with alpha, or two planes, an AND mask and an XOR
- * mask.  The images of a cursor record have 32 bits per pixel and rows of
- * width * 4 bytes, without a gap.
- *
- * Included by raster.h.
+ * A cursor is one 32-bit image with alpha, or two images, an AND mask and an XOR mask.
+ * All images of a cursor record have 32 bits per pixel and a stride of width * 4.
  */
 #ifndef QUILLON_RASTER_CURSOR_H
 #define QUILLON_RASTER_CURSOR_H
@@ -15,7 +13,7 @@
 
 #include <stdint.h>
 
-/* C99 has no anonymous members officially, C++ no anonymous structs. */
+/* Anonymous members are not in C99, anonymous structs not in C++. */
 #if defined(__GNUC__)
 #define QUILLON_ANONYMOUS __extension__
 #else
@@ -25,28 +23,27 @@
 QUILLON_BEGIN_DECLS
 
 /** The types of a cursor. */
-enum {
+typedef enum RasterCursorType {
     RASTER_CURSOR_ANDXOR = 0, /**< AND and XOR masks */
     RASTER_CURSOR_ALPHA = 1   /**< one image with alpha */
-};
+} RasterCursorType;
 
 /** A cursor.
  *
- * The images of the two types share their place.  A record of the alpha type
- * ends behind alphaImage: nobody who is given one may touch what follows, as it
- * need not be there.
+ * The members of the two types share their memory.  A record of the alpha type may end
+ * behind alphaImage: what follows must not be accessed.
  */
 typedef struct RasterCursor {
-    uint32_t type;     /**< RASTER_CURSOR_ANDXOR or RASTER_CURSOR_ALPHA */
+    uint32_t type;     /**< a RasterCursorType */
     uint32_t hotspotX; /**< column of the hot spot inside the image */
     uint32_t hotspotY; /**< row of the hot spot inside the image */
     uint32_t width;    /**< in pixels */
     uint32_t height;   /**< in pixels */
     QUILLON_ANONYMOUS union {
-        uint8_t *alphaImage; /**< B G R A, colours premultiplied */
+        uint8_t *alphaImage; /**< B G R A, colour premultiplied */
         QUILLON_ANONYMOUS struct {
-            uint32_t planeInfo0; /**< the caller's; only carried along */
-            uint32_t planeInfo1; /**< the caller's; only carried along */
+            uint32_t planeInfo0; /**< the caller's; only copied */
+            uint32_t planeInfo1; /**< the caller's; only copied */
             uint8_t *andImage;   /**< AND mask, 32 bits per pixel */
             uint8_t *xorImage;   /**< XOR mask, 32 bits per pixel */
         };
@@ -71,49 +68,56 @@ typedef struct RasterCursorScreen {
 
 /** @name Planes
  *
- * A plane has its rows padded to whole 32-bit words, and no other gap.  In a
- * plane of depth 1, bit 7 of a byte is its leftmost pixel.
+ * The rows of a plane are padded to whole 32-bit words; there is no other padding.  In a
+ * plane of depth 1 the leftmost pixel of a byte is in bit 7.
  * @{
  */
 
-/** The size of a plane: (width * depth + 31) / 32 * 4 bytes for each row.
+/** Computes the size of a plane: height rows of (width * depth + 31) / 32 * 4 bytes, the
+ * quotient truncated.
  *
- * @param depth  bits per pixel, any number
- * @return bytes; 0xFFFFFFFF, which no plane has, when the size or one of the
- *         intermediate results (width * depth + 31 among them) exceeds 32 bits
+ * @param width, height  size in pixels
+ * @param depth          bits per pixel, any number
+ * @return bytes; 0xFFFFFFFF, which is no plane's size, when width * depth + 31 or the size
+ *         does not fit 32 bits
  */
 QUILLON_API uint32_t Raster_CalculateCursorSize(uint32_t width, uint32_t height, uint32_t depth);
 
-/** Expands a plane of depth 1: all bits of a pixel become 1 where the bit is
- * set, 0 where it is clear.
+/** Expands a plane of depth 1: a set bit becomes a pixel with all bits 1, a clear bit a
+ * pixel with all bits 0.
  *
- * The padding of the output's rows stays as it was.
+ * The padding of the output's rows is not written.
  *
- * @param depth      of the output; pixels take depth / 8 bytes, truncated, and
- *                   nothing is written where that is not 1 to 4
- * @param bits       the plane of depth 1; must not overlap the output
- * @param dstBuffer  gets the plane
- * @param dstSize    bytes available; less than the plane takes is a Panic.  A
- *                   plane too large for Raster_CalculateCursorSize is not
- *                   written, whatever dstSize is.
+ * @param width, height  size in pixels
+ * @param depth          of the output, whose pixels have depth / 8 bytes, truncated;
+ *                       nothing is written where that is not 1 to 4
+ * @param bits           the plane of depth 1; only read; must not overlap the output
+ * @param dstBuffer      receives the plane
+ * @param dstSize        bytes that dstBuffer has; fewer than the plane needs is a Panic.
+ *                       A plane whose size does not fit 32 bits is not written, whatever
+ *                       dstSize is.
  */
 QUILLON_API void Raster_ExpandCursorBitPlane(uint32_t width, uint32_t height, uint32_t depth,
                                              const uint8_t *bits, uint8_t *dstBuffer,
                                              uint32_t dstSize);
 
-/** Brings both planes of a cursor to one depth.
+/** Writes both planes of a cursor at one depth: the AND plane and, directly behind it, the
+ * XOR plane.
  *
- * The output is the AND plane and, directly behind it, the XOR plane; at depth
- * 32 both are what RasterCursor wants.  A plane that has the depth already is
- * copied with its padding, one of depth 1 is expanded as by
- * Raster_ExpandCursorBitPlane, one of another depth is a Panic.  A bad xorDepth
- * is only looked at when the AND plane has been written.
+ * A plane of the output's depth is copied with its padding; one of depth 1 is expanded as
+ * by Raster_ExpandCursorBitPlane; one of any other depth is a Panic.  At depth 32 both
+ * planes can be used as images of a RasterCursor.
  *
- * @param andData, xorData  the planes, at andDepth and xorDepth; must not
- *                   overlap the output
- * @param dstSize    bytes available; less than both planes take is a Panic.
- *                   Planes that take more than 32 bits tell are not written,
- *                   whatever dstSize is.
+ * @param width, height  size in pixels
+ * @param andDepth       depth of andData
+ * @param andData        the AND plane; only read; must not overlap the output
+ * @param xorDepth       depth of xorData, checked after the AND plane has been written
+ * @param xorData        the XOR plane; only read; must not overlap the output
+ * @param depth          of the output
+ * @param dstBuffer      receives the planes
+ * @param dstSize        bytes that dstBuffer has; fewer than both planes need is a Panic.
+ *                       Planes whose size together does not fit 32 bits are not written,
+ *                       whatever dstSize is.
  */
 QUILLON_API void Raster_ExpandPlanarCursorData(uint32_t width, uint32_t height, uint32_t andDepth,
                                                const uint8_t *andData, uint32_t xorDepth,
@@ -126,15 +130,17 @@ QUILLON_API void Raster_ExpandPlanarCursorData(uint32_t width, uint32_t height, 
  * @{
  */
 
-/** Cuts a cursor to the screen.
+/** Clips a cursor to the screen.
  *
- * Its image has the top left corner at (x - hotspotX, y - hotspotY), in 32 bits
- * that wrap.  A part of more than 2147483647 columns or rows counts as none.
+ * The top left pixel of its image is at (x - hotspotX, y - hotspotY), computed in 32 bits
+ * with wrapping.  What is left of column 0 or above row 0 is cut off; a width or height
+ * above 2147483647 after that counts as 0.
  *
+ * @param screen  size of the screen
  * @param cursor  only its hot spot and size are read
  * @param x, y    position of the pointer on the screen
- * @param box     output; untouched when no part is visible
- * @return 1 when some part of the cursor is on the screen, 0 otherwise
+ * @param box     output; unchanged when no part is visible
+ * @return 1 when some part of the cursor is visible, 0 otherwise
  */
 QUILLON_API uint32_t Raster_ComputeCursorBox(const RasterCursorScreen *screen,
                                              const RasterCursor *cursor, int32_t x, int32_t y,
@@ -142,22 +148,29 @@ QUILLON_API uint32_t Raster_ComputeCursorBox(const RasterCursorScreen *screen,
 
 /** Composes a cursor over a 32-bit surface.
  *
- * Masks give (surface & andImage) ^ xorImage, over all bits of a pixel.  A
- * cursor of any other type is blended as by Raster_AlphaBlendOver, which leaves
- * the top byte of the surface's pixels as it is.
+ * A cursor of type RASTER_CURSOR_ANDXOR gives, for all 32 bits of a pixel:
  *
- * With a composeBuffer the part of the surface under the cursor is copied there,
- * to (0, 0), and the cursor drawn there; the surface is only read then.
+ *     dst = (dst & andImage) ^ xorImage
  *
- * Rows: exact for the copy and the blend.  Masks take the rows of
- * Raster_RectROPcopy: exact where the line increment is a multiple of 4.
+ * A cursor of any other type is blended by Raster_AlphaBlendOver, which leaves the alpha
+ * byte of the destination.
  *
- * @param composeBuffer  a surface of at least the box's size, or null
- * @param composeLineIncrement  ignored without a composeBuffer
- * @param cursor  its images must not overlap the surface drawn to.  One wider
- *                than 536870911 pixels, whose rows no line increment spans, is
- *                not drawn, and nothing is copied.
- * @param box     of Raster_ComputeCursorBox for this cursor and surface
+ * With a composeBuffer, the part of the surface under the cursor is copied to its pixel
+ * (0, 0) and the cursor is drawn over the copy; the surface is only read.
+ *
+ * Stride: exact for the copy and the blend; masks follow Raster_RectROPcopy, which is
+ * exact at a multiple of 4.
+ *
+ * @param frameBuffer           pixel (0, 0) of the surface
+ * @param lineIncrement         its stride
+ * @param composeBuffer         pixel (0, 0) of a surface of at least the size of box, or
+ *                              null
+ * @param composeLineIncrement  its stride; ignored when composeBuffer is null
+ * @param cursor                only read; its images must not overlap the surface that is
+ *                              drawn to.  A cursor wider than 536870911 pixels, whose
+ *                              stride does not fit int32_t, is not drawn, and nothing is
+ *                              copied.
+ * @param box                   from Raster_ComputeCursorBox for this cursor and surface
  */
 QUILLON_API void Raster_DrawCursor(uint8_t *frameBuffer, int32_t lineIncrement,
                                    uint8_t *composeBuffer, int32_t composeLineIncrement,
@@ -171,23 +184,26 @@ QUILLON_API void Raster_DrawCursor(uint8_t *frameBuffer, int32_t lineIncrement,
 
 /** Makes a cursor of another size.
  *
- * The image is surrounded by pixels that leave the screen unchanged, and both
- * are scaled, an image with alpha filtered, masks by the nearest sample.  The
- * border has max(1 / scale, scale) + 1 pixels of the source, truncated, on each
- * side, so the new cursor is larger than the scaled image, with its hot spot
- * moved by the scaled border.
+ * Each image gets a border of pixels that leave the screen unchanged and is then scaled
+ * by Raster_Scale: filtered with alpha, by the nearest sample for masks.  With the
+ * maximum truncated, the border on each side has, in source pixels:
  *
- * Where Raster_Scale takes no such sizes or factors (see there), the new images
- * have their full size and leave the screen unchanged everywhere.
+ *     border = max(1 / scale, scale) + 1
  *
- * @param cursor  only read; any type but RASTER_CURSOR_ALPHA has masks
- * @param scaleX, scaleY  new pixels per pixel
- * @return the new cursor, of type RASTER_CURSOR_ALPHA or RASTER_CURSOR_ANDXOR;
- *         the caller releases the images and the record, each with free().
- *         Null when memory cannot be had, when a factor is not a number above
- *         0, or when a side passes what can be told: 2147483647 pixels for the
- *         border, 4294967295 for the image within it, 536870911 for the new
- *         image.
+ * The new size is (size + 2 * border) * scale, rounded up, and the new hot spot is
+ * (hotspot + border) * scale, truncated.  The new cursor is thus larger than the scaled
+ * image by the scaled border.
+ *
+ * Where Raster_Scale refuses the sizes or factors, the new images have their full size and
+ * leave the screen unchanged everywhere.
+ *
+ * @param cursor          only read; any type but RASTER_CURSOR_ALPHA has masks
+ * @param scaleX, scaleY  new pixels per old pixel
+ * @return the new cursor, of type RASTER_CURSOR_ALPHA or RASTER_CURSOR_ANDXOR, whose
+ *         images and record the caller releases, each with free().  Null when memory
+ *         cannot be allocated, a factor is not a number above 0, or on one axis the
+ *         border exceeds 2147483647 pixels, the image with its borders 4294967295 or the
+ *         new image 536870911.
  */
 QUILLON_API RasterCursor *Raster_ScaleCursor(const RasterCursor *cursor, double scaleX,
                                              double scaleY);
