@@ -12,12 +12,23 @@ cmake --install "$buildDir" --prefix "$work/first" >"$work/log"
 mv "$work/first" "$work/moved"
 libDir=$(dirname "$(find "$work/moved" -name libquillon.so)")
 
-echo "Each header compiles by itself, as C99 and as C++17"
 strict=(-fsyntax-only -Wall -Wextra -Wpedantic -Werror -I"$work/moved/include/quillon-1")
+everyStandard() { # FILE, by itself
+    for standard in c99 c11 c17; do
+        "$cc" -std=$standard "${strict[@]}" -x c -include "$1" - <<<"int unused;"
+    done
+    for standard in c++11 c++14 c++17 c++20; do
+        "$cxx" -std=$standard "${strict[@]}" -x c++ -include "$1" - <<<"int unused;"
+    done
+}
+
+echo "Each header compiles by itself, in every standard of C and C++"
 for header in "$work"/moved/include/quillon-1/{quillon,hearth}/*.h; do
-    "$cc" -std=c99 "${strict[@]}" -x c - <<<"#include \"$header\""$'\nint unused;'
-    "$cxx" -std=c++17 "${strict[@]}" -x c++ - <<<"#include \"$header\""
+    everyStandard "$header"
 done
+
+echo "The preprocessor can compare versions"
+everyStandard "$here/consumer/version.h"
 
 echo "pkg-config"
 export PKG_CONFIG_PATH=$libDir/pkgconfig
