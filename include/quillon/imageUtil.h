@@ -46,7 +46,7 @@ typedef enum ImageUtilFlag {
  * | depth    | bpp | a pixel in memory                                       |
  * |----------|-----|---------------------------------------------------------|
  * | 8        | 8   | one byte, an index into palette                         |
- * | 15 or 16 | 16  | two bytes, low byte first: layout 15 or 16 of raster.h  |
+ * | 15 or 16 | 16  | two bytes, low byte first: see depth in rasterConvert.h |
  * | 24       | 24  | B G R                                                   |
  * | 24       | 32  | B G R A                                                 |
  *

@@ -1,9 +1,9 @@
 /** @file rasterConvert.h
  *
- * Pixel layouts, and conversion between them.  Part of raster.h, which includes this
+ * Pixel formats, and conversion between them.  Part of raster.h, which includes this
  * header and states the conventions.
  *
- * A layout is named by its depth:
+ * A pixel format is named by its depth:
  *
  * | depth | bytes | red      | green    | blue     | rest, byte order                |
  * |-------|-------|----------|----------|----------|---------------------------------|
@@ -56,7 +56,7 @@ QUILLON_API bool Raster_IsModeReasonable(int32_t depth, int32_t bitsPerPixel, bo
  *                     cut to 8 bits
  * @param srcDepth     15, 16, 24 or 32, with pseudoColor 8; anything else is a Warning and
  *                     a Panic
- * @param dstDepth     one of the seven layouts; anything else is a Warning and a Panic
+ * @param dstDepth     one of the seven formats; anything else is a Warning and a Panic
  * @param pseudoColor  whether pixel is a palette index
  * @param palette      the palette; only read
  */
@@ -91,10 +91,10 @@ QUILLON_API void RasterRGB_MakeRGBParam(RasterRGBParam *param, int32_t component
 
 /** @name Rectangles
  *
- * Overlap: where the layouts differ the rectangles must not overlap.  If they do, the
+ * Overlap: where the formats differ the rectangles must not overlap.  If they do, the
  * result is unspecified; still nothing outside them is read or written.
  *
- * Stride: rounded, except between equal layouts and in Raster_ConvertIndexTo32, where it
+ * Stride: rounded, except between equal formats and in Raster_ConvertIndexTo32, where it
  * is exact.  Strides and coordinates are unsigned.
  *
  * Alpha: a 32-bit destination gets 255 from depths 15, 16 and 24, the alpha of the source
@@ -105,7 +105,7 @@ QUILLON_API void RasterRGB_MakeRGBParam(RasterRGBParam *param, int32_t component
  * @{
  */
 
-/** Converts a rectangle from one layout to another.
+/** Converts a rectangle from one pixel format to another.
  *
  * @param dstBuffer         pixel (0, 0) of the destination
  * @param dstLineIncrement  its stride
@@ -183,7 +183,7 @@ QUILLON_API void Raster_ConvertIndexTo32(uint8_t *dstBuffer, uint32_t dstLineInc
                                          uint32_t dstX, uint32_t dstY, uint32_t width,
                                          uint32_t height);
 
-/** Copies a rectangle between surfaces of one layout.
+/** Copies a rectangle between surfaces of one pixel format.
  *
  * Overlap: allowed, as in Raster_RectCopy.
  *

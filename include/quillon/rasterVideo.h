@@ -53,7 +53,7 @@ typedef enum RasterVideoFormat {
  * | 24       | 3     | byte 2 | byte 1 | byte 0 | none                 |
  * | 32       | 4     | byte 2 | byte 1 | byte 0 | byte 3, written as 0 |
  *
- * A field is narrowed by dropping its low bits.  Depth 15 differs from the layout of that
+ * A field is narrowed by dropping its low bits.  Depth 15 differs from the format of that
  * depth in rasterConvert.h: its fields are one bit higher.
  *
  * The rows of the output are contiguous.  A YUY2 or UYVY frame is read as

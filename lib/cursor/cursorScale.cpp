@@ -3,11 +3,11 @@
 // Each image is scaled within a border of pixels that leave the screen unchanged.
 // The border keeps the cursor's own pixels away from the edges, where the scaler
 // has rules of its own.
+#include <hearth/hearth.h>
 #include <quillon/raster.h>
 
 #include "core/extended.h"
 #include "cursor/cursorImage.h"
-#include <hearth/hearth.h>
 
 #include <algorithm>
 #include <cmath>

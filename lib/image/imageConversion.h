@@ -12,7 +12,7 @@
 
 namespace quillon {
 
-// The one depth that names the image's layout.
+// The depth that names the image's pixel format.
 inline int32_t conversionDepth(const ImageInfo &image) {
     return image.bpp == 32 && image.depth == 24 ? 32 : static_cast<int32_t>(image.depth);
 }
