@@ -2,8 +2,6 @@
 // wrap or stop at the limits, and neither is left to undefined behaviour.
 #pragma once
 
-#include <cstdint>
-
 #include <algorithm>
 #include <cstdint>
 #include <limits>

@@ -13,8 +13,6 @@
 
 #include <cstdint>
 
-#include <cstdint>
-
 namespace quillon {
 
 class Extended {
