@@ -32,6 +32,16 @@ HWY_INLINE void storeBytes(D d, hn::Vec<D> v, uint8_t *to) {
     hn::StoreU(v, d, reinterpret_cast<hn::TFromD<D> *>(to));
 }
 
+// The vector itself.  Where every use of a loaded vector can have an operand in
+// memory, GCC loads it for each of them anew: this makes it one load.
+template <class V>
+HWY_INLINE V inRegister(V v) {
+#if QUILLON_X86_AVX512
+    asm("" : "+v"(v.raw));
+#endif
+    return v;
+}
+
 // Whole vectors at any address, through the caches.
 struct Unaligned {
     template <class D>

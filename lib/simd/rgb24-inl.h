@@ -106,6 +106,8 @@ HWY_INLINE void storeRgb24(D d, hn::Vec<D> v, uint8_t *dst) {
         const uint32_t pixel = hn::GetLane(v);
         hwy::CopyBytes<2>(&pixel, dst);
         dst[2] = static_cast<uint8_t>(pixel >> 16);
+    } else if constexpr (kHasMaskedTails && kBytesOf<D> == kVectorBytes) {
+        FirstLanes{n / 4 * 3}.store(d, packRgb24<0>(d, v), dst);
     } else {
         const hn::Repartition<uint8_t, D> d8;
         const hn::Half<decltype(d8)> half;

@@ -34,6 +34,7 @@
 #include "simd/access-inl.h"
 #include "simd/target-inl.h"
 
+#include <algorithm>
 #include <type_traits>
 #include <utility>
 
@@ -54,6 +55,9 @@ enum class Tail {
     // One more chunk that ends with the row, over units that are done already: for
     // bodies that store the same bytes when run again.
     kOverlap,
+    // The same in the one loop there is, which is half the code, prefetches there, too,
+    // and has less to set up: for large bodies and short rows.
+    kOverlapInLoop,
     // Each unit once: a chunk of which only the first lanes are touched, where
     // kHasMaskedTails, else chunks of half the size, a quarter and so on.
     kExact,
@@ -110,11 +114,22 @@ HWY_INLINE void walkRestOfTurns(size_t i, size_t end, const Body &body) {
     }
 }
 
-// Whole chunks from begin on, and the tail.  Tail::kOverlap needs end to be kUnits
-// or more.
+// Whole chunks from begin on, and the tail.  The overlapping ones need end to be
+// kUnits or more.
 template <RowPolicy kPolicy, class Access, size_t kUnits, class Body>
 HWY_INLINE void walkFrom(Chunk<kUnits> chunk, size_t begin, size_t end, const Body &body,
                          [[maybe_unused]] PrefetchDistance distance = {}) {
+    if constexpr (kPolicy.tail == Tail::kOverlapInLoop) {
+        static_assert(kPolicy.unroll == 1 && std::is_same_v<Access, Unaligned>);
+        const size_t last = end - kUnits;
+        for (size_t i = begin;; i = std::min(i + kUnits, last)) {
+            if constexpr (kPolicy.prefetches)
+                body.prefetch(chunk, i, distance);
+            body(chunk, i, Access());
+            if (i == last)
+                return;
+        }
+    }
     constexpr size_t kStep = kPolicy.unroll * kUnits;
     // Computed ahead, so that it is hoisted out of the loop over the rows.
     const size_t tail = end - (end - begin) % kUnits;
@@ -147,14 +162,15 @@ HWY_INLINE void walkRow(Chunk<kUnits> chunk, size_t count, const Body &body,
 }
 
 // The same, whose whole chunks begin with a cache line and have the given access.
-// Rows of which no unit begins a line, and short ones, are walked as they come.
+// Rows of which no unit begins a line, and short ones, are walked as they come, and
+// without prefetching.
 template <class Access, RowPolicy kPolicy = RowPolicy{}, size_t kUnits, class Body>
 HWY_INLINE void walkAlignedRow(Chunk<kUnits> chunk, size_t count, const Body &body,
                                PrefetchDistance distance = {}) {
     static_assert(kPolicy.tail == Tail::kOverlap, "the head is one, too");
     const size_t head = unitsToLine<Body::kDstBytes>(body.dst);
     if (head == kNoLine || count < kLineBytes + kUnits)
-        return walkRow<kPolicy>(chunk, count, body, distance);
+        return walkRow<kPolicy>(chunk, count, body);
     for (size_t i = 0; i < head; i += kUnits)
         body(chunk, i, Unaligned());
     walkFrom<kPolicy, Access>(chunk, head, count, body, distance);

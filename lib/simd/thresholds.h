@@ -32,6 +32,9 @@ inline constexpr ptrdiff_t kPrefetchInCaches = 768;
 // The same for the blend of surfaces that are not.
 inline constexpr ptrdiff_t kPrefetchBlendUncached = 2048;
 
+// The source of conversions to surfaces that are not, which are not read themselves.
+inline constexpr ptrdiff_t kPrefetchConvertUncached = 3072;
+
 // ---- Lengths of rows, in bytes ---------------------------------------------
 
 // The copy: rows up to here are held in registers, where the call of memmove would
@@ -48,5 +51,13 @@ inline constexpr size_t kCopyMediumRow = 8192;
 // processor does not do of itself, and longer ones prefetch ahead in the row.
 inline constexpr size_t kPrefetchNextRow = 64;
 inline constexpr size_t kPrefetchLongRow = 1024;
+
+// Conversions: shorter rows are not worth the head that aligns the stores of the others
+// to cache lines.
+inline constexpr size_t kConvertLongRow = 512;
+
+// Shorter ones of them that are walked by chunks of less than this do not prefetch the
+// next row: it is one or two lines.
+inline constexpr size_t kConvertPrefetchRow = 32;
 
 } // namespace quillon
