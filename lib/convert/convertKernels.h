@@ -1,15 +1,15 @@
-// The lower floor of the pixel conversions.
+// The kernel of the pixel conversions.
 #pragma once
 
 #include "convert/pixelFormats.h"
-#include "legacy/surface.h"
+#include "core/surface.h"
 
 namespace quillon {
 
-// Converts a rectangle of pixels between two different layouts that do not
-// overlap; neither size is 0.  src is Index or at least Rgb15; dst is anything
-// but Index.  palette is read for Index only, at the indices that occur.
-void convertRows(Layout dstLayout, DstRows dst, Layout srcLayout, SrcRows src,
-                 const uint32_t *palette, Size size);
+// Converts a rectangle between two different formats, of which one is a source and
+// the other a destination; neither size is 0, and the surfaces do not overlap.
+// palette is read for kIndex only, at the indices that occur.
+void convertRows(DstRows dst, SrcRows src, Extent extent, const uint32_t *palette,
+                 PixelFormat srcFormat, PixelFormat dstFormat);
 
 } // namespace quillon

@@ -1,89 +1,130 @@
-// The pixel layouts: the one place where their masks stand.
+// The pixel formats.  kPixelFormats is the one list of them: sizes, shifts, weights
+// and the kernels that there are follow from it.  A new format is an enumerator, a
+// row, and a source and destination in pixelFormats-inl.h if no other format has
+// pixels of its size.
 #pragma once
 
+#include <array>
+#include <cstddef>
 #include <cstdint>
-
-#include <bit>
+#include <utility>
 
 namespace quillon {
 
-// A source or destination of a conversion, by what a pixel of it looks like.
-// The values of the direct layouts are their depths.
-enum class Layout : int32_t {
-    Index = 0, // one byte into a palette; sources only
-    Small3 = 3,
-    Small6 = 6,
-    Small8 = 8,
-    Rgb15 = 15,
-    Rgb16 = 16,
-    Rgb24 = 24,
-    Rgb32 = 32,
+// The channels of a pixel, which is little-endian in memory.
+struct ChannelMasks {
+    uint32_t red, green, blue;
+
+    bool operator==(const ChannelMasks &) const = default;
 };
 
-// Masks of the one-byte layouts, by depth: red, green, blue.  Depths 3, 6 and 8
+// Masks of the one-byte formats, by depth: red, green, blue.  Depths 3, 6 and 8
 // exist; the other rows are only there to make the depth an index.
 inline constexpr uint8_t RasterSmallMasks[9][3] = {
     {}, {}, {}, {0x04, 0x20, 0x80}, {}, {}, {0x30, 0x0C, 0x03}, {}, {0x07, 0x38, 0xC0},
 };
 
-// The bit just above each channel of a source, from which a channel is moved so
-// that its top bit lands on the top bit of a one-byte layout's mask.
-struct ChannelEnds {
-    int red, green, blue;
+constexpr ChannelMasks smallMasks(size_t depth) {
+    const auto &masks = RasterSmallMasks[depth];
+    return {masks[0], masks[1], masks[2]};
+}
+
+inline constexpr ChannelMasks kMasksOfBytes = {0xFF0000, 0x00FF00, 0x0000FF};
+
+enum class PixelFormat : uint8_t {
+    kNone,   // of depths that name no format
+    kIndex,  // into a palette of 32-bit pixels
+    kSmall3, // the others by their depths
+    kSmall6,
+    kSmall8,
+    kRgb15,
+    kRgb16,
+    kRgb24,
+    kRgb32,
 };
-inline constexpr ChannelEnds kEnds15 = {15, 10, 5};
-inline constexpr ChannelEnds kEnds16 = {16, 11, 5};
-inline constexpr ChannelEnds kEnds32 = {24, 16, 8};
 
-// A shift to the right, or to the left where the distance is negative.
-constexpr uint32_t shiftedRight(uint32_t value, int distance) {
-    return distance >= 0 ? value >> distance : value << -distance;
-}
+struct FormatTraits {
+    PixelFormat format;
+    int32_t depth; // the name that callers know it by, or kNoDepth
+    int32_t bytesPerPixel;
+    ChannelMasks masks; // of a palette's entries for kIndex
+    bool isSource, isDestination, hasAlpha;
+};
 
-// The distance to the right from a channel that ends at a bit to a mask.
-constexpr int shiftToMask(int end, uint8_t mask) {
-    return end - std::bit_width(mask);
-}
+inline constexpr int32_t kNoDepth = -1;
 
-// A pixel moved into a one-byte layout: the top bits of each channel survive.
-constexpr uint32_t toSmall(uint32_t pixel, ChannelEnds ends, int32_t depth) {
-    const auto &mask = RasterSmallMasks[depth];
-    return (shiftedRight(pixel, shiftToMask(ends.red, mask[0])) & mask[0]) |
-           (shiftedRight(pixel, shiftToMask(ends.green, mask[1])) & mask[1]) |
-           (shiftedRight(pixel, shiftToMask(ends.blue, mask[2])) & mask[2]);
-}
+inline constexpr FormatTraits kPixelFormats[] = {
+    //                     depth     bytes  masks                      source  dest.  alpha
+    {PixelFormat::kNone, kNoDepth, 0, {}, false, false, false},
+    {PixelFormat::kIndex, kNoDepth, 1, kMasksOfBytes, true, false, true},
+    {PixelFormat::kSmall3, 3, 1, smallMasks(3), false, true, false},
+    {PixelFormat::kSmall6, 6, 1, smallMasks(6), false, true, false},
+    {PixelFormat::kSmall8, 8, 1, smallMasks(8), false, true, false},
+    {PixelFormat::kRgb15, 15, 2, {0x7C00, 0x03E0, 0x001F}, true, true, false},
+    {PixelFormat::kRgb16, 16, 2, {0xF800, 0x07E0, 0x001F}, true, true, false},
+    {PixelFormat::kRgb24, 24, 3, kMasksOfBytes, true, true, false},
+    {PixelFormat::kRgb32, 32, 4, kMasksOfBytes, true, true, true},
+};
+inline constexpr size_t kFormatCount = std::size(kPixelFormats);
 
-// Narrowing drops the low bits of a channel; widening repeats its top bits in
-// the new low ones, so that zero stays zero and the largest value the largest.
-constexpr uint32_t widen15To24(uint32_t p) {
-    const uint32_t top = ((p & 0x7C00) << 9) | ((p & 0x03E0) << 6) | ((p & 0x001F) << 3);
-    return top | ((top >> 5) & 0x070707);
-}
-constexpr uint32_t widen16To24(uint32_t p) {
-    const uint32_t top = ((p & 0xF800) << 8) | ((p & 0x07E0) << 5) | ((p & 0x001F) << 3);
-    return top | ((top >> 5) & 0x070007) | ((top >> 6) & 0x000300);
-}
-constexpr uint32_t narrow24To15(uint32_t p) {
-    return ((p >> 9) & 0x7C00) | ((p >> 6) & 0x03E0) | ((p >> 3) & 0x001F);
-}
-constexpr uint32_t narrow24To16(uint32_t p) {
-    return ((p >> 8) & 0xF800) | ((p >> 5) & 0x07E0) | ((p >> 3) & 0x001F);
+constexpr const FormatTraits &traitsOf(PixelFormat format) {
+    return kPixelFormats[static_cast<size_t>(format)];
 }
 
-constexpr bool isSmallDepth(int32_t depth) {
-    return depth == 3 || depth == 6 || depth == 8;
+// ---- By depth -------------------------------------------------------------
+
+inline constexpr int32_t kMaxDepth = 32;
+
+inline constexpr auto kFormatAtDepth = [] {
+    std::array<PixelFormat, kMaxDepth + 1> formats = {};
+    for (const FormatTraits &row : kPixelFormats)
+        if (row.depth != kNoDepth)
+            formats[static_cast<size_t>(row.depth)] = row.format;
+    return formats;
+}();
+
+constexpr PixelFormat formatAt(int32_t depth) {
+    return depth >= 0 && depth <= kMaxDepth ? kFormatAtDepth[static_cast<size_t>(depth)]
+                                            : PixelFormat::kNone;
 }
 
 // The bytes of a pixel at a depth.  Depths that name no format have an answer, too,
 // by which pixels of equal depths are copied.
 constexpr int32_t bytesPerPixelAt(int32_t depth) {
-    if (depth == 3 || depth == 6)
-        return 1;
-    return depth == 15 ? 2 : depth / 8;
+    const PixelFormat format = formatAt(depth);
+    return format == PixelFormat::kNone ? depth / 8 : traitsOf(format).bytesPerPixel;
 }
 
-constexpr int32_t bytesPerPixelOf(Layout layout) {
-    return layout == Layout::Index ? 1 : bytesPerPixelAt(static_cast<int32_t>(layout));
-}
+// ---- Pairs of formats -----------------------------------------------------
+
+// One function for each pair of a source and a destination, for which
+// make.operator()<kFrom, kTo>() stands; null for the pairs that do not exist.
+template <class Function>
+class PairTable {
+public:
+    template <class Make>
+    constexpr explicit PairTable(Make make) {
+        addPairs(make, std::make_index_sequence<kFormatCount * kFormatCount>());
+    }
+
+    constexpr Function at(PixelFormat from, PixelFormat to) const {
+        return functions[static_cast<size_t>(from)][static_cast<size_t>(to)];
+    }
+
+private:
+    template <class Make, size_t... kPairs>
+    constexpr void addPairs(Make make, std::index_sequence<kPairs...> /*pairs*/) {
+        (addPair<PixelFormat{kPairs / kFormatCount}, PixelFormat{kPairs % kFormatCount}>(make),
+         ...);
+    }
+    template <PixelFormat kFrom, PixelFormat kTo, class Make>
+    constexpr void addPair(Make make) {
+        if constexpr (traitsOf(kFrom).isSource && traitsOf(kTo).isDestination)
+            functions[static_cast<size_t>(kFrom)][static_cast<size_t>(kTo)] =
+                make.template operator()<kFrom, kTo>();
+    }
+
+    Function functions[kFormatCount][kFormatCount] = {};
+};
 
 } // namespace quillon
