@@ -32,6 +32,10 @@ inline constexpr ptrdiff_t kPrefetchInCaches = 768;
 // The same for the blend of surfaces that are not.
 inline constexpr ptrdiff_t kPrefetchBlendUncached = 2048;
 
+// Ahead in interleaved video frames that are written around the caches, so that
+// no store waits for samples: half a page, which is 1024 pixels.
+inline constexpr ptrdiff_t kPrefetchInterleavedVideo = 2048;
+
 // ---- Lengths of rows, in bytes ---------------------------------------------
 
 // The copy: rows up to here are held in registers, where the call of memmove would
