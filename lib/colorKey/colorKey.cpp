@@ -2,7 +2,7 @@
 #include <quillon/rasterVideo.h>
 
 #include "colorKey/colorKeyKernels.h"
-#include "legacy/surface.h"
+#include "core/surface.h"
 
 using namespace quillon;
 
@@ -11,20 +11,17 @@ void Raster_ApplyColorKey(const uint8_t *background, uint8_t *dstBuffer, const u
                           int32_t dstLineIncrement, int32_t overlayLineIncrement,
                           int32_t keyLineIncrement, uint32_t key, uint32_t x, uint32_t y,
                           uint32_t width, uint32_t height, uint32_t keyDepth) {
-    const Size size = {width, height};
-    if (size.empty())
+    const Extent extent = {width, height};
+    if (extent.empty())
         return;
 
-    const KeyPixel keyPixel = keyDepth == 32   ? KeyPixel::Bytes4
-                              : keyDepth == 16 ? KeyPixel::Bytes2
-                                               : KeyPixel::Bytes1;
-    const auto keyBytes = static_cast<int64_t>(keyPixel);
-    const KeyedRows rows = {
+    const int32_t keyBytes = keyDepth == 32 ? 4 : keyDepth == 16 ? 2 : 1;
+    const ColorKeySurfaces surfaces = {
         .dst = {pixelAddress(dstBuffer, dstLineIncrement, 4, x, y), dstLineIncrement},
         .background = {pixelAddress(background, backgroundLineIncrement, 4, x, y),
                        backgroundLineIncrement},
         .overlay = {overlay, overlayLineIncrement},
-        .key = {pixelAddress(keySurface, keyLineIncrement, keyBytes, x, y), keyLineIncrement},
+        .keys = {pixelAddress(keySurface, keyLineIncrement, keyBytes, x, y), keyLineIncrement},
     };
-    applyKeyRows(rows, size, keyPixel, key);
+    composeByKey(surfaces, extent, keyBytes, key);
 }

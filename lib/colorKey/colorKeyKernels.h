@@ -1,22 +1,20 @@
-// The lower floor of the colour key.
+// The kernel of the colour key.
 #pragma once
 
-#include "legacy/surface.h"
+#include "core/surface.h"
 
 namespace quillon {
 
-// A pixel of a key surface, by its bytes.
-enum class KeyPixel { Bytes1 = 1, Bytes2 = 2, Bytes4 = 4 };
-
-struct KeyedRows {
+struct ColorKeySurfaces {
     DstRows dst;
     SrcRows background;
     SrcRows overlay;
-    SrcRows key;
+    SrcRows keys;
 };
 
-// Takes each pixel from the overlay where the key surface matches and from the
-// background elsewhere, from the top left, row by row; no size is 0.
-void applyKeyRows(const KeyedRows &rows, Size size, KeyPixel keyPixel, uint32_t key);
+// Takes each pixel from the overlay where the key surface, of pixels of 1, 2 or 4
+// bytes, matches and from the background elsewhere: from the top left, row by row.
+// Neither size is 0.
+void composeByKey(const ColorKeySurfaces &surfaces, Extent extent, int32_t keyBytes, uint32_t key);
 
 } // namespace quillon

@@ -72,19 +72,26 @@ struct NonTemporal : Unaligned {
 };
 
 // Only the first lanes of a vector, of 8 or 32 bits.  Memory of the others is not
-// touched.
+// touched.  Lanes that become 32 bits are loaded from the vectors of 8 or 16 bits
+// that have as many.
 struct FirstLanes {
     size_t count;
 
 #if QUILLON_X86_AVX512
     template <class D>
     HWY_INLINE hn::Vec<D> load(D d, const uint8_t *from) const {
-        static_assert(kBytesOf<D> == 64);
+        constexpr size_t kLaneBytes = sizeof(hn::TFromD<D>);
         const auto mask = hn::FirstN(d, count).raw;
-        if constexpr (sizeof(hn::TFromD<D>) == 1)
-            return hn::Vec<D>{_mm512_maskz_loadu_epi8(mask, from)};
-        else
+        if constexpr (kBytesOf<D> == 64 && kLaneBytes == 4) {
             return hn::Vec<D>{_mm512_maskz_loadu_epi32(mask, from)};
+        } else if constexpr (kBytesOf<D> == 32 && kLaneBytes == 2) {
+            return hn::Vec<D>{_mm256_maskz_loadu_epi16(mask, from)};
+        } else if constexpr (kBytesOf<D> == 16 && kLaneBytes == 1) {
+            return hn::Vec<D>{_mm_maskz_loadu_epi8(mask, from)};
+        } else {
+            static_assert(kBytesOf<D> == 64 && kLaneBytes == 1);
+            return hn::Vec<D>{_mm512_maskz_loadu_epi8(mask, from)};
+        }
     }
     template <class D>
     HWY_INLINE void store(D d, hn::Vec<D> v, uint8_t *to) const {

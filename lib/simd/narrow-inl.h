@@ -118,21 +118,31 @@ HWY_INLINE hn::Vec<D16> weightedPairSum(D16 d, hn::Vec<D16> v) {
 
 // ---- Narrowing ------------------------------------------------------------
 
-// Whether narrowing pairs of vectors leaves the blocks of both interleaved.
-inline constexpr bool kPacksWithinBlocks = QUILLON_X86_SSSE3;
-
-// Signed 16-bit lanes to signed bytes, saturated.  Where kPacksWithinBlocks, each
-// block has the lanes of first's block and then those of second's.
+// Signed 16-bit lanes to signed bytes, saturated.  Each block has the lanes of
+// first's block and then those of second's.
 template <class D8, class D16 = hn::Repartition<int16_t, D8>>
 HWY_INLINE hn::Vec<D8> narrowSaturated([[maybe_unused]] D8 d8, hn::Vec<D16> first,
                                        hn::Vec<D16> second) {
 #if QUILLON_X86_SSSE3
     return hn::Vec<D8>{detail::packSigned16(first.raw, second.raw)};
 #else
-    const hn::RebindToSigned<D8> signed8;
-    const hn::Half<decltype(signed8)> half;
-    return hn::BitCast(d8,
-                       hn::Combine(signed8, hn::DemoteTo(half, second), hn::DemoteTo(half, first)));
+    if constexpr (kBytesOf<D8> <= 16) {
+        const hn::RebindToSigned<D8> signed8;
+        const hn::Half<decltype(signed8)> half;
+        return hn::BitCast(
+            d8, hn::Combine(signed8, hn::DemoteTo(half, second), hn::DemoteTo(half, first)));
+    } else {
+        HWY_ALIGN static constexpr uint8_t kToLower[16] = {
+            0, 2, 4, 6, 8, 10, 12, 14, 0x80, 0x80, 0x80, 0x80, 0x80, 0x80, 0x80, 0x80};
+        HWY_ALIGN static constexpr uint8_t kToUpper[16] = {
+            0x80, 0x80, 0x80, 0x80, 0x80, 0x80, 0x80, 0x80, 0, 2, 4, 6, 8, 10, 12, 14};
+        const D16 d16;
+        const auto saturated = [&](hn::Vec<D16> v) HWY_ATTR {
+            return hn::BitCast(d8, hn::Min(hn::Max(v, hn::Set(d16, -128)), hn::Set(d16, 127)));
+        };
+        return hn::Or(hn::TableLookupBytesOr0(saturated(first), hn::LoadDup128(d8, kToLower)),
+                      hn::TableLookupBytesOr0(saturated(second), hn::LoadDup128(d8, kToUpper)));
+    }
 #endif
 }
 

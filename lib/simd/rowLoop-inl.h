@@ -12,6 +12,11 @@
 //     uint8_t *dst;                          // the row's first unit
 //     static constexpr size_t kDstBytes;     // of a unit
 //
+// one whose units go together in groups, of which rows and chunks have a whole
+// number, has
+//
+//     static constexpr size_t kUnitsPerGroup;
+//
 // and one that prefetches has
 //
 //     template <class C> void prefetch(C chunk, size_t i, PrefetchDistance) const
@@ -161,14 +166,26 @@ HWY_INLINE void walkRow(Chunk<kUnits> chunk, size_t count, const Body &body,
     walkFrom<kPolicy, Unaligned>(chunk, 0, count, body, distance);
 }
 
+// The units of the row at dst that come before the first group which begins a
+// cache line, kNoLine where none does.
+template <class Body>
+HWY_INLINE size_t headOf(const uint8_t *dst) {
+    const size_t head = unitsToLine<Body::kDstBytes>(dst);
+    if constexpr (requires { Body::kUnitsPerGroup; }) {
+        if (head % Body::kUnitsPerGroup != 0)
+            return kNoLine;
+    }
+    return head;
+}
+
 // The same, whose whole chunks begin with a cache line and have the given access.
-// Rows of which no unit begins a line, and short ones, are walked as they come, and
+// Rows of which no group begins a line, and short ones, are walked as they come, and
 // without prefetching.
 template <class Access, RowPolicy kPolicy = RowPolicy{}, size_t kUnits, class Body>
 HWY_INLINE void walkAlignedRow(Chunk<kUnits> chunk, size_t count, const Body &body,
                                PrefetchDistance distance = {}) {
     static_assert(kPolicy.tail == Tail::kOverlap, "the head is one, too");
-    const size_t head = unitsToLine<Body::kDstBytes>(body.dst);
+    const size_t head = headOf<Body>(body.dst);
     if (head == kNoLine || count < kLineBytes + kUnits)
         return walkRow<kPolicy>(chunk, count, body);
     for (size_t i = 0; i < head; i += kUnits)

@@ -35,6 +35,10 @@ inline constexpr ptrdiff_t kPrefetchBlendUncached = 2048;
 // The source of conversions to surfaces that are not, which are not read themselves.
 inline constexpr ptrdiff_t kPrefetchConvertUncached = 3072;
 
+// Ahead in interleaved video frames that are written around the caches, so that
+// no store waits for samples: half a page, which is 1024 pixels.
+inline constexpr ptrdiff_t kPrefetchInterleavedVideo = 2048;
+
 // ---- Lengths of rows, in bytes ---------------------------------------------
 
 // The copy: rows up to here are held in registers, where the call of memmove would

@@ -1,10 +1,10 @@
-// Video: YUV frames.
-
+// YUV to RGB: frames, and one pixel.
 #include <quillon/rasterVideo.h>
 
 #include "core/latch.h"
-#include "legacy/surface.h"
+#include "core/surface.h"
 #include "video/frameLayout.h"
+#include "video/videoFormats.h"
 #include "video/videoKernels.h"
 #include <hearth/hearth.h>
 
@@ -18,28 +18,12 @@ constinit Latch formatLatch;
 
 constexpr char kYuvToRgb[] = "Raster_YUVtoRGB";
 
-// 0 for a depth that there is not.
-size_t bytesPerPixelAt(int32_t bppdepth) {
-    switch (bppdepth) {
-    case 15:
-        return kVideoLayout15.bytesPerPixel;
-    case 16:
-        return kVideoLayout16.bytesPerPixel;
-    case 24:
-        return kVideoLayout24.bytesPerPixel;
-    case 32:
-        return kVideoLayout32.bytesPerPixel;
-    default:
-        return 0;
-    }
-}
-
 bool isVideoFormat(uint32_t format) {
     return format == RASTER_VIDEO_YUY2 || format == RASTER_VIDEO_UYVY ||
            format == RASTER_VIDEO_YV12;
 }
 
-// A result of the formula before its shift, held to 8 bits after it.
+// A result of the formula before its shift, clamped to 8 bits after it.
 uint32_t channel(uint32_t sum) {
     return static_cast<uint32_t>(std::clamp(static_cast<int32_t>(sum) >> 8, 0, 255));
 }
@@ -51,8 +35,8 @@ using namespace quillon;
 
 void Raster_YUVtoRGB(const uint8_t *srcBuffer, uint8_t *dstBuffer, uint32_t width, uint32_t height,
                      uint32_t format, int32_t bppdepth) {
-    const size_t bytesPerPixel = bytesPerPixelAt(bppdepth);
-    if (bytesPerPixel == 0) {
+    const RasterVideoPixelLayout *layout = videoLayoutAt(bppdepth);
+    if (layout == nullptr) {
         if (depthLatch.firstTime())
             Log("%s: bppdepth:%d not supported.\n", kYuvToRgb, bppdepth);
         return;
@@ -66,22 +50,21 @@ void Raster_YUVtoRGB(const uint8_t *srcBuffer, uint8_t *dstBuffer, uint32_t widt
     if (!RasterComputeVideoAttributes(format, width, height, &size, pitches, offsets))
         return;
 
+    // Pixels come in pairs; what is odd is left alone.
     if (format != RASTER_VIDEO_YV12) {
-        const auto order =
-            format == RASTER_VIDEO_YUY2 ? VideoGroupOrder::Yuy2 : VideoGroupOrder::Uyvy;
-        const uint64_t groups = uint64_t{width} * height / 2;
-        if (groups != 0)
-            convertPackedFrame(dstBuffer, bppdepth, srcBuffer, order, groups);
+        const uint64_t pixels = uint64_t{width} * height & ~uint64_t{1};
+        if (pixels != 0)
+            convertInterleavedRun(dstBuffer, bppdepth, srcBuffer, format, pixels);
         return;
     }
-    const Size pairs = {width / 2, height / 2};
-    if (pairs.empty())
+    const Extent even = {width & ~1u, height & ~1u};
+    if (even.empty())
         return;
     const auto plane = [&](int i) {
         return SrcRows{advance(srcBuffer, offsets[i]), static_cast<ptrdiff_t>(pitches[i])};
     };
-    const DstRows dst = {dstBuffer, static_cast<ptrdiff_t>(width * bytesPerPixel)};
-    convertPlanarFrame(dst, bppdepth, {plane(0), plane(1), plane(2)}, pairs);
+    const DstRows dst = {dstBuffer, static_cast<ptrdiff_t>(size_t{width} * layout->bytesPerPixel)};
+    convertPlanarRows(dst, bppdepth, {plane(0), plane(1), plane(2)}, even);
 }
 
 // Unsigned, so that arguments of any size wrap.
