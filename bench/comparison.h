@@ -1,41 +1,34 @@
-// An operation done by everybody who can do it, in one run.
+// An operation done by every contender in one run.
 //
-// All contenders take turns for a short while each, round after round, so that a
-// slower moment of the machine is one for all of them.  Speeds are compared within
-// a round, and of the rounds the median counts.
+// Contenders take turns of a fraction of a millisecond, round after round, so that
+// a slower moment of the machine hits all of them.  Speeds are compared within a
+// round; the median over the rounds counts.
 #pragma once
 
-#include "job.h"
-
-#include <benchmark/benchmark.h>
+#include "operation.h"
 
 namespace quillon::bench {
 
-// All that is to be measured, in the order that it is to be shown.
-using Plan = std::vector<Operation>;
-
-// How fast somebody is beside us.
+// The fastest of the limits or of the peers.
 struct Standing {
-    std::string name;
-    double nanoseconds; // a call
-    double ourSpeed;    // ours divided by theirs: 2 where we take half their time
-    bool isLimit;
-    bool bytesDiffer; // and should not
+    double speed = 0; // ours divided by theirs: 2 where we take half their time
+    std::string name; // of nobody: speed 0
 };
 
 struct Result {
-    std::string operation, family;
-    Area area;
-    double nanoseconds; // of ours
-    std::vector<Standing> others;
-    double limitSpeed; // ours divided by the best limit's, 0 without one
-    double peerSpeed;  // ours divided by the best peer's, 0 without one
-
-    const Standing *best(bool limit) const;
+    const Operation *operation;
+    double nanoseconds; // a call of ours
+    Standing limit, peer;
+    bool bytesDiffer; // from those of a peer whose bytes equal ours
 };
 
-// Registers the plan with Google Benchmark, an iteration being a round.  Results
-// are appended as the benchmarks run.
-void registerComparisons(const Plan &plan, std::vector<Result> &results);
+// Seconds a call; the works are called in turn, from the place on.
+double secondsPerCall(const std::vector<Work> &works, size_t calls, size_t &place);
+
+double median(std::vector<double> values);
+
+// Registers the operations with Google Benchmark, an iteration being a round and a
+// counter the speed beside a contender.  Results are appended as they come.
+void registerComparisons(const std::vector<Operation> &operations, std::vector<Result> &results);
 
 } // namespace quillon::bench

@@ -6,91 +6,68 @@
 
 #include <hwy/targets.h>
 #include <sched.h>
-#include <unistd.h>
+
+#include <algorithm>
+#include <fstream>
+#include <span>
 
 namespace {
 
 using namespace quillon::bench;
 
-// On the last of the processors that we may use, where least else happens.
-void pinToOneCore() {
-    cpu_set_t allowed, one;
-    if (sched_getaffinity(0, sizeof(allowed), &allowed) != 0)
-        return;
-    int last = CPU_SETSIZE - 1;
-    while (last > 0 && !CPU_ISSET(last, &allowed))
-        --last;
+void pinToThisCore() {
+    cpu_set_t one;
     CPU_ZERO(&one);
-    CPU_SET(last, &one);
+    CPU_SET(sched_getcpu(), &one);
     sched_setaffinity(0, sizeof(one), &one);
 }
 
-Plan makePlan() {
-    Plan plan;
-    for (const Area &area : kAreas)
-        addPixelOperations(plan, area);
-    addRectLists(plan);
-    addImages(plan);
-    addPeers(plan);
-    return plan;
-}
-
-// Whether there is an instruction set of that name; if so, no other one is used.
+// Limits all kernels to an instruction set; false where there is none of that name.
 bool useTarget(const std::string &name) {
-    for (const int64_t target : hwy::SupportedAndGeneratedTargets()) {
-        if (name == hwy::TargetName(target)) {
-            hwy::SetSupportedTargetsForTest(target);
-            return true;
-        }
-    }
+    for (const int64_t target : hwy::SupportedAndGeneratedTargets())
+        if (name == hwy::TargetName(target))
+            return hwy::SetSupportedTargetsForTest(target), true;
     return false;
 }
 
-struct Arguments {
-    std::string reportFolder;
-    bool sweep = false, growth = false;
-};
-
-// What Google Benchmark leaves over; false where there is something unknown.
-bool parse(int count, char **arguments, Arguments &parsed) {
-    for (int i = 1; i < count; ++i) {
-        const std::string argument = arguments[i];
-        const auto valueOf = [&](const std::string &name) {
-            return argument.rfind(name, 0) == 0 ? argument.substr(name.size()) : "";
-        };
-        if (argument == "--sweep")
-            parsed.sweep = true;
-        else if (argument == "--growth")
-            parsed.growth = true;
-        else if (!valueOf("--report=").empty())
-            parsed.reportFolder = valueOf("--report=");
-        else if (valueOf("--target=").empty() || !useTarget(valueOf("--target=")))
-            return false;
-    }
-    return true;
+// Writes to the folder, or to the console where there is none; false if it cannot.
+bool publish(const std::string &page, const std::string &folder, const char *name) {
+    if (folder.empty())
+        return std::puts(page.c_str()) >= 0;
+    return !(std::ofstream(folder + name) << page).flush().fail();
 }
 
 } // namespace
 
 int main(int argc, char **argv) {
-    pinToOneCore();
+    pinToThisCore();
     benchmark::Initialize(&argc, argv);
-    Arguments arguments;
-    if (!parse(argc, argv, arguments))
-        return benchmark::ReportUnrecognizedArguments(argc, argv), 1;
-    if (arguments.sweep)
-        return sweep();
-    if (arguments.growth)
-        return growth(arguments.reportFolder);
+    std::string folder;
+    bool isSweep = false, isGrowth = false;
+    for (const std::string argument : std::span(argv + 1, argv + argc)) {
+        if (argument == "--sweep")
+            isSweep = true;
+        else if (argument == "--growth")
+            isGrowth = true;
+        else if (argument.starts_with("--report="))
+            folder = argument.substr(9);
+        else if (!argument.starts_with("--target=") || !useTarget(argument.substr(9)))
+            return benchmark::ReportUnrecognizedArguments(argc, argv), 1;
+    }
+    if (isSweep)
+        return sweep() == 0 ? 0 : 1;
+    if (isGrowth)
+        return publish(growthPage(), folder, "/growth.md") ? 0 : 1;
 
-    const Plan plan = makePlan();
+    const std::vector<Operation> operations = allOperations();
     std::vector<Result> results;
-    registerComparisons(plan, results);
-    Reporter reporter(results);
-    benchmark::RunSpecifiedBenchmarks(&reporter);
-    printSummary(results);
-    if (!arguments.reportFolder.empty())
-        writeReport(results, arguments.reportFolder);
+    registerComparisons(operations, results);
+    benchmark::AddCustomContext("peers", peerText());
+    benchmark::RunSpecifiedBenchmarks();
     benchmark::Shutdown();
-    return 0;
+    bool isGood = std::ranges::none_of(results, &Result::bytesDiffer);
+    std::printf("\n%s", summaryText(results).c_str());
+    if (!folder.empty())
+        isGood &= publish(performancePage(results), folder, "/performance.md");
+    return isGood ? 0 : 1;
 }

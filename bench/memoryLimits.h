@@ -1,12 +1,12 @@
-// What the memory allows: loops that move the bytes of a job and do nothing else.
+// What memory allows.
 #pragma once
 
-#include "job.h"
+#include "operation.h"
 
 namespace quillon::bench {
 
-// The limits that hold for an operation: plain and streaming loops over the same
-// bytes, and memset or memcpy where those move the same.
+// The ways to move the memory of an operation's rows and do nothing else, of which
+// the fastest is its limit.
 std::vector<Contender> limitsOf(const Operation &operation);
 
 } // namespace quillon::bench

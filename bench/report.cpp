@@ -1,103 +1,116 @@
 #include "report.h"
 
 #include "peers/peers.h"
-#include "targets.h"
+
+#include <hwy/targets.h>
 
 #include <algorithm>
 #include <cmath>
-#include <cstdio>
+#include <fstream>
 
 namespace quillon::bench {
 namespace {
 
-std::string timeText(double nanoseconds) {
-    char text[32];
-    if (nanoseconds < 1e3)
-        std::snprintf(text, sizeof(text), "%.1f ns", nanoseconds);
-    else if (nanoseconds < 1e6)
-        std::snprintf(text, sizeof(text), "%.2f us", nanoseconds / 1e3);
-    else
-        std::snprintf(text, sizeof(text), "%.2f ms", nanoseconds / 1e6);
-    return text;
+// The speeds to be reached beside the best peer and, uncached, beside the limit.
+constexpr double kPeerFloor = 0.97; // measurements scatter by some percent
+constexpr double kLimitFloor = 0.9;
+
+constexpr const char *kIntroduction =
+    "Numbers are speeds, ours divided by theirs: 2 means half their time. They are medians over "
+    "rounds in which all contenders take turns. The limit is the fastest of several ways to read "
+    "the vectors of the sources (and of a destination that is read) and to write those of the "
+    "destination, row by row, without doing anything else: by stores of 64 or 32 bytes, by "
+    "non-temporal stores, with and without prefetches, by memset or memcpy. There is none where "
+    "the content decides which memory is touched. Peers often do less: they round less exactly, "
+    "or leave the top byte of a pixel undefined; where they have to give the same bytes, these "
+    "are compared.\n\n"
+    "- 32x32: a rectangle in a surface 1920 pixels wide; the cost of a call\n"
+    "- 256x128: in cache; once with contiguous rows, once in a surface 1920 pixels wide\n"
+    "- 1920x1080: each call on memory that has left every cache\n\n";
+
+constexpr const char *kHeadOfTable =
+    "| Operation | A call, ns | / limit | / best peer |\n|---|--:|--:|--:|\n";
+
+std::string standingText(const Standing &standing) {
+    return standing.speed == 0 ? "" : text(fixed(standing.speed, 2), " (", standing.name, ")");
 }
 
-std::string standingText(const Standing *standing) {
-    if (standing == nullptr)
-        return "";
-    char text[64];
-    std::snprintf(text, sizeof(text), "%.2f %s", standing->ourSpeed, standing->name.c_str());
-    return text;
-}
-
-void printResult(const Result &result) {
-    std::printf("%-28s %-16s %10s   %-22s %-18s %s\n", result.operation.c_str(), result.area.name,
-                timeText(result.nanoseconds).c_str(), standingText(result.best(true)).c_str(),
-                standingText(result.best(false)).c_str(),
-                reached(result) < 1 ? "below target" : "");
-    for (const Standing &other : result.others) {
-        if (other.bytesDiffer)
-            std::printf("%-28s the bytes of %s differ\n", "", other.name.c_str());
-    }
-    std::fflush(stdout);
-}
-
-double geometricMean(const std::vector<double> &values) {
+// The geometric mean of the speeds that there are of a family and an area ("": all),
+// followed by their count.
+std::string meanText(const std::vector<Result> &results, Standing Result::*standing,
+                     const std::string &family = "", const std::string &area = "") {
     double sum = 0;
-    for (const double value : values)
-        sum += std::log(value);
-    return values.empty() ? 0 : std::exp(sum / static_cast<double>(values.size()));
+    int count = 0;
+    for (const Result &result : results) {
+        const double speed = (result.*standing).speed;
+        if (speed > 0 && (family.empty() || result.operation->family == family) &&
+            (area.empty() || result.operation->area.name == area)) {
+            sum += std::log(speed);
+            ++count;
+        }
+    }
+    return count == 0 ? "" : text(fixed(std::exp(sum / count), 2), " (", count, ")");
+}
+
+std::string processorName() {
+    std::ifstream info("/proc/cpuinfo");
+    for (std::string line; std::getline(info, line);)
+        if (line.starts_with("model name"))
+            return line.substr(line.find(':') + 2);
+    return "an unnamed processor";
+}
+
+void addOnce(std::vector<std::string> &values, const std::string &value) {
+    if (std::ranges::find(values, value) == values.end())
+        values.push_back(value);
 }
 
 } // namespace
 
-bool Reporter::ReportContext(const Context & /*context*/) {
-    for (const Peer &peer : peers()) {
-        if (peer.offer == nullptr)
-            std::printf("Left out, because it was not installed: %s\n", peer.name);
-    }
-    std::printf("%-28s %-16s %10s   %-22s %-18s\n", "operation", "size", "a call", "speed / limit",
-                "speed / best peer");
-    return true;
-}
-
-void Reporter::ReportRuns(const std::vector<Run> & /*runs*/) {
-    printResult(results.back());
-}
-
 std::string summaryText(const std::vector<Result> &results) {
-    std::vector<double> limits, peerSpeeds;
-    for (const Result &result : results) {
-        if (result.limitSpeed > 0)
-            limits.push_back(result.limitSpeed);
-        if (result.peerSpeed > 0)
-            peerSpeeds.push_back(result.peerSpeed);
+    std::string lines =
+        text("Geometric means (of so many measurements): ", meanText(results, &Result::limit),
+             " of the limit, ", meanText(results, &Result::peer), " times the best peer. Below ",
+             kPeerFloor, " of the best peer or, uncached, ", kLimitFloor, " of the limit:\n\n");
+    for (const auto &[operation, nanoseconds, limit, peer, bytesDiffer] : results) {
+        const bool isLimit =
+            operation->area.isUncached && limit.speed > 0 && limit.speed < kLimitFloor;
+        if (isLimit || (peer.speed > 0 && peer.speed < kPeerFloor))
+            lines += text("- ", operation->name, ", ", operation->area.name, ": ",
+                          standingText(isLimit ? limit : peer), "\n");
     }
-    char text[200];
-    std::snprintf(text, sizeof(text),
-                  "Geometric means: %.2f of the limit (%zu measurements), %.2f times the best peer "
-                  "(%zu measurements).\n",
-                  geometricMean(limits), limits.size(), geometricMean(peerSpeeds),
-                  peerSpeeds.size());
-    return text;
+    return lines;
 }
 
-void printSummary(const std::vector<Result> &results) {
-    std::printf("\n%s", summaryText(results).c_str());
-    std::vector<const Result *> missed;
+std::string performancePage(const std::vector<Result> &results) {
+    std::vector<std::string> families, areas;
     for (const Result &result : results) {
-        if (reached(result) < 1)
-            missed.push_back(&result);
+        addOnce(families, result.operation->family);
+        addOnce(areas, result.operation->area.name);
     }
-    std::sort(missed.begin(), missed.end(),
-              [](const Result *a, const Result *b) { return reached(*a) < reached(*b); });
-    std::printf("%zu of %zu below their target, the furthest first:\n", missed.size(),
-                results.size());
-    for (const Result *result : missed) {
-        const Target target = targetOf(*result);
-        std::printf("%5.2f  ", reached(*result));
-        std::printf("(limit %.2f, peer %.2f)  ", target.limit, target.peer);
-        printResult(*result);
+    std::string head = "| Family |", line = "\n|---|", rows, tables;
+    for (const std::string &family : families) {
+        rows += text("\n| ", family, " |");
+        for (const std::string &area : areas)
+            rows += text(" ", meanText(results, &Result::peer, family, area), " |");
     }
+    for (const std::string &area : areas) {
+        head += text(" ", area, " |");
+        line += "--:|";
+        tables += text("\n## ", area, "\n\n", kHeadOfTable);
+        for (const auto &[operation, nanoseconds, limit, peer, bytesDiffer] : results)
+            if (operation->area.name == area)
+                tables += text("| ", operation->name, " | ",
+                               fixed(nanoseconds, nanoseconds < 100 ? 1 : 0), " | ",
+                               standingText(limit), " | ", standingText(peer), " |\n");
+    }
+    return text("# Performance\n\nWritten by `scripts/bench --report=docs`; do not edit.\n\n"
+                "Measured on one core of ",
+                processorName(), " (", hwy::TargetName(hwy::SupportedAndGeneratedTargets()[0]),
+                "). Peers: ", peerText(), ".\n\n", kIntroduction, summaryText(results),
+                "\n## Beside the best peer\n\nGeometric means, and the counts of operations that "
+                "peers have.\n\n",
+                head, line, rows, "\n", tables);
 }
 
 } // namespace quillon::bench

@@ -1,254 +1,116 @@
 #include "shapes.h"
 
-#include "memory.h"
+#include "arena.h"
+#include "comparison.h"
 #include "operations/operations.h"
-#include "peers/peers.h"
 
 #include <algorithm>
-#include <chrono>
-#include <cstdio>
-#include <fstream>
 #include <map>
 
 namespace quillon::bench {
 namespace {
 
-// The fastest of several tries: slower ones were disturbed.
-double nanoseconds(const Work &work, double tryNanoseconds) {
-    using Clock = std::chrono::steady_clock;
-    const auto timed = [&](size_t calls) {
-        const auto begin = Clock::now();
-        for (size_t call = 0; call < calls; ++call) {
-            work();
-            benchmark::ClobberMemory();
-        }
-        const std::chrono::duration<double, std::nano> elapsed = Clock::now() - begin;
-        return elapsed.count() / static_cast<double>(calls);
-    };
-    double least = timed(2);
+constexpr uint32_t kHeight = 16;
+constexpr double kTry = 4000;    // nanoseconds, of the sweep
+constexpr double kLongTry = 1e6; // of the growth
+constexpr double kSlow = 1.5;
+
+constexpr uint32_t kSides[] = {16, 32, 64, 128, 256, 512, 1024, 2048, 4096, 8192};
+constexpr const char *kShown[] = {
+    "fill 32",          "alpha fill",       "raster fill xor 32", "copy 32",
+    "scroll up",        "blend noise",      "bits noise to 32",   "stencil text to 32",
+    "convert 16 to 32", "convert 32 to 24", "index to 32",        "nearest by 1.5",
+    "linear by 1.5",    "box by 0.75",      "YUY2 to 32",         "YV12 to 32"};
+
+constexpr const char *kIntroduction =
+    "# Growth\n\nWritten by `scripts/bench --growth --report=docs`; do not edit. Nanoseconds a "
+    "pixel "
+    "of squares of contiguous rows, again and again on the same memory, so that the steps are "
+    "those from one cache to the next. The empty call has a width of 0; its number is the "
+    "nanoseconds of the call.\n\n";
+
+// Nanoseconds of a call: the fastest of several tries, as others were disturbed.
+double timeOf(const Operation &operation, double tryNanoseconds) {
+    const std::vector<Work> works = {operation.contenders[0].prepare(makeJobs(operation)[0])};
+    size_t place = 0;
+    double least = 1e9 * secondsPerCall(works, 2, place);
     const auto calls = static_cast<size_t>(std::max(tryNanoseconds / least, 1.0));
     for (int i = 0; i < 5; ++i)
-        least = std::min(least, timed(calls));
+        least = std::min(least, 1e9 * secondsPerCall(works, calls, place));
     return least;
 }
 
-// ---- Sweep ----------------------------------------------------------------
-
-constexpr uint32_t kWidths = 300;
-constexpr uint32_t kHeight = 16;
-constexpr double kTry = 4000;
-
-// Nanoseconds of a call for every width, those of one operation and one layout.
-struct Series {
-    std::vector<double> ours = std::vector<double>(kWidths + 1);
-    std::vector<double> plain = std::vector<double>(kWidths + 1); // 0: no such loop
-};
-using AllSeries = std::map<std::string, Series>;
-
-double median(std::vector<double> values) {
-    std::sort(values.begin(), values.end());
-    return values[values.size() / 2];
-}
-
-// The time for a pixel of widths up to a quarter smaller or larger.
-double neighbours(const std::vector<double> &times, uint32_t width) {
-    const uint32_t reach = std::min(width / 4, 16U);
-    std::vector<double> pixelTimes;
-    for (uint32_t near = width - reach; near <= std::min(width + reach, kWidths); ++near) {
-        if (near != width)
-            pixelTimes.push_back(times[near] / near);
-    }
-    return median(pixelTimes);
-}
-
-// Each width, as an operation of that area.
-void measureWidth(const Area &area, AllSeries &series) {
-    Plan plan;
-    addPixelOperations(plan, area);
-    Offers plain;
-    offerPlainLoops(plain);
-    for (const Operation &operation : plan) {
-        Places places(operation);
-        const auto timed = [&](const Contender &contender) {
-            return nanoseconds(contender.prepare(places.job(0)), kTry);
-        };
-        Series &at = series[operation.name];
-        at.ours[area.width] = timed(operation.contenders[0]);
-        const auto loop = plain.find(operation.name);
-        if (loop != plain.end())
-            at.plain[area.width] = timed(loop->second[0]);
-    }
-}
-
-// The time of the named operation's call at an area; 0 where that has no such.
+// 0 where the area has no such operation, or is too large for it.
 double timeOf(const std::string &name, const Area &area, double tryNanoseconds) {
-    Plan plan;
-    addPixelOperations(plan, area);
-    for (const Operation &operation : plan) {
-        if (operation.name != name || Places::bytesOf(operation) > arenaBytes())
-            continue;
-        const Places places(operation);
-        return nanoseconds(operation.contenders[0].prepare(places.job(0)), tryNanoseconds);
-    }
+    for (const Operation &operation : pixelOperations(area))
+        if (operation.name == name && placeBytes(operation) <= arenaBytes())
+            return timeOf(operation, tryNanoseconds);
     return 0;
 }
 
-struct Layout {
-    const char *name;
-    uint32_t surfaceWidth, extraStep;
-
-    Area area(uint32_t width, uint32_t offset = 0) const {
-        return {"", width, kHeight, surfaceWidth, false, offset, extraStep};
-    }
-};
-
-// A second and third look at what seems slow: most often something else was.
-double looked(const std::string &operation, const Area &area, double time) {
-    for (int i = 0; i < 3; ++i)
-        time = std::min(time, timeOf(operation, area, 10 * kTry));
-    return time;
-}
-
-struct Finding {
-    double factor;
-    std::string text;
-};
-
-void findSlow(const std::string &operation, const Layout &layout, const Series &series,
-              std::vector<Finding> &findings) {
-    const auto judge = [&](uint32_t width, double bound, const char *whose) {
-        double ours = series.ours[width];
-        if (bound > 0 && ours > bound)
-            ours = looked(operation, layout.area(width), ours);
-        if (bound <= 0 || ours <= bound)
-            return;
-        char text[200];
-        std::snprintf(text, sizeof(text), "%s, %s, width %u: %.1f ns, %s %.1f", operation.c_str(),
-                      layout.name, width, ours, whose, bound);
-        findings.push_back({ours / bound, text});
-    };
-    for (uint32_t width = 1; width <= kWidths; ++width) {
-        if (width >= 4)
-            judge(width, 2 * width * neighbours(series.ours, width), "twice its neighbours");
-        judge(width, series.plain[width], "a plain loop");
-    }
-}
-
-// Each alignment, against the others of the same width.
-void sweepAlignments(const Layout &layout, std::vector<Finding> &findings) {
-    for (const uint32_t width : {16U, 61U, 250U}) {
-        std::map<std::string, std::vector<double>> times;
-        for (uint32_t offset = 0; offset < 64; ++offset) {
-            AllSeries series;
-            measureWidth(layout.area(width, offset), series);
-            for (const auto &[operation, at] : series)
-                times[operation].push_back(at.ours[width]);
-        }
-        for (const auto &[operation, at] : times) {
-            const double bound = 2 * median(at);
-            for (uint32_t offset = 0; offset < 64; ++offset) {
-                if (at[offset] <= bound)
-                    continue;
-                const double ours = looked(operation, layout.area(width, offset), at[offset]);
-                char text[200];
-                std::snprintf(text, sizeof(text),
-                              "%s, width %u, byte %u: %.1f ns, twice the others %.1f",
-                              operation.c_str(), width, offset, ours, bound);
-                if (ours > bound)
-                    findings.push_back({ours / bound, text});
+// Compares the times of every operation at areas that differ by little from one to
+// the next with those of the areas around.
+size_t sweepAreas(const std::vector<Area> &areas) {
+    std::map<std::string, std::vector<std::pair<double, const Area *>>> series;
+    for (const Area &area : areas)
+        for (const Operation &operation : pixelOperations(area))
+            series[operation.name].push_back({timeOf(operation, kTry), &area});
+    size_t slow = 0;
+    for (const auto &[name, times] : series) {
+        for (size_t i = 0; i < times.size(); ++i) {
+            auto [time, area] = times[i];
+            std::vector<double> around;
+            for (size_t j = i < 16 ? 0 : i - 16; j < std::min(i + 17, times.size()); ++j)
+                around.push_back(times[j].first);
+            // What seems slow is measured again: most often the machine was disturbed.
+            for (int again = 0; again < 3 && time > kSlow * median(around); ++again)
+                time = std::min(time, timeOf(name, *area, 10 * kTry));
+            if (time > kSlow * median(around)) {
+                std::printf("%s, %s, width %u, byte %u: %.1f ns, usual %.1f\n", name.c_str(),
+                            area->name.c_str(), area->width, area->offset, time, median(around));
+                ++slow;
             }
         }
     }
-}
-
-// ---- Growth ---------------------------------------------------------------
-
-constexpr double kLongTry = 1e6;
-constexpr uint32_t kSides[] = {16, 32, 64, 128, 256, 512, 1024, 2048, 4096, 8192};
-
-bool isShown(const std::string &operation) {
-    constexpr const char *kShown[] = {
-        "fill 32",          "alpha fill",       "raster fill xor 32", "copy 32",
-        "scroll up",        "blend noise",      "bits noise to 32",   "stencil text to 32",
-        "convert 16 to 32", "convert 32 to 24", "index to 32",        "nearest by 1.5",
-        "linear by 1.5",    "box by 0.75",      "YUY2 to 32",         "YV12 to 32"};
-    return std::find(std::begin(kShown), std::end(kShown), operation) != std::end(kShown);
-}
-
-// A row of the table: first a call that has nothing to do, then the squares.
-std::string growthRow(const std::string &name) {
-    char text[32];
-    const double empty = timeOf(name, {"", 0, 1, 0, false}, kLongTry);
-    std::snprintf(text, sizeof(text), " | %.1f", empty);
-    std::string row = "| " + name + (empty > 0 ? text : " | ");
-    for (const uint32_t side : kSides) {
-        const double pixels = double{1} * side * side;
-        const double time = timeOf(name, {"", side, side, 0, false}, kLongTry);
-        std::snprintf(text, sizeof(text), " | %.3f", time / pixels);
-        row += time > 0 ? text : " | ";
-    }
-    return row + " |\n";
+    return slow;
 }
 
 } // namespace
 
-int sweep() {
-    constexpr Layout kLayouts[] = {
-        {"packed", 0, 0}, {"in a surface", 2 * kWidths, 0}, {"odd line increments", kWidths, 1}};
-
-    std::vector<Finding> findings;
-    for (const Layout &layout : kLayouts) {
-        AllSeries series;
-        for (uint32_t width = 1; width <= kWidths; ++width) {
-            if (width % 10 == 0) {
-                std::fprintf(stderr, "\r%s: width %u of %u ", layout.name, width, kWidths);
-                std::fflush(stderr);
-            }
-            measureWidth(layout.area(width), series);
-        }
-        std::fprintf(stderr, "\n");
-        for (const auto &[operation, at] : series)
-            findSlow(operation, layout, at, findings);
+size_t sweep() {
+    std::vector<std::vector<Area>> series(6);
+    for (uint32_t width = 1; width <= 300; ++width) {
+        series[0].push_back({"contiguous rows", width, kHeight});
+        series[1].push_back({"in a surface", width, kHeight, 600});
+        series[2].push_back({"odd stride", width, kHeight, 300, false, 0, 1});
     }
-    std::fprintf(stderr, "alignments\n");
-    sweepAlignments({"", kWidths, 0}, findings);
-
-    std::sort(findings.begin(), findings.end(),
-              [](const Finding &a, const Finding &b) { return a.factor > b.factor; });
-    for (const Finding &finding : findings)
-        std::printf("%5.2f  %s\n", finding.factor, finding.text.c_str());
-    std::printf("%zu slow corners\n", findings.size());
-    return findings.empty() ? 0 : 1;
+    for (uint32_t offset = 0; offset < 64; ++offset) {
+        series[3].push_back({"alignments", 16, kHeight, 300, false, offset});
+        series[4].push_back({"alignments", 61, kHeight, 300, false, offset});
+        series[5].push_back({"alignments", 250, kHeight, 300, false, offset});
+    }
+    size_t slow = 0;
+    for (const std::vector<Area> &areas : series)
+        slow += sweepAreas(areas);
+    std::printf("%zu slow shapes\n", slow);
+    return slow;
 }
 
-int growth(const std::string &folder) {
-    std::string page =
-        "# Growth\n\nWritten by `scripts/bench --growth --report=docs`; not by hand. "
-        "Nanoseconds a pixel of squares whose rows lie end to end, again and again "
-        "on the same memory, so that the steps are those from one cache to the "
-        "next; the first number is the nanoseconds of a call that has nothing to "
-        "do, its width being 0.\n\n| Operation | empty call";
-    for (const uint32_t side : kSides)
-        page += " | " + std::to_string(side);
-    page += " |\n|---|--:";
-    for (size_t i = 0; i < std::size(kSides); ++i)
-        page += "|--:";
-    page += "|\n";
-    std::printf("%s", page.c_str());
-
-    Plan names;
-    addPixelOperations(names, kAreas[0]);
-    for (const Operation &named : names) {
-        if (!isShown(named.name))
-            continue;
-        const std::string row = growthRow(named.name);
-        std::printf("%s", row.c_str());
-        std::fflush(stdout);
-        page += row;
+std::string growthPage() {
+    std::string head = "| Operation | empty call |", line = "\n|---|--:|", rows;
+    for (const uint32_t side : kSides) {
+        head += text(" ", side, " |");
+        line += "--:|";
     }
-    if (!folder.empty())
-        std::ofstream(folder + "/growth.md") << page;
-    return 0;
+    for (const char *name : kShown) {
+        const double empty = timeOf(name, {"", 0, 1}, kLongTry);
+        rows += text("\n| ", name, " | ", empty > 0 ? fixed(empty, 1) : "", " |");
+        for (const uint32_t side : kSides) {
+            const double time = timeOf(name, {"", side, side}, kLongTry);
+            rows += text(" ", time > 0 ? fixed(time / side / side, 3) : "", " |");
+        }
+    }
+    return text(kIntroduction, head, line, rows, "\n");
 }
 
 } // namespace quillon::bench

@@ -5,13 +5,13 @@
 
 namespace quillon::bench {
 
-// All widths up to 300, every alignment, gaps between rows and odd line increments.
-// Reports what takes twice as long as what is like it, or longer than a plain loop
-// over the pixels.  Returns an exit code: 1 where there was anything to report.
-int sweep();
+// Prints the rectangles that take much longer than similar ones, of all widths up to
+// 300 with contiguous rows, in a surface and of an odd stride, and of all alignments.
+// Returns their count.
+size_t sweep();
 
-// The time for a pixel from 16 x 16 to 8192 x 8192, and of a call that has nothing
-// to do; growth.md in the folder, unless that is empty.
-int growth(const std::string &folder);
+// The page of the time a pixel of squares from 16 x 16 to 8192 x 8192, and of an
+// empty call.
+std::string growthPage();
 
 } // namespace quillon::bench

@@ -1,29 +1,60 @@
-// The operations that are measured, each family in a file of its own.
+// The operations measured, by the rooms of the library, and what names them.
 #pragma once
 
-#include "../comparison.h"
 #include "../contents.h"
+#include "../operation.h"
+
+#include <quillon/imageUtil.h>
+#include <quillon/raster.h>
+
+#include <map>
+#include <span>
 
 namespace quillon::bench {
 
-// What the operations are given; peers are given the same.
+// ---- What ours and peers are given -----------------------------------------
+
 inline constexpr uint32_t kPixel = 0xFF345678;
 inline constexpr uint32_t kForeground = 0xFF102030;
 inline constexpr uint32_t kBackground = 0xFFE0D0C0;
-inline constexpr uint8_t kAlpha = 0x80;
 
-void addFills(Plan &plan, const Area &area);
-void addCopies(Plan &plan, const Area &area);
-void addBlends(Plan &plan, const Area &area);
-void addBits(Plan &plan, const Area &area);
-void addConversions(Plan &plan, const Area &area);
-void addScaling(Plan &plan, const Area &area);
-void addVideo(Plan &plan, const Area &area);
-// All of these.
-void addPixelOperations(Plan &plan, const Area &area);
+inline constexpr int32_t kIndex = 0; // a depth: palette indices
+inline std::string conversionName(int32_t srcDepth, int32_t dstDepth) {
+    return text(srcDepth == kIndex ? "index" : text("convert ", srcDepth), " to ", dstDepth);
+}
 
-// Those that have no area.
-void addRectLists(Plan &plan);
+// A rectangle that is added to a region or cut out of it.
+struct RegionStep {
+    bool isCut;
+    int32_t x, y, width, height;
+};
+// By name; none is of more than 15 rectangles at any time.
+using RegionSequences = std::map<std::string, std::vector<RegionStep>>;
+const RegionSequences &regionSequences();
+
+// The picture of the image operations, 32 bits a pixel, and its PNG file at zlib's
+// default level, 6.
+const ImageInfo &picture();
+std::span<const uint8_t> pngFile();
+
+// ---- Operations -----------------------------------------------------------
+
+void addFills(Plan &plan);
+void addRops(Plan &plan);
+void addCopies(Plan &plan);
+void addBlends(Plan &plan);
+void addBits(Plan &plan);
+void addConversions(Plan &plan);
+void addScaling(Plan &plan);
+void addVideo(Plan &plan);
+void addColorKeys(Plan &plan);
+void addRegions(Plan &plan); // these have no area
 void addImages(Plan &plan);
+
+// Those that have an area.
+std::vector<Operation> pixelOperations(const Area &area);
+
+// All, with their peers.
+std::vector<Operation> allOperations();
 
 } // namespace quillon::bench

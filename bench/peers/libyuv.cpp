@@ -1,5 +1,5 @@
-// libyuv: its ARGB is our 32 bits; luma and chroma by the same coefficients, rounded.
-#include "../operations/names.h"
+// libyuv: its ARGB is our 32 bits; its luma and chroma are of the same
+// coefficients, rounded.
 #include "../operations/operations.h"
 #include "peers.h"
 
@@ -8,98 +8,63 @@
 namespace quillon::bench {
 namespace {
 
-int width(const Buffer &buffer) {
-    return static_cast<int>(buffer.width);
-}
-int height(const Buffer &buffer) {
-    return static_cast<int>(buffer.height);
-}
-
-// The many functions from one buffer to another.
-using Conversion = int (*)(const uint8_t *, int, uint8_t *, int, int, int);
-
-Prepare converter(Conversion convert) {
-    return [convert](const Job &job) -> Work {
-        return [convert, dst = job.dst, src = job.src()] {
-            convert(src.data, src.line(), dst.data, dst.line(), width(dst), height(dst));
-        };
+using Convert = int (*)(const uint8_t *, int, uint8_t *, int, int, int);
+auto from1(Convert convert) {
+    return [=](const Buffer &dst, const Buffer &src) {
+        convert(src.data, src.stride, dst.data, dst.stride, dst.w(), dst.h());
     };
 }
 
-// The same from three planes.
-using PlanarConversion = int (*)(const uint8_t *, int, const uint8_t *, int, const uint8_t *, int,
-                                 uint8_t *, int, int, int);
-
-Prepare planarConverter(PlanarConversion convert) {
-    return [convert](const Job &job) -> Work {
-        return [convert, dst = job.dst, luma = job.src().data] {
-            const size_t pixels = size_t{dst.width} * dst.height;
-            const int chromaLine = width(dst) / 2;
-            convert(luma, width(dst), luma + pixels * 5 / 4, chromaLine, luma + pixels, chromaLine,
-                    dst.data, dst.line(), width(dst), height(dst));
-        };
+using ConvertPlanes = int (*)(const uint8_t *, int, const uint8_t *, int, const uint8_t *, int,
+                              uint8_t *, int, int, int);
+auto from3(ConvertPlanes convert) {
+    return [=](const Buffer &dst, const Buffer &src) {
+        const uint8_t *v = src.data + size_t{dst.width} * dst.height, *u = v + (v - src.data) / 4;
+        const int stride = dst.w() / 2;
+        convert(src.data, dst.w(), u, stride, v, stride, dst.data, dst.stride, dst.w(), dst.h());
     };
 }
 
-void offerScaling(Offers &offers) {
-    const auto offer = [&](const char *name, double factor, libyuv::FilterMode mode) {
-        offers[scaleName(name, factor)].push_back(
-            {"libyuv", Agreement::Approximate, [mode](const Job &job) -> Work {
-                 return [mode, dst = job.dst, src = job.src()] {
-                     libyuv::ARGBScale(src.data, src.line(), width(src), height(src), dst.data,
-                                       dst.line(), width(dst), height(dst), mode);
-                 };
-             }});
+auto scale(libyuv::FilterMode filter) {
+    return [=](const Buffer &dst, const Buffer &src) {
+        libyuv::ARGBScale(src.data, src.stride, src.w(), src.h(), dst.data, dst.stride, dst.w(),
+                          dst.h(), filter);
     };
-    for (const double factor : kNearestFactors)
-        offer("nearest", factor, libyuv::kFilterNone);
-    for (const double factor : kLinearFactors)
-        offer("linear", factor, libyuv::kFilterBilinear);
-    // By other factors it interpolates, whatever it is asked for.
-    offer("box", 0.5, libyuv::kFilterBox);
 }
 
 } // namespace
 
-void offerLibyuv(Offers &offers) {
-    const auto offer = [&](const std::string &operation, Agreement agreement,
-                           const Prepare &prepare) {
-        offers[operation].push_back({"libyuv", agreement, prepare});
+void offerLibyuv(const Peer &peer) {
+    const auto setPlane = [](const Buffer &dst) {
+        libyuv::SetPlane(dst.data, dst.stride, dst.w(), dst.h(), kPixel & 0xFF);
     };
-    offer("fill 8", Agreement::Exact, [](const Job &job) -> Work {
-        return [dst = job.dst] {
-            libyuv::SetPlane(dst.data, dst.line(), width(dst), height(dst), kPixel & 0xFF);
-        };
-    });
-    offer("fill 32", Agreement::Exact, [](const Job &job) -> Work {
-        return [dst = job.dst] {
-            libyuv::ARGBRect(dst.data, dst.line(), 0, 0, width(dst), height(dst), kPixel);
-        };
-    });
-    offer("copy 32", Agreement::Exact, converter(libyuv::ARGBCopy));
-    for (const char *content : {"noise", "interface"}) {
-        offer("blend " + std::string(content), Agreement::Approximate, [](const Job &job) -> Work {
-            return [dst = job.dst, src = job.src()] {
-                libyuv::ARGBBlend(src.data, src.line(), dst.data, dst.line(), dst.data, dst.line(),
-                                  width(dst), height(dst));
-            };
-        });
-    }
-
-    offer(conversionName(15, 32), Agreement::Approximate, converter(libyuv::ARGB1555ToARGB));
-    offer(conversionName(16, 32), Agreement::Exact, converter(libyuv::RGB565ToARGB));
-    offer(conversionName(24, 32), Agreement::Exact, converter(libyuv::RGB24ToARGB));
-    offer(conversionName(32, 15), Agreement::Approximate, converter(libyuv::ARGBToARGB1555));
-    offer(conversionName(32, 16), Agreement::Exact, converter(libyuv::ARGBToRGB565));
-    offer(conversionName(32, 24), Agreement::Exact, converter(libyuv::ARGBToRGB24));
-
-    offer("YUY2 to 32", Agreement::Approximate, converter(libyuv::YUY2ToARGB));
-    offer("UYVY to 32", Agreement::Approximate, converter(libyuv::UYVYToARGB));
-    offer("YV12 to 32", Agreement::Approximate, planarConverter(libyuv::I420ToARGB));
-    offer("YV12 to 24", Agreement::Approximate, planarConverter(libyuv::I420ToRGB24));
-    offer("YV12 to 16", Agreement::Approximate, planarConverter(libyuv::I420ToRGB565));
-    offer("YV12 to 15", Agreement::Approximate, planarConverter(libyuv::I420ToARGB1555));
-    offerScaling(offers);
+    const auto fill = [](const Buffer &dst) {
+        libyuv::ARGBRect(dst.data, dst.stride, 0, 0, dst.w(), dst.h(), kPixel);
+    };
+    const auto blend = [](const Buffer &dst, const Buffer &src) {
+        libyuv::ARGBBlend(src.data, src.stride, dst.data, dst.stride, dst.data, dst.stride, dst.w(),
+                          dst.h());
+    };
+    peer.offer("fill 8", setPlane, Kind::Exact);
+    peer.offer("fill 32", fill, Kind::Exact);
+    peer.offer("copy 32", from1(libyuv::ARGBCopy), Kind::Exact);
+    peer.offer("blend *", blend);
+    peer.offer("convert 15 to 32", from1(libyuv::ARGB1555ToARGB));
+    peer.offer("convert 16 to 32", from1(libyuv::RGB565ToARGB), Kind::Exact);
+    peer.offer("convert 24 to 32", from1(libyuv::RGB24ToARGB), Kind::Exact);
+    peer.offer("convert 32 to 15", from1(libyuv::ARGBToARGB1555));
+    peer.offer("convert 32 to 16", from1(libyuv::ARGBToRGB565), Kind::Exact);
+    peer.offer("convert 32 to 24", from1(libyuv::ARGBToRGB24), Kind::Exact);
+    peer.offer("YUY2 to 32", from1(libyuv::YUY2ToARGB));
+    peer.offer("UYVY to 32", from1(libyuv::UYVYToARGB));
+    peer.offer("YV12 to 32", from3(libyuv::I420ToARGB));
+    peer.offer("YV12 to 24", from3(libyuv::I420ToRGB24));
+    peer.offer("YV12 to 16", from3(libyuv::I420ToRGB565));
+    peer.offer("YV12 to 15", from3(libyuv::I420ToARGB1555));
+    peer.offer("nearest *", scale(libyuv::kFilterNone));
+    peer.offer("linear *", scale(libyuv::kFilterBilinear));
+    // By other factors its box filter interpolates.
+    peer.offer("box by 0.5", scale(libyuv::kFilterBox));
 }
 
 } // namespace quillon::bench

@@ -1,27 +1,29 @@
 #include "peers.h"
 
 namespace quillon::bench {
+namespace {
 
-const std::vector<Peer> &peers() {
-    static const std::vector<Peer> all = {
-        {"pixman", offerPixman},   {"libyuv", offerLibyuv}, {"OpenCV", offerOpenCv},
-        {"swscale", offerSwscale}, {"SDL", offerSdl},       {"libspng", offerSpng},
-    };
-    return all;
+constexpr struct {
+    const char *name;
+    Offer *offer;
+} kPeers[] = {{"pixman", offerPixman},   {"libyuv", offerLibyuv}, {"OpenCV", offerOpenCv},
+              {"swscale", offerSwscale}, {"SDL", offerSdl},       {"libspng", offerSpng},
+              {"libpng", offerLibpng}};
+
+} // namespace
+
+std::string peerText() {
+    std::string names;
+    for (const auto &[name, offer] : kPeers)
+        names += text(names.empty() ? "" : ", ", name,
+                      offer == nullptr ? " (not installed, left out)" : "");
+    return names;
 }
 
-void addPeers(Plan &plan) {
-    Offers offers;
-    for (const Peer &peer : peers()) {
-        if (peer.offer != nullptr)
-            peer.offer(offers);
-    }
-    for (Operation &operation : plan) {
-        const auto found = offers.find(operation.name);
-        if (found != offers.end())
-            operation.contenders.insert(operation.contenders.end(), found->second.begin(),
-                                        found->second.end());
-    }
+void addPeers(std::vector<Operation> &operations) {
+    for (const auto &[name, offer] : kPeers)
+        if (offer != nullptr)
+            offer({name, operations});
 }
 
 } // namespace quillon::bench

@@ -1,36 +1,36 @@
-// Other libraries that do the same, as far as they were there when this was built.
+// Other libraries that do the same, as far as they were installed when this was
+// built.
 #pragma once
 
-#include "../comparison.h"
+#include "../operation.h"
 
-#include <map>
+#include <fnmatch.h>
 
 namespace quillon::bench {
 
-// Who else does an operation, by its name.
-using Offers = std::map<std::string, std::vector<Contender>>;
+// A library, which adds itself as a contender to the operations that it has.
+struct Peer {
+    const char *library;
+    std::vector<Operation> &operations;
+
+    // The names of the operations are a pattern of fnmatch.
+    template <class Call>
+    void offer(const std::string &names, const Call &call, Kind kind = Kind::Approximate) const {
+        for (Operation &operation : operations)
+            if (fnmatch(names.c_str(), operation.name.c_str(), 0) == 0)
+                operation.contenders.push_back({library, prepare(call), kind});
+    }
+};
 
 // Each in a file of its own, which is left out of the program where its library
 // is not installed; the address is null then.
-[[gnu::weak]] void offerPixman(Offers &offers);
-[[gnu::weak]] void offerLibyuv(Offers &offers);
-[[gnu::weak]] void offerOpenCv(Offers &offers);
-[[gnu::weak]] void offerSwscale(Offers &offers);
-[[gnu::weak]] void offerSdl(Offers &offers);
-[[gnu::weak]] void offerSpng(Offers &offers);
+using Offer = void(const Peer &peer);
+[[gnu::weak]] Offer offerPixman, offerLibyuv, offerOpenCv, offerSwscale, offerSdl, offerSpng,
+    offerLibpng;
 
-// What the library has to be faster than at any shape.  No peer.
-void offerPlainLoops(Offers &offers);
+// The names of the libraries, and which of them are missing.
+std::string peerText();
 
-struct Peer {
-    const char *name;
-    void (*offer)(Offers &); // null: it was not there
-};
-
-// All that this program knows of.
-const std::vector<Peer> &peers();
-
-// Adds to every operation those who offer it.
-void addPeers(Plan &plan);
+void addPeers(std::vector<Operation> &operations);
 
 } // namespace quillon::bench

@@ -1,11 +1,10 @@
-// pixman: fills, composition, conversion through its formats, scaling.
-#include "../operations/names.h"
+// pixman: fills, compositing, conversion through its formats, scaling, regions.
 #include "../operations/operations.h"
-#include "../operations/rectSequences.h"
 #include "peers.h"
 
-#include <memory>
 #include <pixman.h>
+
+#include <memory>
 
 namespace quillon::bench {
 namespace {
@@ -13,185 +12,121 @@ namespace {
 using Image = std::shared_ptr<pixman_image_t>;
 
 Image imageOf(const Buffer &buffer, pixman_format_code_t format) {
-    return {pixman_image_create_bits(format, static_cast<int>(buffer.width),
-                                     static_cast<int>(buffer.height),
-                                     reinterpret_cast<uint32_t *>(buffer.data), buffer.line()),
-            pixman_image_unref};
+    auto *bits = reinterpret_cast<uint32_t *>(buffer.data);
+    const Image image = {
+        pixman_image_create_bits(format, buffer.w(), buffer.h(), bits, buffer.stride),
+        pixman_image_unref};
+    static pixman_indexed_t table = {};
+    table.color = true;
+    for (size_t i = 0; i < 256; ++i)
+        table.rgba[i] = palette()[i] | 0xFF000000;
+    if (format == PIXMAN_c8)
+        pixman_image_set_indexed(image.get(), &table);
+    return image;
 }
 
 Image solid(uint32_t pixel) {
-    const auto channel = [pixel](int shift) {
+    const auto channel = [=](int shift) {
         return static_cast<uint16_t>((pixel >> shift & 0xFF) * 0x0101);
     };
-    const pixman_color_t colour = {channel(16), channel(8), channel(0), channel(24)};
-    return {pixman_image_create_solid_fill(&colour), pixman_image_unref};
+    const pixman_color_t color = {channel(16), channel(8), channel(0), channel(24)};
+    return {pixman_image_create_solid_fill(&color), pixman_image_unref};
 }
 
-Work composite(pixman_op_t op, const Image &src, const Image &mask, const Image &dst,
-               const Buffer &size) {
-    return [=, width = static_cast<uint16_t>(size.width),
-            height = static_cast<uint16_t>(size.height)] {
-        pixman_image_composite32(op, src.get(), mask.get(), dst.get(), 0, 0, 0, 0, 0, 0, width,
-                                 height);
+Work composite(pixman_op_t op, const Image &src, const Image &mask, const Image &dst) {
+    return [=, w = pixman_image_get_width(dst.get()), h = pixman_image_get_height(dst.get())] {
+        pixman_image_composite32(op, src.get(), mask.get(), dst.get(), 0, 0, 0, 0, 0, 0, w, h);
     };
 }
 
-Work fill(const Job &job, int bits) {
-    return [dst = job.dst, bits] {
-        pixman_fill(reinterpret_cast<uint32_t *>(dst.data), static_cast<int>(dst.step / 4), bits, 0,
-                    0, static_cast<int>(dst.width), static_cast<int>(dst.height), kPixel);
+auto compositor(pixman_op_t op, pixman_format_code_t from, pixman_format_code_t to) {
+    return [=](const Buffer &dst, const Buffer &src) {
+        return composite(op, imageOf(src, from), {}, imageOf(dst, to));
     };
 }
 
-struct Format {
-    int32_t depth;
-    pixman_format_code_t src, dst;
-};
-constexpr Format kFormats[] = {
-    {kIndex, PIXMAN_c8, PIXMAN_c8},         {3, PIXMAN_r3g3b2, PIXMAN_r3g3b2},
-    {6, PIXMAN_a2r2g2b2, PIXMAN_a2r2g2b2},  {8, PIXMAN_r3g3b2, PIXMAN_r3g3b2},
-    {15, PIXMAN_x1r5g5b5, PIXMAN_x1r5g5b5}, {16, PIXMAN_r5g6b5, PIXMAN_r5g6b5},
-    {24, PIXMAN_r8g8b8, PIXMAN_r8g8b8},     {32, PIXMAN_x8r8g8b8, PIXMAN_x8r8g8b8},
-};
-
-const pixman_indexed_t *indexed() {
-    static const pixman_indexed_t table = [] {
-        pixman_indexed_t made = {};
-        made.color = true;
-        for (size_t i = 0; i < 256; ++i)
-            made.rgba[i] = palette()[i] | 0xFF000000;
-        return made;
-    }();
-    return &table;
+// A color through a mask of bits.
+auto stencil(pixman_format_code_t format) {
+    return [=](const Buffer &dst, const Buffer &src) {
+        return composite(PIXMAN_OP_OVER, solid(kForeground), imageOf(src, PIXMAN_a1),
+                         imageOf(dst, format));
+    };
 }
 
-void offerConversions(Offers &offers) {
-    for (const Format &from : kFormats) {
-        for (const Format &to : kFormats) {
-            offers[conversionName(from.depth, to.depth)].push_back(
-                {"pixman", Agreement::Approximate, [=](const Job &job) -> Work {
-                     const Image src = imageOf(job.src(), from.src);
-                     if (from.depth == kIndex)
-                         pixman_image_set_indexed(src.get(), indexed());
-                     return composite(PIXMAN_OP_SRC, src, {}, imageOf(job.dst, to.dst), job.dst);
-                 }});
-        }
-    }
+auto expand(pixman_format_code_t format) {
+    return [=](const Buffer &dst, const Buffer &src) -> Work {
+        const Work fill = composite(PIXMAN_OP_SRC, solid(kBackground), {}, imageOf(dst, format));
+        return [fill, draw = stencil(format)(dst, src)] { fill(), draw(); };
+    };
 }
 
-// Letters of a colour: through a mask of bits, over a ground where there is one.
-void offerBits(Offers &offers) {
-    constexpr struct {
-        int bits;
-        pixman_format_code_t format;
-    } kDepths[] = {
-        {8, PIXMAN_r3g3b2}, {16, PIXMAN_r5g6b5}, {24, PIXMAN_r8g8b8}, {32, PIXMAN_x8r8g8b8}};
-    for (const auto &depth : kDepths) {
-        const auto stencil = [format = depth.format](const Job &job) -> Work {
-            return composite(PIXMAN_OP_OVER, solid(kForeground), imageOf(job.src(), PIXMAN_a1),
-                             imageOf(job.dst, format), job.dst);
-        };
-        for (const char *content : {"text", "noise", "sparse"})
-            offers["stencil " + std::string(content) + " to " + std::to_string(depth.bits)]
-                .push_back({"pixman", Agreement::Approximate, stencil});
-        offers["bits noise to " + std::to_string(depth.bits)].push_back(
-            {"pixman", Agreement::Approximate, [=, format = depth.format](const Job &job) -> Work {
-                 const Image dst = imageOf(job.dst, format);
-                 const Work ground = composite(PIXMAN_OP_SRC, solid(kBackground), {}, dst, job.dst);
-                 const Work letters = stencil(job);
-                 return [=] {
-                     ground();
-                     letters();
-                 };
-             }});
-    }
-}
-
-Work scale(const Job &job, double factor, pixman_filter_t filter) {
-    const Image src = imageOf(job.src(), PIXMAN_a8r8g8b8);
-    pixman_transform_t transform;
-    pixman_transform_init_scale(&transform, pixman_double_to_fixed(1 / factor),
-                                pixman_double_to_fixed(1 / factor));
-    pixman_image_set_transform(src.get(), &transform);
-    if (filter == PIXMAN_FILTER_SEPARABLE_CONVOLUTION) {
+auto scale(pixman_filter_t filter) {
+    return [=](const Buffer &dst, const Buffer &src) {
+        const Image image = imageOf(src, PIXMAN_a8r8g8b8);
+        const pixman_fixed_t step = pixman_double_to_fixed(double(src.width) / dst.width);
+        pixman_transform_t transform;
+        pixman_transform_init_scale(&transform, step, step);
+        pixman_image_set_transform(image.get(), &transform);
         int count = 0;
-        const pixman_fixed_t step = pixman_double_to_fixed(1 / factor);
-        const std::unique_ptr<pixman_fixed_t, decltype(&free)> parameters(
+        const std::unique_ptr<pixman_fixed_t, decltype(&free)> box(
             pixman_filter_create_separable_convolution(&count, step, step, PIXMAN_KERNEL_IMPULSE,
                                                        PIXMAN_KERNEL_IMPULSE, PIXMAN_KERNEL_BOX,
                                                        PIXMAN_KERNEL_BOX, 4, 4),
             free);
-        pixman_image_set_filter(src.get(), filter, parameters.get(), count);
-    } else {
-        pixman_image_set_filter(src.get(), filter, nullptr, 0);
-    }
-    pixman_image_set_repeat(src.get(), PIXMAN_REPEAT_PAD);
-    return composite(PIXMAN_OP_SRC, src, {}, imageOf(job.dst, PIXMAN_a8r8g8b8), job.dst);
-}
-
-void offerScaling(Offers &offers) {
-    const auto offer = [&](const char *name, double factor, pixman_filter_t filter) {
-        offers[scaleName(name, factor)].push_back(
-            {"pixman", Agreement::Approximate,
-             [=](const Job &job) -> Work { return scale(job, factor, filter); }});
+        const bool isBox = filter == PIXMAN_FILTER_SEPARABLE_CONVOLUTION;
+        pixman_image_set_filter(image.get(), filter, isBox ? box.get() : nullptr,
+                                isBox ? count : 0);
+        pixman_image_set_repeat(image.get(), PIXMAN_REPEAT_PAD);
+        return composite(PIXMAN_OP_SRC, image, {}, imageOf(dst, PIXMAN_a8r8g8b8));
     };
-    for (const double factor : kNearestFactors)
-        offer("nearest", factor, PIXMAN_FILTER_NEAREST);
-    for (const double factor : kLinearFactors)
-        offer("linear", factor, PIXMAN_FILTER_BILINEAR);
-    for (const double factor : kBoxFactors)
-        offer("box", factor, PIXMAN_FILTER_SEPARABLE_CONVOLUTION);
 }
 
-void offerRectLists(Offers &offers) {
-    for (const RectSequence &sequence : rectSequences()) {
-        offers["rectangles " + sequence.name].push_back(
-            {"pixman", Agreement::Approximate, [&](const Job & /*job*/) -> Work {
-                 return [&steps = sequence.steps] {
-                     pixman_region32_t region;
-                     pixman_region32_init(&region);
-                     for (const ListStep &step : steps) {
-                         const auto width = static_cast<unsigned>(step.width);
-                         const auto height = static_cast<unsigned>(step.height);
-                         if (!step.cut) {
-                             pixman_region32_union_rect(&region, &region, step.x, step.y, width,
-                                                        height);
-                             continue;
-                         }
-                         pixman_region32_t hole;
-                         pixman_region32_init_rect(&hole, step.x, step.y, width, height);
-                         pixman_region32_subtract(&region, &region, &hole);
-                     }
-                     benchmark::DoNotOptimize(region);
-                     pixman_region32_fini(&region);
-                 };
-             }});
+void runSteps(const std::vector<RegionStep> &steps) {
+    pixman_region32_t region, hole;
+    pixman_region32_init(&region);
+    for (const auto &[isCut, x, y, width, height] : steps) {
+        const auto w = static_cast<unsigned>(width), h = static_cast<unsigned>(height);
+        if (isCut) {
+            pixman_region32_init_rect(&hole, x, y, w, h);
+            pixman_region32_subtract(&region, &region, &hole);
+        } else {
+            pixman_region32_union_rect(&region, &region, x, y, w, h);
+        }
     }
+    benchmark::DoNotOptimize(region);
+    pixman_region32_fini(&region);
 }
 
 } // namespace
 
-void offerPixman(Offers &offers) {
+void offerPixman(const Peer &peer) {
     for (const int bits : {8, 16, 32}) {
-        offers["fill " + std::to_string(bits)].push_back(
-            {"pixman", Agreement::Exact, [=](const Job &job) { return fill(job, bits); }});
+        const auto fill = [=](const Buffer &dst) {
+            pixman_fill(reinterpret_cast<uint32_t *>(dst.data), dst.stride / 4, bits, 0, 0, dst.w(),
+                        dst.h(), kPixel);
+        };
+        peer.offer(text("fill ", bits), fill, Kind::Exact);
     }
-    offers["copy 32"].push_back({"pixman", Agreement::Exact, [](const Job &job) -> Work {
-                                     return composite(PIXMAN_OP_SRC,
-                                                      imageOf(job.src(), PIXMAN_a8r8g8b8), {},
-                                                      imageOf(job.dst, PIXMAN_a8r8g8b8), job.dst);
-                                 }});
-    for (const char *content : {"noise", "interface"}) {
-        offers["blend " + std::string(content)].push_back(
-            {"pixman", Agreement::Approximate, [](const Job &job) -> Work {
-                 return composite(PIXMAN_OP_OVER, imageOf(job.src(), PIXMAN_a8r8g8b8), {},
-                                  imageOf(job.dst, PIXMAN_x8r8g8b8), job.dst);
-             }});
+    const auto copy = compositor(PIXMAN_OP_SRC, PIXMAN_a8r8g8b8, PIXMAN_a8r8g8b8);
+    peer.offer("copy 32", copy, Kind::Exact);
+    peer.offer("blend *", compositor(PIXMAN_OP_OVER, PIXMAN_a8r8g8b8, PIXMAN_x8r8g8b8));
+    constexpr struct {
+        int32_t depth;
+        pixman_format_code_t format;
+    } kFormats[] = {{kIndex, PIXMAN_c8}, {3, PIXMAN_r3g3b2},    {6, PIXMAN_a2r2g2b2},
+                    {8, PIXMAN_r3g3b2},  {15, PIXMAN_x1r5g5b5}, {16, PIXMAN_r5g6b5},
+                    {24, PIXMAN_r8g8b8}, {32, PIXMAN_x8r8g8b8}};
+    for (const auto &[depth, to] : kFormats) {
+        for (const auto &[fromDepth, from] : kFormats)
+            peer.offer(conversionName(fromDepth, depth), compositor(PIXMAN_OP_SRC, from, to));
+        peer.offer(text("stencil * to ", depth), stencil(to));
+        peer.offer(text("bits * to ", depth), expand(to));
     }
-    offerConversions(offers);
-    offerBits(offers);
-    offerScaling(offers);
-    offerRectLists(offers);
+    peer.offer("nearest *", scale(PIXMAN_FILTER_NEAREST));
+    peer.offer("linear *", scale(PIXMAN_FILTER_BILINEAR));
+    peer.offer("box *", scale(PIXMAN_FILTER_SEPARABLE_CONVOLUTION));
+    for (const auto &[name, steps] : regionSequences())
+        peer.offer(text("rectangles ", name), [&steps = steps] { runSteps(steps); });
 }
 
 } // namespace quillon::bench
