@@ -1,10 +1,14 @@
-// The scaler's entries: checks, and the fixed point that the kernels work in.
-
-#include "core/extended.h"
-#include "legacy/copyRows.h"
-#include "scale/scaleKernels.h"
-#include <hearth/hearth.h>
+// Resampling of 32-bit images, and the map of source coordinates to those of the
+// scaled image.
 #include <quillon/raster.h>
+
+#include "copy/copyRows.h"
+#include "core/extended.h"
+#include "core/surface.h"
+#include "scale/scaleAxis.h"
+#include "scale/scaleKernels.h"
+
+#include <hearth/hearth.h>
 
 #include <bit>
 #include <cmath>
@@ -14,18 +18,19 @@ namespace quillon {
 namespace {
 
 constexpr uint32_t kMaxSize = 32767;
-constexpr double kMinScale = 1.0 / 32767; // this one is refused, too
-constexpr double kMaxScale = 65536;       // with more, a step would be 0
+constexpr double kMinScale = 1.0 / 32767; // refused itself
+constexpr double kMaxScale = 65536;       // with more, the step would be 0
 
-// Not a number fails both comparisons.
+// NaN fails both comparisons.
 bool isValidScale(double scale) {
     return scale > kMinScale && scale <= kMaxScale;
 }
 
-// The low 32 bits of 65536 / scale in extended precision.
+// 65536 / scale, rounded to a 64-bit significand and truncated; its low 32 bits.
 uint32_t stepOf(double scale) {
-    // Less than 2^32, a quotient of doubles is off by 2^-22 at most.  That only
-    // shows beside whole numbers, and powers of two divide exactly.
+    // The quotient of doubles is below 2^32 and off by 2^-22 at most: truncation
+    // gives another number than it should only next to whole numbers.  Powers of
+    // two divide exactly.
     const double quotient = kScaleOne / scale;
     const auto whole = static_cast<uint64_t>(quotient);
     const double fraction = quotient - static_cast<double>(whole);
@@ -35,7 +40,8 @@ uint32_t stepOf(double scale) {
     return (Extended(kScaleOne) / Extended(scale)).truncated();
 }
 
-// One axis of the job, for the pixels from first to end.
+// The axis of the destination pixels from first to end, of which there is one at
+// least.
 ScaleAxis makeAxis(double scale, bool isFiltered, int32_t first, int32_t end, uint32_t srcSize) {
     ScaleAxis axis{};
     axis.step = stepOf(scale);
@@ -46,7 +52,8 @@ ScaleAxis makeAxis(double scale, bool isFiltered, int32_t first, int32_t end, ui
         axis.method = ScaleMethod::kNearest;
     } else if (axis.step > kScaleOne) {
         axis.method = ScaleMethod::kBox;
-        axis.normaliser = static_cast<uint32_t>(scale * kScaleOne); // exact but for the truncation
+        // A power of two: the product is exact before it is truncated.
+        axis.normaliser = static_cast<uint32_t>(scale * kScaleOne);
     } else {
         axis.method = ScaleMethod::kLinear;
         axis.start -= kScaleOne / 2;
@@ -54,9 +61,19 @@ ScaleAxis makeAxis(double scale, bool isFiltered, int32_t first, int32_t end, ui
     return axis;
 }
 
-// Whether the pixels are those of the source, one by one.
-bool isCopy(const ScaleAxis &axis) {
-    return axis.step == kScaleOne && uint64_t{axis.start >> 16} + axis.dstSize <= axis.srcSize;
+// False when there is no memory for the row cache; nothing is written then.
+bool scaleRect(const ScaleJob &job) {
+    const ScaleCacheShape shape(job);
+    if (shape.slotCount == 0) {
+        RasterScaleRect(job, nullptr);
+        return true;
+    }
+    void *cache = UtilSafeMalloc0(shape.bytes());
+    if (cache == nullptr)
+        return false;
+    RasterScaleRect(job, cache);
+    std::free(cache);
+    return true;
 }
 
 // One axis of Raster_ScaleSrcCoordinates.
@@ -90,31 +107,25 @@ uint32_t Raster_Scale(uint8_t *dstBuffer, int32_t dstLineIncrement, uint32_t dst
         return 1;
 
     const ptrdiff_t dstOffset = ptrdiff_t{dstLineIncrement} * top + ptrdiff_t{4} * left;
-    const ScaleJob job{
+    const ScaleJob job = {
         {advance(dstBuffer, static_cast<uint64_t>(dstOffset)), dstLineIncrement},
         {srcBuffer, srcLineIncrement},
         makeAxis(scaleX, filter != 0, left, right, srcWidth),
         makeAxis(scaleY, filter != 0, top, bottom, srcHeight),
     };
-    if (isCopy(job.x) && isCopy(job.y)) {
-        const uint8_t *first =
-            pixelAddress(srcBuffer, srcLineIncrement, 4, job.x.start >> 16, job.y.start >> 16);
-        copyRows(job.dst, {first, srcLineIncrement}, {size_t{job.x.dstSize} * 4, job.y.dstSize},
-                 RowOrder::Downwards);
-        return 1;
-    }
-    const ScaleCacheShape shape(job);
-    void *cache = shape.slots == 0 ? nullptr : UtilSafeMalloc0(shape.bytes());
-    if (cache == nullptr && shape.slots != 0)
-        return 0;
-    RasterScaleRect(job, cache);
-    std::free(cache);
+    if (!job.x.isCopy() || !job.y.isCopy())
+        return scaleRect(job) ? 1 : 0;
+
+    const SrcRows src = {
+        pixelAddress(srcBuffer, srcLineIncrement, 4, job.x.start >> 16, job.y.start >> 16),
+        srcLineIncrement};
+    copyRows(job.dst, src, job.dstExtent(), RowOrder::kDownward);
     return 1;
 }
 
 void Raster_ScaleSrcCoordinates(Rect *rect, uint32_t srcWidth, uint32_t srcHeight, double scaleX,
                                 double scaleY) {
-    // Infinite coordinates would be no coordinates.
+    // Extended has no infinity and no NaN.
     if (!std::isfinite(scaleX) || !std::isfinite(scaleY))
         return;
     scaleRange(rect->left, rect->right, srcWidth, scaleX);

@@ -139,7 +139,7 @@ HWY_INLINE void walkFrom(Chunk<kUnits> chunk, size_t begin, size_t end, const Bo
     // Computed ahead, so that it is hoisted out of the loop over the rows.
     const size_t tail = end - (end - begin) % kUnits;
     size_t i = begin;
-    for (; tail - i >= kStep; i += kStep) {
+    for (; kPolicy.unroll == 1 ? i != tail : tail - i >= kStep; i += kStep) {
         if constexpr (kPolicy.prefetches)
             body.prefetch(Chunk<kStep>(), i, distance);
         walkTurns<Access, kUnits>(i, body, std::make_index_sequence<kPolicy.unroll>());

@@ -1,4 +1,4 @@
-// Lookups in registers and in memory.
+// Lookups in registers and in memory, and even and odd lanes.
 //
 // Included once per instruction set; the usual guards do not apply.
 
@@ -33,6 +33,47 @@ HWY_INLINE hn::Vec<D> lookupInTwo(D d, hn::Vec<D> low, hn::Vec<D> high, hn::Vec<
     const auto lane = hn::IndicesFromVec(d, hn::And(index, hn::Set(d, n - 1)));
     const auto isLow = hn::Eq(hn::And(index, hn::Set(d, n)), hn::Zero(d));
     return hn::IfThenElse(isLow, hn::TableLookupLanes(low, lane), hn::TableLookupLanes(high, lane));
+}
+
+// The lanes with even places, or with odd ones, of two vectors that lie end to end.
+// Their order is any, the same for both, and laneOrderRestored makes it that of
+// memory: where blocks are expensive to cross, one crossing then serves for all
+// that is computed from such vectors.
+#if QUILLON_X86_AVX2 && !QUILLON_X86_AVX512
+namespace detail {
+template <int kLanesOfBlock>
+HWY_INLINE __m256i selectInBlocks(__m256i low, __m256i high) {
+    return _mm256_castps_si256(
+        _mm256_shuffle_ps(_mm256_castsi256_ps(low), _mm256_castsi256_ps(high), kLanesOfBlock));
+}
+} // namespace detail
+#endif
+
+template <class D>
+HWY_INLINE hn::Vec<D> evenLanesUnordered(D d, hn::Vec<D> low, hn::Vec<D> high) {
+    static_assert(sizeof(hn::TFromD<D>) == 4 && kLanes<D> > 1);
+#if QUILLON_X86_AVX2 && !QUILLON_X86_AVX512
+    if constexpr (kLanes<D> == 8)
+        return hn::Vec<D>{detail::selectInBlocks<0x88>(low.raw, high.raw)};
+#endif
+    return hn::ConcatEven(d, high, low);
+}
+template <class D>
+HWY_INLINE hn::Vec<D> oddLanesUnordered(D d, hn::Vec<D> low, hn::Vec<D> high) {
+    static_assert(sizeof(hn::TFromD<D>) == 4 && kLanes<D> > 1);
+#if QUILLON_X86_AVX2 && !QUILLON_X86_AVX512
+    if constexpr (kLanes<D> == 8)
+        return hn::Vec<D>{detail::selectInBlocks<0xDD>(low.raw, high.raw)};
+#endif
+    return hn::ConcatOdd(d, high, low);
+}
+template <class D>
+HWY_INLINE hn::Vec<D> laneOrderRestored(D /*d*/, hn::Vec<D> v) {
+#if QUILLON_X86_AVX2 && !QUILLON_X86_AVX512
+    if constexpr (kLanes<D> == 8)
+        return hn::Vec<D>{_mm256_permute4x64_epi64(v.raw, 0xD8)};
+#endif
+    return v;
 }
 
 // table[index] of each lane, four or more; no index is negative.

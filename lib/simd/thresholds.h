@@ -64,4 +64,14 @@ inline constexpr size_t kConvertLongRow = 512;
 // next row: it is one or two lines.
 inline constexpr size_t kConvertPrefetchRow = 32;
 
+// Nearest pixels of every eighth: destination rows from here on read the source in
+// whole vectors, shorter ones gather.
+inline constexpr uint32_t kScaleLongRowBy8 = 128;
+
+// ---- Source pixels ----------------------------------------------------------
+
+// The scaler picks pixels from whole vectors of the source for steps, and averages
+// of spans, of up to so many pixels.
+inline constexpr uint32_t kScaleMostWindows = 4;
+
 } // namespace quillon
