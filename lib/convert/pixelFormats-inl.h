@@ -162,7 +162,7 @@ struct To8Bits : Storage<1, false> {
         narrowPixels<kBytes>(d, pixels, weights, narrow);
         if constexpr (kVectors == 1) {
             const hn::Rebind<uint8_t, D> d8;
-            access.store(d8, hn::TruncateTo(d8, narrow[0]), dst);
+            access.store(d8, narrowOne(d8, d, narrow[0]), dst);
         } else if constexpr (kVectors == 2) {
             const hn::Repartition<uint8_t, D> d8;
             const hn::Half<decltype(d8)> half;
@@ -183,7 +183,7 @@ struct To16Bits : Storage<2, false> {
         narrowPixels<kBytes>(d, pixels, weights, narrow);
         if constexpr (kVectors == 1) {
             const hn::Rebind<uint16_t, D> d16;
-            access.store(d16, hn::TruncateTo(d16, narrow[0]), dst);
+            access.store(d16, narrowOne(d16, d, narrow[0]), dst);
         } else {
             const hn::Repartition<uint16_t, D> d16;
             for (size_t v = 0; v < kVectors; v += 2)
@@ -279,8 +279,7 @@ struct ConvertFrom16Body : ConversionRow<2, traitsOf(kTo).bytesPerPixel> {
             for (size_t b = 0; b < 2 * C::kUnits; b += 2 * n)
                 access.store(d, convertLanes<kFrom, kTo>(d, loadBytes(d, from + b)), to + b);
         } else if constexpr (n == C::kUnits) {
-            access.store(d8, hn::TruncateTo(d8, convertLanes<kFrom, kTo>(d, loadBytes(d, from))),
-                         to);
+            access.store(d8, narrowOne(d8, d, convertLanes<kFrom, kTo>(d, loadBytes(d, from))), to);
         } else {
             const auto first = inRegister(loadBytes(d, from));
             const auto second = inRegister(loadBytes(d, from + 2 * n));

@@ -224,6 +224,28 @@ HWY_INLINE hn::Vec<D8> narrowTo8(D8 d8, const V (&v)[4]) {
 
 #endif
 
+// One vector of wider lanes, of values that fit, to a shorter vector of 8 or 16 bits.
+// Not by hn::TruncateTo where there is an instruction: Highway 1.0.3 gets some sizes
+// of AVX3_DL wrong.
+template <class DNarrow, class D>
+HWY_INLINE hn::Vec<DNarrow> narrowOne(DNarrow narrow, D /*d*/, hn::Vec<D> v) {
+#if QUILLON_X86_AVX512
+    constexpr size_t kFrom = sizeof(hn::TFromD<D>), kTo = sizeof(hn::TFromD<DNarrow>);
+    if constexpr (kBytesOf<D> == 64 && kFrom == 4 && kTo == 1)
+        return hn::Vec<DNarrow>{_mm512_cvtepi32_epi8(v.raw)};
+    else if constexpr (kBytesOf<D> == 64 && kFrom == 2 && kTo == 1)
+        return hn::Vec<DNarrow>{_mm512_cvtepi16_epi8(v.raw)};
+    else if constexpr (kBytesOf<D> == 32 && kFrom == 4 && kTo == 1)
+        return hn::Vec<DNarrow>{_mm256_cvtepi32_epi8(v.raw)};
+    else if constexpr (kBytesOf<D> == 32 && kFrom == 4 && kTo == 2)
+        return hn::Vec<DNarrow>{_mm256_cvtepi32_epi16(v.raw)};
+    else if constexpr (kBytesOf<D> == 32 && kFrom == 2 && kTo == 1)
+        return hn::Vec<DNarrow>{_mm256_cvtepi16_epi8(v.raw)};
+    else
+#endif
+        return hn::TruncateTo(narrow, v);
+}
+
 // ---- Widening -------------------------------------------------------------
 
 // 32-bit indices that put the 8-byte pieces of a vector's first half in the lower
