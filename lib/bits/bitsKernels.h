@@ -1,16 +1,17 @@
-// The lower floor of bit expansion.  Rows of the bitmap begin on a byte; size
-// counts pixels, and neither of its fields is 0.  bytesPerPixel is 1 to 4.
+// The kernels of bit expansion.  Rows of a bitmap begin on a byte.  No size of an
+// extent is 0; bytesPerPixel is 1 to 4.
 #pragma once
 
-#include "legacy/surface.h"
+#include "core/surface.h"
 
 namespace quillon {
 
-// Foreground for a set bit, background for a clear one.
-void bitsToPixelRows(DstRows dst, SrcRows bits, Size size, int32_t bytesPerPixel,
-                     uint32_t foreground, uint32_t background);
+// Stores foreground for a set bit, background for a clear one.
+void expandBitRows(DstRows dst, SrcRows bits, Extent extent, int32_t bytesPerPixel,
+                   uint32_t foreground, uint32_t background);
 
-// The pixel for a set bit; memory under a clear one is not touched.
-void stencilRows(DstRows dst, SrcRows bits, Size size, int32_t bytesPerPixel, uint32_t pixel);
+// Stores the pixel for a set bit.  Memory under a clear one is not touched.
+void stencilBitRows(DstRows dst, SrcRows bits, Extent extent, int32_t bytesPerPixel,
+                    uint32_t pixel);
 
 } // namespace quillon

@@ -118,6 +118,12 @@ struct FirstLanes {
 #endif
 };
 
+// Only the first units of a chunk, which is not always one vector: the body itself
+// leaves out the memory of the others.
+struct FirstUnits {
+    size_t count;
+};
+
 // Stores the lanes, of 8 or 32 bits in a whole vector, that the mask selects.
 // Memory of the others is not touched.
 template <class D>

@@ -21,6 +21,12 @@
 //
 //     template <class C> void prefetch(C chunk, size_t i, PrefetchDistance) const
 //
+// A body that is faster where it knows the unit at which whole chunks begin has
+//
+//     template <class Use> void forChunksFrom(size_t begin, const Use &use) const
+//
+// which calls use with the body for these chunks, once a row.
+//
 // A row is a head up to the first cache line, whole chunks, and a tail.  All three
 // run the same body, so that there is no second algorithm for the ends of rows,
 // and no byte outside the row is touched.
@@ -66,6 +72,9 @@ enum class Tail {
     // Each unit once: a chunk of which only the first lanes are touched, where
     // kHasMaskedTails, else chunks of half the size, a quarter and so on.
     kExact,
+    // Each unit once: a chunk with the access FirstUnits, for bodies that leave out
+    // the other units themselves.
+    kPartial,
     // Left to the caller.
     kNone,
 };
@@ -74,6 +83,7 @@ struct RowPolicy {
     Tail tail = Tail::kOverlap;
     size_t unroll = 1;
     bool prefetches = false;
+    bool hasForChunksFrom = false;
 };
 
 // Calls use with the first of the chunk sizes, which fall, that is not above kMost
@@ -119,25 +129,11 @@ HWY_INLINE void walkRestOfTurns(size_t i, size_t end, const Body &body) {
     }
 }
 
-// Whole chunks from begin on, and the tail.  The overlapping ones need end to be
-// kUnits or more.
+// The whole chunks from begin to tail.
 template <RowPolicy kPolicy, class Access, size_t kUnits, class Body>
-HWY_INLINE void walkFrom(Chunk<kUnits> chunk, size_t begin, size_t end, const Body &body,
-                         [[maybe_unused]] PrefetchDistance distance = {}) {
-    if constexpr (kPolicy.tail == Tail::kOverlapInLoop) {
-        static_assert(kPolicy.unroll == 1 && std::is_same_v<Access, Unaligned>);
-        const size_t last = end - kUnits;
-        for (size_t i = begin;; i = std::min(i + kUnits, last)) {
-            if constexpr (kPolicy.prefetches)
-                body.prefetch(chunk, i, distance);
-            body(chunk, i, Access());
-            if (i == last)
-                return;
-        }
-    }
+HWY_INLINE void walkWholeChunks(size_t begin, size_t tail, const Body &body,
+                                [[maybe_unused]] PrefetchDistance distance) {
     constexpr size_t kStep = kPolicy.unroll * kUnits;
-    // Computed ahead, so that it is hoisted out of the loop over the rows.
-    const size_t tail = end - (end - begin) % kUnits;
     size_t i = begin;
     for (; kPolicy.unroll == 1 ? i != tail : tail - i >= kStep; i += kStep) {
         if constexpr (kPolicy.prefetches)
@@ -145,6 +141,40 @@ HWY_INLINE void walkFrom(Chunk<kUnits> chunk, size_t begin, size_t end, const Bo
         walkTurns<Access, kUnits>(i, body, std::make_index_sequence<kPolicy.unroll>());
     }
     walkRestOfTurns<Access, kUnits, kPolicy.unroll, 0>(i, tail, body);
+}
+
+// Tail::kOverlapInLoop: the last chunk is moved back to end with the row.
+template <RowPolicy kPolicy, size_t kUnits, class Body>
+HWY_INLINE void walkOverlapInLoop(Chunk<kUnits> chunk, size_t begin, size_t end, const Body &body,
+                                  [[maybe_unused]] PrefetchDistance distance) {
+    static_assert(kPolicy.unroll == 1);
+    const size_t last = end - kUnits;
+    for (size_t i = begin;; i = std::min(i + kUnits, last)) {
+        if constexpr (kPolicy.prefetches)
+            body.prefetch(chunk, i, distance);
+        body(chunk, i, Unaligned());
+        if (i == last)
+            return;
+    }
+}
+
+// Whole chunks from begin on, and the tail.  The overlapping ones need end to be
+// kUnits or more.
+template <RowPolicy kPolicy, class Access, size_t kUnits, class Body>
+HWY_INLINE void walkFrom(Chunk<kUnits> chunk, size_t begin, size_t end, const Body &body,
+                         PrefetchDistance distance = {}) {
+    if constexpr (kPolicy.tail == Tail::kOverlapInLoop)
+        return walkOverlapInLoop<kPolicy>(chunk, begin, end, body, distance);
+
+    // Computed ahead, so that it is hoisted out of the loop over the rows.
+    const size_t tail = end - (end - begin) % kUnits;
+    if constexpr (kPolicy.hasForChunksFrom) {
+        body.forChunksFrom(begin, [&](const auto &chunksBody) HWY_ATTR {
+            walkWholeChunks<kPolicy, Access, kUnits>(begin, tail, chunksBody, distance);
+        });
+    } else {
+        walkWholeChunks<kPolicy, Access, kUnits>(begin, tail, body, distance);
+    }
 
     if constexpr (kPolicy.tail == Tail::kOverlap) {
         if (tail != end)
@@ -156,10 +186,13 @@ HWY_INLINE void walkFrom(Chunk<kUnits> chunk, size_t begin, size_t end, const Bo
         } else if constexpr (kUnits > 1) {
             walkHalves<kUnits / 2>(tail, end, body);
         }
+    } else if constexpr (kPolicy.tail == Tail::kPartial) {
+        if (tail != end)
+            body(chunk, tail, FirstUnits{end - tail});
     }
 }
 
-// A row of at least kUnits units at any address.
+// A row at any address.  Tail::kOverlap needs count to be kUnits or more.
 template <RowPolicy kPolicy = RowPolicy{}, size_t kUnits, class Body>
 HWY_INLINE void walkRow(Chunk<kUnits> chunk, size_t count, const Body &body,
                         PrefetchDistance distance = {}) {
@@ -184,12 +217,19 @@ HWY_INLINE size_t headOf(const uint8_t *dst) {
 template <class Access, RowPolicy kPolicy = RowPolicy{}, size_t kUnits, class Body>
 HWY_INLINE void walkAlignedRow(Chunk<kUnits> chunk, size_t count, const Body &body,
                                PrefetchDistance distance = {}) {
-    static_assert(kPolicy.tail == Tail::kOverlap, "the head is one, too");
+    static_assert(kPolicy.tail == Tail::kOverlap || kPolicy.tail == Tail::kPartial,
+                  "the head is one, too");
     const size_t head = headOf<Body>(body.dst);
     if (head == kNoLine || count < kLineBytes + kUnits)
         return walkRow<kPolicy>(chunk, count, body);
-    for (size_t i = 0; i < head; i += kUnits)
-        body(chunk, i, Unaligned());
+    if constexpr (kPolicy.tail == Tail::kPartial) {
+        static_assert(kUnits >= kLineBytes, "one chunk for the head");
+        if (head != 0)
+            body(chunk, 0, FirstUnits{head});
+    } else {
+        for (size_t i = 0; i < head; i += kUnits)
+            body(chunk, i, Unaligned());
+    }
     walkFrom<kPolicy, Access>(chunk, head, count, body, distance);
 }
 

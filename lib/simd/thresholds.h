@@ -39,6 +39,14 @@ inline constexpr ptrdiff_t kPrefetchConvertUncached = 3072;
 // no store waits for samples: half a page, which is 1024 pixels.
 inline constexpr ptrdiff_t kPrefetchInterleavedVideo = 2048;
 
+// The stencil, whose stores leave out lanes and wait for the lines that hold these,
+// on surfaces that are not in the caches.
+inline constexpr ptrdiff_t kPrefetchStencil = 2048;
+
+constexpr bool isPrefetchedStencil(ByteExtent dst) {
+    return dst.rowBytes > kPrefetchStencil && dst.rowBytes * dst.height >= kNonTemporalBytes;
+}
+
 // ---- Lengths of rows, in bytes ---------------------------------------------
 
 // The copy: rows up to here are held in registers, where the call of memmove would
@@ -48,6 +56,11 @@ inline constexpr size_t kCopyShortRow = 128;
 // Rows up to here are copied by a loop of our own, 1.2 to 1.5 times as fast as
 // memcpy, which has more means for longer ones.
 inline constexpr size_t kCopyMediumRow = 8192;
+
+// Bits to pixels: rows of up to so many vectors are stored as they come.  To align
+// them costs two chunks that are in part stored twice, more than the vectors that
+// lie across two cache lines.
+inline constexpr size_t kExpandUnalignedVectors = 16;
 
 // ---- Lengths of rows, in pixels --------------------------------------------
 
@@ -73,5 +86,9 @@ inline constexpr uint32_t kScaleLongRowBy8 = 128;
 // The scaler picks pixels from whole vectors of the source for steps, and averages
 // of spans, of up to so many pixels.
 inline constexpr uint32_t kScaleMostWindows = 4;
+
+// The stencil: shorter rows are taken pixel by pixel, which is faster than to mask
+// the bits of a chunk.
+inline constexpr size_t kStencilShortRow = 4;
 
 } // namespace quillon
