@@ -165,7 +165,8 @@ private:
                            dst + 4 * i, src);
     }
 
-    static constexpr uint32_t kMostWhole = kHasWideWindows && sizeof(T) == sizeof(uint16_t) ? 8 : 0;
+    static constexpr uint32_t kMostWhole =
+        sizeof(T) == sizeof(uint16_t) ? scaleMostBoxPixels(kVectorBytes) : 0;
 
     // False where the source row is too short for windows.
     template <uint32_t kWhole>

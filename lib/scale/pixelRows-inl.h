@@ -97,10 +97,6 @@ HWY_INLINE void fillPixels(uint8_t *dst, const uint8_t *src, size_t index, size_
 
 // ---- Windows --------------------------------------------------------------
 
-// Whether picking from several windows is faster than picking one by one.  With
-// four pixels in a vector it is not.
-inline constexpr bool kHasWideWindows = kVectorPixels > 4;
-
 // The positions of one vector's pixels.
 template <class D>
 HWY_INLINE hn::Vec<D> positionsFrom(D d, uint32_t first, uint32_t step) {

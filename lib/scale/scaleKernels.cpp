@@ -35,7 +35,9 @@ using NearestPickedFrom1 = NearestPicked<1, Access>;
 template <class Access>
 using NearestPickedFrom2 = NearestPicked<2, Access>;
 template <class Access>
-using NearestPickedFromMost = NearestPicked<kScaleMostWindows, Access>;
+using NearestPickedFrom3 = NearestPicked<3, Access>;
+template <class Access>
+using NearestPickedFrom4 = NearestPicked<4, Access>;
 template <class Access>
 using NearestEveryOf2 = NearestFirstOfEach<1, Access>;
 template <class Access>
@@ -47,6 +49,10 @@ using NearestEveryOf8 = NearestFirstOfEach<3, Access>;
 // copied.
 void scaleNearest(const ScaleJob &job, void *cache) {
     const uint32_t step = job.x.step;
+    const auto canPick = [&](uint32_t windows) HWY_ATTR {
+        return windows <= scaleMostNearestPixels(kVectorBytes) && step <= windows * kScaleOne &&
+               job.x.srcSize >= windows;
+    };
     if ((uint64_t{step} * (job.x.dstSize - 1) + job.x.start) >> 32 != 0)
         walkRows(job, NearestWrapping(job.x), cache);
     else if (step == kScaleOne)
@@ -60,13 +66,14 @@ void scaleNearest(const ScaleJob &job, void *cache) {
         walkNearestRows<NearestEveryOf2>(job);
     else if (step == 4 * kScaleOne)
         walkNearestRows<NearestEveryOf4>(job);
-    else if (step == 8 * kScaleOne && job.x.dstSize >= kScaleLongRowBy8)
+    else if (step == 8 * kScaleOne && job.x.dstSize >= scaleLongRowBy8(kVectorBytes))
         walkNearestRows<NearestEveryOf8>(job);
-    else if (kHasWideWindows && step <= 2 * kScaleOne && job.x.srcSize >= 2)
+    else if (canPick(2))
         walkNearestRows<NearestPickedFrom2>(job);
-    else if (kHasWideWindows && step <= kScaleMostWindows * kScaleOne &&
-             job.x.srcSize >= kScaleMostWindows)
-        walkNearestRows<NearestPickedFromMost>(job);
+    else if (canPick(3))
+        walkNearestRows<NearestPickedFrom3>(job);
+    else if (canPick(4))
+        walkNearestRows<NearestPickedFrom4>(job);
     else
         walkNearestRows<NearestGathered>(job);
 }
