@@ -5,7 +5,7 @@
 #include "simd/thresholds.h"
 
 #undef HWY_TARGET_INCLUDE
-#define HWY_TARGET_INCLUDE "/tmp/sk_p.cpp"
+#define HWY_TARGET_INCLUDE "bits/stencilKernels.cpp"
 #include "hwy/foreach_target.h"
 #include "hwy/highway.h"
 
@@ -102,9 +102,9 @@ struct StencilBody {
     }
 
     template <class C>
-    HWY_INLINE void prefetch(C /*chunk*/, size_t i, PrefetchDistance distance) const {
+    HWY_INLINE void prefetch(C /*chunk*/, size_t i, PrefetchDistance /*distance*/) const {
         if (i < prefetchEnd)
-            prefetchLines(dst + i * kBytes, C::kUnits * kBytes, distance.dst);
+            prefetchLines(dst + i * kBytes, C::kUnits * kBytes, kPrefetchStencil);
     }
 
     template <class Use>
@@ -120,7 +120,6 @@ template <size_t kBytes, bool kPrefetches>
 void stencilRowsBy(DstRows dst, SrcRows bits, Extent extent, uint32_t pixel) {
     constexpr RowPolicy kPolicy = {
         .tail = Tail::kPartial, .prefetches = kPrefetches, .hasForChunksFrom = true};
-    constexpr PrefetchDistance kAhead = {kPrefetchStencil, 0};
     constexpr Chunk<64> chunk;
     const size_t prefetchEnd = kPrefetches ? extent.width - kPrefetchStencil / kBytes : 0;
     const Stencil<kBytes> stencil(pixel);
@@ -128,9 +127,9 @@ void stencilRowsBy(DstRows dst, SrcRows bits, Extent extent, uint32_t pixel) {
         const BitReader reader = {bits.row(y), extent.width};
         const StencilBody<kBytes> body = {dst.row(y), reader, stencil, prefetchEnd};
         if constexpr (kIsMasked<kBytes>)
-            walkAlignedRow<Aligned, kPolicy>(chunk, extent.width, body, kAhead);
+            walkAlignedRow<Aligned, kPolicy>(chunk, extent.width, body);
         else
-            walkRow<kPolicy>(chunk, extent.width, body, kAhead);
+            walkRow<kPolicy>(chunk, extent.width, body);
     }
 }
 

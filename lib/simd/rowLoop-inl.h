@@ -192,7 +192,7 @@ HWY_INLINE void walkFrom(Chunk<kUnits> chunk, size_t begin, size_t end, const Bo
     }
 }
 
-// A row at any address.  Tail::kOverlap needs count to be kUnits or more.
+// A row at any address, of at least kUnits units where tails overlap.
 template <RowPolicy kPolicy = RowPolicy{}, size_t kUnits, class Body>
 HWY_INLINE void walkRow(Chunk<kUnits> chunk, size_t count, const Body &body,
                         PrefetchDistance distance = {}) {
@@ -220,10 +220,10 @@ HWY_INLINE void walkAlignedRow(Chunk<kUnits> chunk, size_t count, const Body &bo
     static_assert(kPolicy.tail == Tail::kOverlap || kPolicy.tail == Tail::kPartial,
                   "the head is one, too");
     const size_t head = headOf<Body>(body.dst);
-    if (head == kNoLine || count < kLineBytes + kUnits)
+    if (count < kLineBytes + kUnits || head == kNoLine)
         return walkRow<kPolicy>(chunk, count, body);
     if constexpr (kPolicy.tail == Tail::kPartial) {
-        static_assert(kUnits >= kLineBytes, "one chunk for the head");
+        static_assert(kUnits >= kLineBytes, "the head is one chunk");
         if (head != 0)
             body(chunk, 0, FirstUnits{head});
     } else {
