@@ -62,9 +62,9 @@ public:
     explicit PixelwiseStencil(uint32_t pixel) : pixel_(pixel) {}
 
     HWY_INLINE void store(uint64_t bits, uint8_t *dst) const {
-        // 0.65 to 0.95 of the time: fewer jumps, and no matter how the loop lies in
-        // the processor's cache of instructions.
-#pragma GCC unroll 4
+        // Two to a turn of the loop, which are 0.7 of the time where many bits are set:
+        // jumps backward come one a cycle at most, and at some addresses less.
+#pragma GCC unroll 2
         for (; bits != 0; bits &= bits - 1)
             storePixel<kBytes>(dst + firstSetPixel(bits) * kBytes, pixel_);
     }
