@@ -53,18 +53,20 @@ struct FormatTraits {
 
 inline constexpr int32_t kNoDepth = -1;
 
+// clang-format off
 inline constexpr FormatTraits kPixelFormats[] = {
-    //                     depth     bytes  masks                      source  dest.  alpha
-    {PixelFormat::kNone, kNoDepth, 0, {}, false, false, false},
-    {PixelFormat::kIndex, kNoDepth, 1, kMasksOfBytes, true, false, true},
-    {PixelFormat::kSmall3, 3, 1, smallMasks(3), false, true, false},
-    {PixelFormat::kSmall6, 6, 1, smallMasks(6), false, true, false},
-    {PixelFormat::kSmall8, 8, 1, smallMasks(8), false, true, false},
-    {PixelFormat::kRgb15, 15, 2, {0x7C00, 0x03E0, 0x001F}, true, true, false},
-    {PixelFormat::kRgb16, 16, 2, {0xF800, 0x07E0, 0x001F}, true, true, false},
-    {PixelFormat::kRgb24, 24, 3, kMasksOfBytes, true, true, false},
-    {PixelFormat::kRgb32, 32, 4, kMasksOfBytes, true, true, true},
+    //                     depth     bytes  masks                     source dest.  alpha
+    {PixelFormat::kNone,   kNoDepth, 0,     {},                       false, false, false},
+    {PixelFormat::kIndex,  kNoDepth, 1,     kMasksOfBytes,            true,  false, true},
+    {PixelFormat::kSmall3, 3,        1,     smallMasks(3),            false, true,  false},
+    {PixelFormat::kSmall6, 6,        1,     smallMasks(6),            false, true,  false},
+    {PixelFormat::kSmall8, 8,        1,     smallMasks(8),            false, true,  false},
+    {PixelFormat::kRgb15,  15,       2,     {0x7C00, 0x03E0, 0x001F}, true,  true,  false},
+    {PixelFormat::kRgb16,  16,       2,     {0xF800, 0x07E0, 0x001F}, true,  true,  false},
+    {PixelFormat::kRgb24,  24,       3,     kMasksOfBytes,            true,  true,  false},
+    {PixelFormat::kRgb32,  32,       4,     kMasksOfBytes,            true,  true,  true},
 };
+// clang-format on
 inline constexpr size_t kFormatCount = std::size(kPixelFormats);
 
 constexpr const FormatTraits &traitsOf(PixelFormat format) {
