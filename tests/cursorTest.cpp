@@ -1,12 +1,12 @@
 // Cursors: planes, boxes and drawing against models that go pixel by pixel,
 // scaling against its composition from a padded image and the scaler.
 
-#include <quillon/raster.h>
 #include "reference/pixels.h"
 #include "support/faults.h"
 #include "support/fence.h"
 #include "support/messages.h"
 #include "support/random.h"
+#include <quillon/raster.h>
 
 #include <algorithm>
 #include <cfloat>
@@ -59,8 +59,8 @@ TEST(CursorPlanes, areExpandedOrCopied) {
         const auto expand = [&](uint8_t *part) {
             Raster_BitsToPixels(bits.data(), static_cast<int32_t>(modelSize(width, 1, 1)), part,
                                 static_cast<int32_t>(modelSize(width, 1, depth)),
-                                static_cast<int32_t>(depth / 8), static_cast<int32_t>(width), height,
-                                0xFFFFFFFF, 0);
+                                static_cast<int32_t>(depth / 8), static_cast<int32_t>(width),
+                                height, 0xFFFFFFFF, 0);
         };
         expand(expected.data());
         Raster_ExpandCursorBitPlane(width, height, depth, bits.data(), dst.data(), size);
@@ -284,7 +284,8 @@ void expectScaled(Random &random, uint32_t type, uint32_t width, uint32_t height
         Bytes expected(size_t{4} * x.size * y.size, fill);
         Raster_Scale(expected.data(), static_cast<int32_t>(4 * x.size), x.size, y.size, 0, 0,
                      static_cast<int32_t>(x.size), static_cast<int32_t>(y.size), padded.data(),
-                     static_cast<int32_t>(4 * x.padded), x.padded, y.padded, scaleX, scaleY, filter);
+                     static_cast<int32_t>(4 * x.padded), x.padded, y.padded, scaleX, scaleY,
+                     filter);
         ASSERT_EQ(std::memcmp(scaledImage, expected.data(), expected.size()), 0);
     };
     if (type == RASTER_CURSOR_ALPHA)

@@ -1,10 +1,10 @@
 // Images of every format into BMP and PNG streams and files.
 
-#include <hearth/hearth.h>
-#include <quillon/imageUtil.h>
 #include "support/faults.h"
 #include "support/messages.h"
 #include "support/testImage.h"
+#include <hearth/hearth.h>
+#include <quillon/imageUtil.h>
 
 #include <algorithm>
 #include <cerrno>
@@ -116,14 +116,16 @@ TEST(ImageWrite, PngOfEveryFormat) {
                               : hasAlpha      ? PNG_COLOR_TYPE_RGB_ALPHA
                                               : PNG_COLOR_TYPE_RGB;
         ASSERT_GT(file.size(), 40u);
-        EXPECT_EQ(Bytes(&file[24], &file[29]), (Bytes{8, static_cast<uint8_t>(colorType), 0, 0, 0}));
+        EXPECT_EQ(Bytes(&file[24], &file[29]),
+                  (Bytes{8, static_cast<uint8_t>(colorType), 0, 0, 0}));
         info.bytesPerLine -= format.bpp == 16 ? info.bytesPerLine % 2 : 0; // counts as even
         ImageInfo read;
         ASSERT_TRUE(ImageUtil_ReadPNGBuffer(&read, file.data(), static_cast<uint32_t>(file.size()),
                                             IMAGEUTIL_READ_KEEP_ALPHA));
         ASSERT_TRUE(read.width == info.width && read.height == info.height);
         ASSERT_EQ(read.numColors, std::min(info.numColors, 256u));
-        expectColors(read, false, [&](uint32_t x, uint32_t y) { return pictureColorAt(info, x, y); });
+        expectColors(read, false,
+                     [&](uint32_t x, uint32_t y) { return pictureColorAt(info, x, y); });
         ImageUtil_FreeImageData(&read);
 
         // Bits 6 and 7 of the second byte of a zlib stream tell the effort made.

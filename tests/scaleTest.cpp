@@ -2,28 +2,14 @@
 // values that a caller can rely on.
 
 #include "reference/scale.h"
-#include <hearth/hearth.h>
+#include "support/faults.h"
+#include "support/surfaces.h"
 #include <quillon/raster.h>
-#include "support/fence.h"
-#include "support/random.h"
-#include "support/targets.h"
 
 #include <cfloat>
 #include <cmath>
-#include <cstdlib>
 #include <limits>
 #include <vector>
-
-namespace {
-
-bool memoryIsOut = false;
-
-} // namespace
-
-// In the place of libhearth's.
-void *UtilSafeMalloc0(size_t size) {
-    return memoryIsOut ? nullptr : std::malloc(size);
-}
 
 namespace quillon::test {
 namespace {
@@ -53,11 +39,11 @@ uint32_t run(const ScaleCase &c, uint8_t *dst, const uint8_t *src, decltype(Rast
     // Pixel (0, 0) may be an address outside of memory.
     const int64_t offset = int64_t{c.dst.increment} * c.top + int64_t{4} * c.left;
     auto *origin = reinterpret_cast<uint8_t *>(reinterpret_cast<uintptr_t>(dst + c.dst.first()) -
-                                             static_cast<uintptr_t>(offset));
+                                               static_cast<uintptr_t>(offset));
     return scale(origin, c.dst.increment, 32767, 32767, c.left, c.top,
-                 c.left + static_cast<int32_t>(c.dst.width), c.top + static_cast<int32_t>(c.dst.height),
-                 src + c.src.first(), c.src.increment, c.src.width, c.src.height, c.scaleX,
-                 c.scaleY, c.filter);
+                 c.left + static_cast<int32_t>(c.dst.width),
+                 c.top + static_cast<int32_t>(c.dst.height), src + c.src.first(), c.src.increment,
+                 c.src.width, c.src.height, c.scaleX, c.scaleY, c.filter);
 }
 
 // In fenced memory, either end of which is at the fence.
@@ -69,6 +55,8 @@ void expectAsStated(const ScaleCase &c, Random &random) {
     random.fill(dst.data(), dst.size());
     if (random.oneIn(4)) // all the same, and as bright as can be
         std::fill(src.data(), src.end(), uint8_t{255});
+    else if (random.oneIn(3))
+        plantRuns(random, src.data(), src.size() / 4, 4, {0, 0xFFFFFFFF, random.word()});
     std::vector<uint8_t> expected(dst.data(), dst.end());
     run(c, expected.data(), src.data(), reference::scale);
     EXPECT_EQ(run(c, dst.data(), src.data(), Raster_Scale), 1u);
@@ -196,25 +184,26 @@ TEST(Scale, refusals) {
 
 // Rows that are not mixed need none.
 TEST(Scale, withoutMemory) {
-    memoryIsOut = true;
     for (const double scaleY : {0.5, 1.0, 2.0})
         for (const uint32_t filter : {0u, 2u}) {
+            const MemoryFault fault(0, true);
             const bool isMixed = filter != 0 && scaleY != 1;
             uint8_t src[64] = {1}, dst[64] = {};
             EXPECT_EQ(Raster_Scale(dst, 16, 4, 4, 0, 0, 4, 4, src, 16, 4, 4, 2, scaleY, filter),
                       isMixed ? 0u : 1u);
             EXPECT_EQ(dst[0], isMixed ? 0 : 1);
         }
-    memoryIsOut = false;
 }
 
-std::vector<int32_t> mapped(Rect rect, uint32_t width, uint32_t height, double scaleX, double scaleY) {
+std::vector<int32_t> mapped(Rect rect, uint32_t width, uint32_t height, double scaleX,
+                            double scaleY) {
     Raster_ScaleSrcCoordinates(&rect, width, height, scaleX, scaleY);
     return {rect.left, rect.top, rect.right, rect.bottom};
 }
 
 // One axis in a processor's own 80 bits.
-std::pair<int32_t, int32_t> modelRange(int32_t first, int32_t end, uint32_t size, long double scale) {
+std::pair<int32_t, int32_t> modelRange(int32_t first, int32_t end, uint32_t size,
+                                       long double scale) {
     const long double margin = std::max(scale, 1.0L), low = first * scale - margin;
     const auto most = static_cast<uint32_t>(static_cast<int64_t>(size * scale));
     const double high = std::ceil(static_cast<double>(end * scale + margin));

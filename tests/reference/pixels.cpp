@@ -82,7 +82,7 @@ uint32_t blended(uint32_t src, uint32_t dst) {
 uint32_t converted(uint32_t pixel, int32_t srcDepth, int32_t dstDepth) {
     const Layout &src = layoutOf(srcDepth), &dst = layoutOf(dstDepth);
     const uint32_t color = moved(pixel, src.red, dst.red) | moved(pixel, src.green, dst.green) |
-                         moved(pixel, src.blue, dst.blue);
+                           moved(pixel, src.blue, dst.blue);
     return color | (src.alpha == 0 ? dst.alpha : pixel & dst.alpha);
 }
 

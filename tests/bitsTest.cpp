@@ -1,8 +1,8 @@
 // Bit and stencil expansion against their reference.
 
-#include <quillon/raster.h>
 #include "support/messages.h"
 #include "support/surfaces.h"
+#include <quillon/raster.h>
 
 #include <atomic>
 #include <thread>
@@ -22,12 +22,11 @@ Operation expansion(Random &random, bool isStencil) {
     const uint32_t member = random.below(4), pixel = random.word(), background = random.word();
     const auto bytes = static_cast<int32_t>(member + 1);
     const bool isNamed = random.oneIn(2);
-    const uint32_t low = random.oneOf({0u, 0u, 0u, 0xFFu}), count = low == 0 ? 256 : 1;
     return {(isStencil ? "stencil " : "opaque ") + std::to_string(bytes),
-            {{.bytes = member + 1}, {.bytes = 0, .low = low, .count = count}},
+            {{.bytes = member + 1}, {.bytes = 0, .runs = {0x00, 0xFF}}},
             [=](const Surfaces &at, Size size) {
                 const auto expand = [&](auto function, auto... rest) {
-                    function(at[1].first, at[1].signedLine(), at[0].first, at[0].signedLine(),
+                    function(at[1].first, at[1].signedStride(), at[0].first, at[0].signedStride(),
                              rest...);
                 };
                 const auto width = static_cast<int32_t>(size.width);
@@ -44,19 +43,25 @@ Operation expansion(Random &random, bool isStencil) {
                 const uint32_t clear = isStencil ? old[0] : background;
                 return old[1] != 0 ? pixel : clear;
             },
-            Walk::kForwards,
+            Walk::kForward,
             false};
 }
 
-TEST(BitsToPixels, matchesReference) {
-    warnings.clear();
-    holdToReference(16000, [](Random &random) { return expansion(random, random.oneIn(2)); });
-    EXPECT_TRUE(warnings.empty());
+Operation drawExpansion(Random &random) {
+    return expansion(random, random.oneIn(2));
+}
+
+TEST(Bits, matchesReference) {
+    holdToReference(16000, drawExpansion);
+}
+
+TEST(Bits, matchesReferenceOnLargeSurfaces) {
+    holdToReference(24, drawExpansion, Shape::kLarge);
 }
 
 // A page of which pixels under set bits are part, amid inaccessible ones where
 // all bits are clear.
-TEST(BitsToPixelsStencil, touchesNoPageWhereAllBitsAreClear) {
+TEST(Stencil, touchesNoPageWhereAllBitsAreClear) {
     const FencedBuffer page(pageSize());
     const auto end = static_cast<int32_t>(page.size());
     forEachTarget([&] {
@@ -68,6 +73,7 @@ TEST(BitsToPixelsStencil, touchesNoPageWhereAllBitsAreClear) {
             const int32_t start = random.oneOf({0, end}) - random.between(0, width * bytes);
             std::vector<uint8_t> bitmap(64);
             random.fill(bitmap.data(), bitmap.size());
+            plantRuns(random, bitmap.data(), bitmap.size(), 1, {0x00, 0xFF});
             random.fill(page.data(), page.size());
             std::vector<uint8_t> expected(page.data(), page.end());
             for (int32_t x = 0, at = start; x < width; ++x, at += bytes) {
@@ -90,7 +96,7 @@ TEST(BitsToPixelsStencil, touchesNoPageWhereAllBitsAreClear) {
 
 // Pixels under clear bits belong to others: what another thread writes there is
 // never lost to a pixel that is read and written back.
-TEST(BitsToPixelsStencil, leavesClearPixelsToAnotherThread) {
+TEST(Stencil, leavesClearPixelsToAnotherThread) {
     constexpr uint32_t kWidth = 64;
     constexpr int kRounds = 1000; // of the other thread
     const auto check = [&](size_t bytes, uint8_t pattern) {
@@ -124,7 +130,7 @@ TEST(BitsToPixelsStencil, leavesClearPixelsToAnotherThread) {
 }
 
 // Widths below 1 and unknown pixel sizes: nothing is looked at, or said.
-TEST(BitsToPixels, touchesNothingWhereThereIsNothingToDo) {
+TEST(Bits, touchesNothingWhereThereIsNothingToDo) {
     const FencedBuffer fence(1);
     uint8_t *nowhere = fence.end();
     warnings.clear();

@@ -153,7 +153,8 @@ struct Placement {
     explicit Placement(Random &random) {
         for (const int axis : {0, 1}) {
             size[axis] = random.oneOf({1, 1, 3, 1000, kMax / kCells});
-            origin[axis] = random.oneOf({0, -7, kMin, int32_t(kMax - int64_t{size[axis]} * kCells)});
+            origin[axis] =
+                random.oneOf({0, -7, kMin, int32_t(kMax - int64_t{size[axis]} * kCells)});
         }
     }
     Entry operator()(const Entry &e) const {

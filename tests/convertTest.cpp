@@ -1,9 +1,9 @@
 // Conversions between pixel layouts against their reference.
 
-#include <quillon/raster.h>
 #include "reference/pixels.h"
 #include "support/messages.h"
 #include "support/surfaces.h"
+#include <quillon/raster.h>
 
 #include <numeric>
 
@@ -29,8 +29,8 @@ void convert(const Pair &pair, uint32_t way, const Surfaces &at, Size size) {
     const auto &[src, dst, pseudo, palette] = pair;
     const Surface &to = at[0], &from = at[1];
     const auto call = [&](auto function, auto... depths) {
-        function(to.buffer, to.unsignedLine(), from.buffer, from.unsignedLine(), depths..., from.x,
-                 from.y, to.x, to.y, size.width, size.height);
+        function(to.buffer, to.unsignedStride(), from.buffer, from.unsignedStride(), depths...,
+                 from.x, from.y, to.x, to.y, size.width, size.height);
     };
     if (way == 1 && dst == 32)
         call(Raster_ConvertPixelsTo32, src, pseudo, palette);
@@ -39,13 +39,13 @@ void convert(const Pair &pair, uint32_t way, const Surfaces &at, Size size) {
     else if (way == 2 && src == dst && !pseudo)
         call(RasterCopyPixels, src);
     else if (way != 0 && src == 32 && !pseudo)
-        Raster_ConvertPixelsFrom32(to.buffer, to.unsignedLine(), dst, from.buffer,
-                                   from.unsignedLine(), from.x, from.y, to.x, to.y, size.width,
+        Raster_ConvertPixelsFrom32(to.buffer, to.unsignedStride(), dst, from.buffer,
+                                   from.unsignedStride(), from.x, from.y, to.x, to.y, size.width,
                                    size.height);
     else
-        Raster_ConvertPixels(to.buffer, to.unsignedLine(), dst, from.buffer, from.unsignedLine(),
-                             src, pseudo, palette, from.x, from.y, to.x, to.y, size.width,
-                             size.height);
+        Raster_ConvertPixels(to.buffer, to.unsignedStride(), dst, from.buffer,
+                             from.unsignedStride(), src, pseudo, palette, from.x, from.y, to.x,
+                             to.y, size.width, size.height);
 }
 
 uint32_t convertedByReference(const Pair &pair, uint32_t pixel) {
@@ -55,82 +55,69 @@ uint32_t convertedByReference(const Pair &pair, uint32_t pixel) {
     return src == dst ? pixel : reference::converted(pixel, src, dst);
 }
 
-TEST(ConvertPixels, matchesReference) {
-    const FencedBuffer colors(256 * sizeof(uint32_t));
-    const FencedBuffer highColors(256 * sizeof(uint32_t), FencedBuffer::Flush::kBefore);
+// Palettes of which there are no entries but those that pixels use, on one side.
+struct Palette {
+    const FencedBuffer behindFence{256 * sizeof(uint32_t), FencedBuffer::Flush::kBefore};
+    const FencedBuffer aheadOfFence{256 * sizeof(uint32_t)};
+
+    // And the bytes that pixels may have.
+    const uint32_t *draw(Random &random, Part &part) const {
+        const bool isLow = random.oneIn(2);
+        const FencedBuffer &colors = isLow ? aheadOfFence : behindFence;
+        random.fill(colors.data(), colors.size());
+        const uint32_t edge = random.below(256);
+        part.low = isLow ? 0 : edge;
+        part.count = isLow ? edge + 1 : 256 - edge;
+        const uint8_t *first = isLow ? colors.end() - 4 * size_t{part.count} : colors.data();
+        return reinterpret_cast<const uint32_t *>(first) - part.low;
+    }
+};
+
+Operation conversion(Random &random, Pair pair, const Palette &palette) {
+    Part src = {pair.pseudoColor ? 1 : bytesOf(pair.srcDepth)};
+    if (pair.pseudoColor)
+        pair.palette = palette.draw(random, src);
+    const bool isCopy = !pair.pseudoColor && pair.srcDepth == pair.dstDepth;
+    const bool isExact = isCopy || (pair.pseudoColor && pair.dstDepth == 32);
+    src.rule = isExact ? RowRule::kExact : RowRule::kRounded;
+    const uint32_t way = random.below(3);
+    return {std::to_string(pair.srcDepth) + " to " + std::to_string(pair.dstDepth),
+            {{bytesOf(pair.dstDepth), src.rule}, src},
+            [=](const Surfaces &at, Size size) { convert(pair, way, at, size); },
+            [=](const Pixels &old) { return convertedByReference(pair, old[1]); },
+            isCopy ? Walk::kRowByRow : Walk::kForward,
+            isCopy,
+            false};
+}
+
+TEST(Convert, matchesReference) {
+    const Palette palette;
     holdToReference(20000, [&](Random &random) {
         Pair pair = {kSources[random.below(4)], kLayouts[random.below(7)], random.oneIn(4),
                      nullptr};
-        if (!pair.pseudoColor && random.oneIn(8)) // any depth can be copied
-            pair.srcDepth = pair.dstDepth = random.oneOf({3, 8, 12, 15, 16, 20, 24, 32});
-        Part src = {pair.pseudoColor ? 1 : bytesOf(pair.srcDepth)};
-        if (pair.pseudoColor) {
+        if (pair.pseudoColor)
             pair.srcDepth = random.oneOf({8, 4, 0, -15, INT32_MIN}); // all mean one byte
-            // There are no entries but those that pixels use, on one side at least.
-            const uint32_t edge = random.below(256);
-            const bool isLow = random.oneIn(2);
-            src.low = isLow ? 0 : edge;
-            src.count = isLow ? edge + 1 : 256 - edge;
-            random.fill(colors.data(), colors.size());
-            random.fill(highColors.data(), highColors.size());
-            const uint8_t *first = isLow ? colors.end() - 4 * size_t{src.count} : highColors.data();
-            pair.palette = reinterpret_cast<const uint32_t *>(first) - src.low;
-        }
-        const bool isCopy = !pair.pseudoColor && pair.srcDepth == pair.dstDepth;
-        const bool isExact = isCopy || (pair.pseudoColor && pair.dstDepth == 32);
-        src.rule = isExact ? RowRule::kExact : RowRule::kRounded;
-        const uint32_t way = random.below(3);
-        return Operation{std::to_string(pair.srcDepth) + " to " + std::to_string(pair.dstDepth),
-                         {{bytesOf(pair.dstDepth), src.rule}, src},
-                         [=](const Surfaces &at, Size size) { convert(pair, way, at, size); },
-                         [=](const Pixels &old) { return convertedByReference(pair, old[1]); },
-                         isCopy ? Walk::kRowByRow : Walk::kForwards,
-                         isCopy,
-                         false};
+        else if (random.oneIn(8))                                    // any depth can be copied
+            pair.srcDepth = pair.dstDepth = random.oneOf({3, 8, 12, 15, 16, 20, 24, 32});
+        return conversion(random, pair, palette);
     });
 }
 
-// Beyond the caches there are other stores, which need aligned addresses: rows that
-// begin everywhere in a line, and pixels that never begin one.
-TEST(ConvertPixels, matchesReferenceOnLargeSurfaces) {
-    constexpr uint32_t kWidth = 1037, kLeast = 2 << 20;
-    Random random(baseSeed());
-    std::vector<uint32_t> palette(256);
-    random.fill(reinterpret_cast<uint8_t *>(palette.data()), 256 * sizeof(uint32_t));
-    for (const int32_t srcDepth : {8, 15, 16, 24, 32})
-        for (const int32_t dstDepth : {8, 16, 24, 32}) {
-            const Pair pair = {srcDepth, dstDepth, srcDepth == 8, palette.data()};
-            const uint32_t height = kLeast / (kWidth * bytesOf(dstDepth)) + 1;
-            const auto lineOf = [](int32_t depth) { return (kWidth + 3) * bytesOf(depth); };
-            const FencedBuffer src(size_t{height} * lineOf(srcDepth));
-            random.fill(src.data(), src.size());
-            const uint32_t odd = srcDepth == 24 ? 1 : 0;
-            const FencedBuffer dst(size_t{height} * lineOf(dstDepth) + odd);
-            std::vector<uint8_t> expected(dst.size(), 0x5A);
-            for (uint32_t y = 0; y < height; ++y)
-                for (uint32_t x = 0; x < kWidth; ++x) {
-                    uint32_t pixel = 0;
-                    std::memcpy(&pixel,
-                                src.data() + y * lineOf(srcDepth) + (x + 3) * bytesOf(srcDepth),
-                                bytesOf(srcDepth));
-                    const uint32_t wanted = convertedByReference(pair, pixel);
-                    std::memcpy(&expected[y * lineOf(dstDepth) + x * bytesOf(dstDepth)], &wanted,
-                                bytesOf(dstDepth));
-                }
-            forEachTarget([&] {
-                std::fill(dst.data(), dst.end(), uint8_t{0x5A});
-                convert(pair, 0,
-                        {{dst.data(), nullptr, lineOf(dstDepth), 0, 0},
-                         {src.data(), nullptr, lineOf(srcDepth), 3, 0}},
-                        {kWidth, height});
-                EXPECT_TRUE(std::equal(dst.data(), dst.end(), expected.begin(), expected.end()))
-                    << srcDepth << " to " << dstDepth;
-            });
-        }
+TEST(Convert, matchesReferenceOnLargeSurfaces) {
+    const Palette palette;
+    holdToReference(
+        5 * 7,
+        [&](Random &random) {
+            const auto number = static_cast<uint32_t>(running.number);
+            const int32_t srcDepth = number < 28 ? kSources[number / 7] : 8;
+            return conversion(random, {srcDepth, kLayouts[number % 7], srcDepth == 8, nullptr},
+                              palette);
+        },
+        Shape::kLarge);
 }
 
 // All there is in 16 bits, as a rectangle and one by one.
-TEST(ConvertPixels, every16BitPixel) {
+TEST(Convert, every16BitPixel) {
     constexpr uint32_t kSide = 256;
     std::vector<uint16_t> pixels(kSide * kSide);
     std::iota(pixels.begin(), pixels.end(), uint16_t{0});
@@ -169,7 +156,7 @@ TEST(ConvertOnePixel, matchesReference) {
     // And it is unsigned.
     const uint32_t entry = 0x12345678, index = 0xC0000001;
     const auto *far = reinterpret_cast<const uint32_t *>(reinterpret_cast<uintptr_t>(&entry) -
-                                                       uint64_t{index} * sizeof(uint32_t));
+                                                         uint64_t{index} * sizeof(uint32_t));
     EXPECT_EQ(Raster_ConvertOnePixel(index, 8, 32, true, far), entry);
 }
 
@@ -199,7 +186,8 @@ TEST(MakeRGBParam, placesEveryComponent) {
                 ASSERT_LT(param.shift, 32u);
                 ASSERT_TRUE(param.shift == 0 || param.multiplier % 2 == 1) << "not least";
                 const uint32_t most = (1u << bits) - 1;
-                for (const uint32_t component : {1u, most, 1u << (bits - 1), random.word() & most}) {
+                for (const uint32_t component :
+                     {1u, most, 1u << (bits - 1), random.word() & most}) {
                     uint32_t expected = 0;
                     for (uint32_t i = 0; i < width; ++i)
                         expected |= (component >> (bits - 1 - i % bits) & 1)
@@ -212,7 +200,7 @@ TEST(MakeRGBParam, placesEveryComponent) {
 
 // What a failing call says, of one pixel and of a rectangle: the source is looked
 // at first, both are ahead of any store.  Equal depths of any kind are a copy.
-TEST(Conversions, refuseUnknownDepths) {
+TEST(Convert, refusesUnknownDepths) {
     const FencedBuffer fence(1);
     const Surface nowhere = {fence.end(), fence.end(), 4, 0, 0};
     const uint32_t palette[] = {0};
@@ -220,7 +208,7 @@ TEST(Conversions, refuseUnknownDepths) {
         if (text.empty())
             return call();
         expectPanic("NOT_IMPLEMENTED lib/raster/rasterConv", call);
-        EXPECT_EQ(warnings, std::vector<std::string>{"Raster convert " + text + '\n'});
+        EXPECT_EQ(warnings, Messages{"Raster convert " + text + '\n'});
     };
     const struct {
         int32_t src, dst;
