@@ -21,7 +21,7 @@ uint32_t bytesOf(int32_t depth) {
 struct Pair {
     int32_t srcDepth, dstDepth;
     bool pseudoColor;
-    const uint32_t *palette;
+    const uint32_t *palette = nullptr;
 };
 
 // By one of the functions that do the pair.
@@ -93,8 +93,7 @@ Operation conversion(Random &random, Pair pair, const Palette &palette) {
 TEST(Convert, matchesReference) {
     const Palette palette;
     holdToReference(20000, [&](Random &random) {
-        Pair pair = {kSources[random.below(4)], kLayouts[random.below(7)], random.oneIn(4),
-                     nullptr};
+        Pair pair = {random.oneOf(kSources), random.oneOf(kLayouts), random.oneIn(4)};
         if (pair.pseudoColor)
             pair.srcDepth = random.oneOf({8, 4, 0, -15, INT32_MIN}); // all mean one byte
         else if (random.oneIn(8))                                    // any depth can be copied
@@ -110,8 +109,7 @@ TEST(Convert, matchesReferenceOnLargeSurfaces) {
         [&](Random &random) {
             const auto number = static_cast<uint32_t>(running.number);
             const int32_t srcDepth = number < 28 ? kSources[number / 7] : 8;
-            return conversion(random, {srcDepth, kLayouts[number % 7], srcDepth == 8, nullptr},
-                              palette);
+            return conversion(random, {srcDepth, kLayouts[number % 7], srcDepth == 8}, palette);
         },
         Shape::kLarge);
 }
@@ -123,7 +121,7 @@ TEST(Convert, every16BitPixel) {
     std::iota(pixels.begin(), pixels.end(), uint16_t{0});
     for (const int32_t srcDepth : {15, 16})
         for (const int32_t dstDepth : kLayouts) {
-            const Pair pair = {srcDepth, dstDepth, false, nullptr};
+            const Pair pair = {srcDepth, dstDepth, false};
             const uint32_t bytes = bytesOf(dstDepth), line = kSide * bytes;
             std::vector<uint8_t> expected(size_t{kSide} * line), dst(expected.size());
             for (uint32_t pixel = 0; pixel <= 0xFFFF; ++pixel) {
@@ -146,7 +144,7 @@ TEST(ConvertOnePixel, matchesReference) {
     uint32_t palette[300]; // an index is not cut to a byte
     forEachCase(20000, [&](Random &random) {
         const uint32_t pixel = random.word(), index = random.below(300);
-        const int32_t dst = kLayouts[random.below(7)], src = kSources[random.below(4)];
+        const int32_t dst = random.oneOf(kLayouts), src = random.oneOf(kSources);
         palette[index] = pixel;
         EXPECT_EQ(Raster_ConvertOnePixel(pixel, src, dst, false, nullptr),
                   reference::convertedAlone(pixel, src, dst));
@@ -179,20 +177,17 @@ TEST(MakeRGBParam, placesEveryComponent) {
                 const auto run = static_cast<uint32_t>(((uint64_t{1} << width) - 1) << low);
                 // Further bits, not next to the run, are no part of the channel.
                 const uint32_t above = ~static_cast<uint32_t>((uint64_t{2} << (low + width)) - 1);
-                const uint32_t mask = run | (random.word() & above);
                 RasterRGBParam param = {};
+                const uint32_t mask = run | (random.word() & above), most = (1u << bits) - 1;
                 RasterRGB_MakeRGBParam(&param, static_cast<int32_t>(bits), mask);
-                ASSERT_EQ(param.mask, mask);
-                ASSERT_LT(param.shift, 32u);
+                ASSERT_TRUE(param.mask == mask && param.shift < 32);
                 ASSERT_TRUE(param.shift == 0 || param.multiplier % 2 == 1) << "not least";
-                const uint32_t most = (1u << bits) - 1;
-                for (const uint32_t component :
-                     {1u, most, 1u << (bits - 1), random.word() & most}) {
+                for (const uint32_t component : {1u, most, most / 2 + 1, random.word() & most}) {
                     uint32_t expected = 0;
                     for (uint32_t i = 0; i < width; ++i)
-                        expected |= (component >> (bits - 1 - i % bits) & 1)
-                                    << (low + width - 1 - i);
-                    ASSERT_EQ(((component * param.multiplier) >> param.shift) & run, expected)
+                        expected = expected << 1 | (component >> (bits - 1 - i % bits) & 1);
+                    ASSERT_EQ(((component * param.multiplier) >> param.shift) & run,
+                              expected << low)
                         << bits << " bits, mask " << mask << ", component " << component;
                 }
             }
@@ -210,30 +205,27 @@ TEST(Convert, refusesUnknownDepths) {
         expectPanic("NOT_IMPLEMENTED lib/raster/rasterConv", call);
         EXPECT_EQ(warnings, Messages{"Raster convert " + text + '\n'});
     };
-    const struct {
-        int32_t src, dst;
-        bool isPseudo;
-        std::string alone, rectangle;
-    } cases[] = {
-        {15, 7, false, "one pixel invalid depth 7", "pixels invalid depth 7"},
-        {24, 33, false, "one pixel invalid depth 33", "pixels invalid depth 33"},
-        {32, -8, false, "one pixel invalid depth -8", "pixels invalid depth -8"},
-        {8, 7, true, "one pixel invalid depth 7", "pixels invalid depth 7"},
-        {8, 7, false, "one pixel invalid source depth 8", "pixels invalid source depth 8"},
-        {17, 32, false, "one pixel invalid source depth 17", "pixels invalid source depth 17"},
-        {9, 32, true, "pixels invalid depth for pseudo color 9",
-         "pixels invalid depth for pseudo color 9"},
-        {INT32_MIN, 1, true, "pixels invalid depth for pseudo color -2147483648",
-         "pixels invalid depth 1"},
-        {-16, -16, false, "one pixel invalid source depth -16", ""},
-    };
-    for (const auto &c : cases) {
-        refuses(c.alone, [&] { Raster_ConvertOnePixel(0, c.src, c.dst, c.isPseudo, palette); });
+    const std::string one = "one pixel ", many = "pixels ", depth = "invalid depth ",
+                      source = "invalid source depth ", pseudo = "invalid depth for pseudo color ";
+    const std::tuple<Pair, std::string, std::string> cases[] = {
+        {{15, 7, false}, one + depth + "7", many + depth + "7"},
+        {{24, 33, false}, one + depth + "33", many + depth + "33"},
+        {{32, -8, false}, one + depth + "-8", many + depth + "-8"},
+        {{8, 7, true}, one + depth + "7", many + depth + "7"},
+        {{8, 7, false}, one + source + "8", many + source + "8"},
+        {{17, 32, false}, one + source + "17", many + source + "17"},
+        {{9, 32, true}, many + pseudo + "9", many + pseudo + "9"},
+        {{INT32_MIN, 1, true}, many + pseudo + "-2147483648", many + depth + "1"},
+        {{-16, -16, false}, one + source + "-16", ""}};
+    for (auto [pair, ofOne, ofMany] : cases) {
+        pair.palette = palette;
+        refuses(ofOne, [&, &c = pair] {
+            Raster_ConvertOnePixel(0, c.srcDepth, c.dstDepth, c.pseudoColor, palette);
+        });
         for (const uint32_t way : {0u, 1u})
             for (const uint32_t side : {0u, 1u})
-                refuses(c.rectangle, [&] {
-                    convert({c.src, c.dst, c.isPseudo, palette}, way, {nowhere, nowhere},
-                            {side, side});
+                refuses(ofMany, [&, &c = pair] {
+                    convert(c, way, {nowhere, nowhere}, {side, side});
                 });
     }
 }

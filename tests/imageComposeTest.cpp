@@ -55,7 +55,7 @@ struct Collage {
 
 TEST(Combine, LikeAPainter) {
     forEachCase(600, [](Random &random) {
-        const Format format = kFormats[random.below(std::size(kFormats))];
+        const Format format = random.oneOf(kFormats);
         Collage collage;
         int32_t left = kMax, top = kMax, right = kMin, bottom = kMin, nextX = -7;
         uint32_t area = 0;
@@ -113,7 +113,7 @@ TEST(Combine, NeverReadsOrWritesOutside) {
         };
         Collage collage;
         for (uint32_t i = 0, count = 1 + random.below(3); i < count; ++i) {
-            const Format format = kFormats[random.below(std::size(kFormats))];
+            const Format format = random.oneOf(kFormats);
             collage.add(random, format, 6, 5, {coordinate(), coordinate()});
             // Widths beyond the rows, and formats that differ: rows bound both.
             collage.images[i].width = size();
