@@ -1,19 +1,18 @@
-// Cursors: planes, boxes and drawing against models that go pixel by pixel,
+// Cursors: planes against the expansion of bits, boxes and drawing pixel by pixel,
 // scaling against its composition from a padded image and the scaler.
 
-#include <quillon/raster.h>
 #include "reference/pixels.h"
 #include "support/faults.h"
 #include "support/fence.h"
 #include "support/messages.h"
 #include "support/random.h"
+#include <quillon/raster.h>
 
 #include <algorithm>
 #include <cfloat>
 #include <cmath>
 #include <cstdlib>
 #include <cstring>
-#include <limits>
 #include <memory>
 #include <vector>
 
@@ -21,7 +20,7 @@ namespace quillon::test {
 namespace {
 
 constexpr uint32_t kNoSize = 0xFFFFFFFF;
-constexpr size_t kAlphaRecordSize = 32;
+constexpr uint32_t kTypes[] = {RASTER_CURSOR_ALPHA, RASTER_CURSOR_ANDXOR};
 
 using Bytes = std::vector<uint8_t>;
 
@@ -55,29 +54,26 @@ TEST(CursorPlanes, areExpandedOrCopied) {
         const FencedBuffer bits(modelSize(width, height, 1)), plane(size), dst(size_t{size} * 2);
         for (const FencedBuffer *buffer : {&bits, &plane, &dst})
             random.fill(buffer->data(), buffer->size());
+        const bool areBits[] = {random.oneIn(2), random.oneIn(2)};
+        const uint8_t *const data[] = {(areBits[0] ? bits : plane).data(),
+                                       (areBits[1] ? bits : plane).data()};
+
         Bytes expected = bytesOf(dst);
         const auto expand = [&](uint8_t *part) {
             Raster_BitsToPixels(bits.data(), static_cast<int32_t>(modelSize(width, 1, 1)), part,
                                 static_cast<int32_t>(modelSize(width, 1, depth)),
-                                static_cast<int32_t>(depth / 8), static_cast<int32_t>(width), height,
-                                0xFFFFFFFF, 0);
+                                static_cast<int32_t>(depth / 8), static_cast<int32_t>(width),
+                                height, 0xFFFFFFFF, 0);
         };
         expand(expected.data());
         Raster_ExpandCursorBitPlane(width, height, depth, bits.data(), dst.data(), size);
         ASSERT_EQ(bytesOf(dst), expected);
-
-        const bool areBits[] = {random.oneIn(2), random.oneIn(2)};
         for (const size_t i : {0u, 1u}) {
             uint8_t *const part = expected.data() + i * size;
-            if (areBits[i] && depth != 1)
-                expand(part);
-            else
-                std::copy_n((areBits[i] ? bits : plane).data(), size, part);
+            areBits[i] && depth != 1 ? expand(part) : (void)std::copy_n(data[i], size, part);
         }
-        Raster_ExpandPlanarCursorData(width, height, areBits[0] ? 1 : depth,
-                                      (areBits[0] ? bits : plane).data(), areBits[1] ? 1 : depth,
-                                      (areBits[1] ? bits : plane).data(), depth, dst.data(),
-                                      2 * size);
+        Raster_ExpandPlanarCursorData(width, height, areBits[0] ? 1 : depth, data[0],
+                                      areBits[1] ? 1 : depth, data[1], depth, dst.data(), 2 * size);
         ASSERT_EQ(bytesOf(dst), expected);
     });
 }
@@ -115,44 +111,44 @@ TEST(CursorPlanes, whatNoSizeTellsIsNotWritten) {
 
 // --- Boxes and drawing
 
-// A cursor with random images, the record and both images fenced.
+// A cursor with random images, each fenced, as are the 32 bytes of the record that
+// an alpha cursor has.
 struct TestCursor {
     TestCursor(Random &random, uint32_t type, uint32_t width, uint32_t height)
-        : memory(type == RASTER_CURSOR_ALPHA ? kAlphaRecordSize : sizeof(RasterCursor)),
-          first(size_t{4} * width * height), second(first.size()),
+        : memory(type == RASTER_CURSOR_ALPHA ? 32 : sizeof(RasterCursor)),
+          images{FencedBuffer(size_t{4} * width * height),
+                 FencedBuffer(size_t{4} * width * height)},
           record(*reinterpret_cast<RasterCursor *>(memory.data())) {
-        for (const FencedBuffer *part : {&memory, &first, &second})
+        for (const FencedBuffer *part : {&memory, &images[0], &images[1]})
             random.fill(part->data(), part->size());
         record.type = type;
         record.hotspotX = random.below(width + 1);
         record.hotspotY = random.below(height + 1);
         record.width = width;
         record.height = height;
-        if (type == RASTER_CURSOR_ALPHA) {
-            record.alphaImage = first.data();
-        } else {
-            record.andImage = first.data();
-            record.xorImage = second.data();
-        }
+        (type == RASTER_CURSOR_ALPHA ? record.alphaImage : record.andImage) = images[0].data();
+        if (type == RASTER_CURSOR_ANDXOR)
+            record.xorImage = images[1].data();
     }
 
-    FencedBuffer memory, first, second;
+    FencedBuffer memory, images[2];
     RasterCursor &record;
 };
 
-// One axis, at 64 bits.
-struct ModelRange {
-    ModelRange(int32_t position, uint32_t hotspot, uint32_t size, uint32_t screen)
-        : start(static_cast<int32_t>(static_cast<uint32_t>(position) - hotspot)),
-          first(std::max<int64_t>(start, 0)), end(start + int64_t{size}),
-          isVisible(first < std::min<int64_t>(end, screen) && end - first <= INT32_MAX),
-          dst(static_cast<uint32_t>(first)),
-          visible(static_cast<uint32_t>(std::min<int64_t>(end, screen) - first)),
-          src(static_cast<uint32_t>(first - start)) {}
-    int64_t start, first, end;
-    bool isVisible;
-    uint32_t dst, visible, src;
+// The part of an axis that is on the screen, and where it is in the cursor.
+struct Span {
+    uint32_t dst, size, src;
 };
+
+Span modelSpan(int32_t position, uint32_t hotspot, uint32_t size, uint32_t screen) {
+    const int64_t start = static_cast<int32_t>(static_cast<uint32_t>(position) - hotspot);
+    const int64_t first = std::max<int64_t>(start, 0), end = start + size;
+    if (first >= std::min<int64_t>(end, screen) || end - first > INT32_MAX)
+        return {};
+    return {static_cast<uint32_t>(first),
+            static_cast<uint32_t>(std::min<int64_t>(end, screen) - first),
+            static_cast<uint32_t>(first - start)};
+}
 
 TEST(CursorDrawing, boxesEqualTheirModel) {
     forEachCase(300000, [](Random &random) {
@@ -165,20 +161,15 @@ TEST(CursorDrawing, boxesEqualTheirModel) {
         cursor.width = draw(), cursor.height = draw();
         const RasterCursorScreen screen = {draw(), draw()};
         const auto x = static_cast<int32_t>(draw()), y = static_cast<int32_t>(draw());
-        const ModelRange columns(x, cursor.hotspotX, cursor.width, screen.width);
-        const ModelRange rows(y, cursor.hotspotY, cursor.height, screen.height);
-        const bool isVisible = columns.isVisible && rows.isVisible;
+        const Span columns = modelSpan(x, cursor.hotspotX, cursor.width, screen.width);
+        const Span rows = modelSpan(y, cursor.hotspotY, cursor.height, screen.height);
+        const bool isVisible = columns.size != 0 && rows.size != 0;
         RasterCursorBox box{}, expected{}; // untouched
         if (isVisible)
-            expected = {columns.dst,  rows.dst,    columns.visible,
-                        rows.visible, columns.src, rows.src};
+            expected = {columns.dst, rows.dst, columns.size, rows.size, columns.src, rows.src};
         ASSERT_EQ(Raster_ComputeCursorBox(&screen, &cursor, x, y, &box), isVisible ? 1u : 0u);
         ASSERT_EQ(std::memcmp(&box, &expected, sizeof box), 0);
     });
-}
-
-uint32_t &pixelAt(const FencedBuffer &image, uint32_t width, uint32_t x, uint32_t y) {
-    return reinterpret_cast<uint32_t *>(image.data())[size_t{y} * width + x];
 }
 
 TEST(CursorDrawing, equalsItsModelAtEveryEdge) {
@@ -194,36 +185,39 @@ TEST(CursorDrawing, equalsItsModelAtEveryEdge) {
         if (isAlpha)
             cursor.type = random.oneOf({cursor.type, 2u, 0x80000000u}); // alpha, too
 
-        const FencedBuffer frame(size_t{4} * screen.width * screen.height), drawn(frame.size());
-        const FencedBuffer composed(size_t{4} * box.width * box.height), compose(composed.size());
+        const FencedBuffer frame(size_t{4} * screen.width * screen.height);
+        const FencedBuffer compose(size_t{4} * box.width * box.height);
         random.fill(frame.data(), frame.size());
-        std::copy_n(frame.data(), frame.size(), drawn.data());
-        for (uint32_t row = 0; row < box.height; ++row)
-            for (uint32_t column = 0; column < box.width; ++column) {
-                const uint32_t fromX = box.srcX + column, fromY = box.srcY + row;
-                uint32_t &pixel = pixelAt(drawn, screen.width, box.dstX + column, box.dstY + row);
-                const uint32_t over = pixelAt(source.first, cursor.width, fromX, fromY);
-                pixel = isAlpha
-                            ? reference::blended(over, pixel)
-                            : (pixel & over) ^ pixelAt(source.second, cursor.width, fromX, fromY);
-                pixelAt(composed, box.width, column, row) = pixel;
-            }
-
         const Bytes before = bytesOf(frame);
-        const int32_t line = 4 * static_cast<int32_t>(screen.width);
-        Raster_DrawCursor(frame.data(), line, compose.data(), 4 * static_cast<int32_t>(box.width),
+        Bytes drawn = before, composed(compose.size());
+        const auto pixel =
+            [](uint8_t * image, uint32_t width, uint32_t column, uint32_t row) -> auto & {
+            return reinterpret_cast<uint32_t *>(image)[size_t{row} * width + column];
+        };
+        for (uint32_t i = 0; i < box.width * box.height; ++i) {
+            const uint32_t column = i % box.width, row = i / box.width;
+            const auto from = [&](const FencedBuffer &image) {
+                return pixel(image.data(), cursor.width, box.srcX + column, box.srcY + row);
+            };
+            uint32_t &to = pixel(drawn.data(), screen.width, box.dstX + column, box.dstY + row);
+            const uint32_t over = from(source.images[0]);
+            to = isAlpha ? reference::blended(over, to) : (to & over) ^ from(source.images[1]);
+            pixel(composed.data(), box.width, column, row) = to;
+        }
+        const int32_t stride = 4 * static_cast<int32_t>(screen.width);
+        Raster_DrawCursor(frame.data(), stride, compose.data(), 4 * static_cast<int32_t>(box.width),
                           &cursor, &box);
         ASSERT_EQ(bytesOf(frame), before);
-        ASSERT_EQ(bytesOf(compose), bytesOf(composed));
-        Raster_DrawCursor(frame.data(), line, nullptr, random.between(-9, 9), &cursor, &box);
-        ASSERT_EQ(bytesOf(frame), bytesOf(drawn));
+        ASSERT_EQ(bytesOf(compose), composed);
+        Raster_DrawCursor(frame.data(), stride, nullptr, random.between(-9, 9), &cursor, &box);
+        ASSERT_EQ(bytesOf(frame), drawn);
     });
 }
 
 // Row 1 of such an image is further than a line increment reaches.
 TEST(CursorDrawing, imagesTooWideAreNotDrawn) {
     const RasterCursorBox box = {0, 0, 1, 2, 0, 0};
-    for (const uint32_t type : {0u, 1u})
+    for (const uint32_t type : kTypes)
         for (const uint32_t width : {0x20000000u, 0x40000001u, 0xFFFFFFFFu}) {
             RasterCursor cursor{};
             cursor.type = type;
@@ -284,15 +278,15 @@ void expectScaled(Random &random, uint32_t type, uint32_t width, uint32_t height
         Bytes expected(size_t{4} * x.size * y.size, fill);
         Raster_Scale(expected.data(), static_cast<int32_t>(4 * x.size), x.size, y.size, 0, 0,
                      static_cast<int32_t>(x.size), static_cast<int32_t>(y.size), padded.data(),
-                     static_cast<int32_t>(4 * x.padded), x.padded, y.padded, scaleX, scaleY, filter);
+                     static_cast<int32_t>(4 * x.padded), x.padded, y.padded, scaleX, scaleY,
+                     filter);
         ASSERT_EQ(std::memcmp(scaledImage, expected.data(), expected.size()), 0);
     };
     if (type == RASTER_CURSOR_ALPHA)
-        return expectImage(source.first, 0, 2, result->alphaImage);
-    EXPECT_EQ(result->planeInfo0, from.planeInfo0);
-    EXPECT_EQ(result->planeInfo1, from.planeInfo1);
-    expectImage(source.first, 0xFF, 0, result->andImage);
-    expectImage(source.second, 0, 0, result->xorImage);
+        return expectImage(source.images[0], 0, 2, result->alphaImage);
+    EXPECT_TRUE(result->planeInfo0 == from.planeInfo0 && result->planeInfo1 == from.planeInfo1);
+    expectImage(source.images[0], 0xFF, 0, result->andImage);
+    expectImage(source.images[1], 0, 0, result->xorImage);
 }
 
 TEST(CursorScaling, isAPaddedImageScaled) {
@@ -308,7 +302,7 @@ TEST(CursorScaling, isAPaddedImageScaled) {
     });
     // Around the scaler's largest size and factors.
     Random random(1);
-    for (const uint32_t type : {0u, 1u}) {
+    for (const uint32_t type : kTypes) {
         for (const uint32_t size : {32763u, 32764u}) {
             expectScaled(random, type, size, 1, 1, 1);
             expectScaled(random, type, 1, size, 1, 1);
@@ -318,28 +312,25 @@ TEST(CursorScaling, isAPaddedImageScaled) {
     }
 }
 
-TEST(CursorScaling, withoutASizeThereIsNoCursor) {
+// Where there is no size, no memory is asked for; where there is, any of it may
+// fail.
+TEST(CursorScaling, withoutASizeOrMemoryThereIsNoCursor) {
     const std::pair<uint32_t, double> cases[] = {
         {8, 0},     {8, -1},      {8, HUGE_VAL}, {8, DBL_MAX},   {8, std::nan("")},
         {8, 1e10},  {8, 1e-10},   {8, DBL_MIN},  {8, 65536},     {8, 2e9},
         {8, -1e-9}, {kNoSize, 1}, {kNoSize, .5}, {0x20000000, 1}};
     Random random(1);
-    for (const uint32_t type : {0u, 1u})
-        for (const auto &[size, scale] : cases)
-            for (const bool isColumns : {true, false}) {
-                const TestCursor source(random, type, 8, 8);
-                (isColumns ? source.record.width : source.record.height) = size;
-                const MemoryFault fault(0);
-                EXPECT_EQ(scaled(source, isColumns ? scale : 1, isColumns ? 1 : scale), nullptr);
-                EXPECT_FALSE(fault.happened); // none was made
-            }
-}
-
-TEST(CursorScaling, withoutMemory) {
-    Random random(1);
-    for (const uint32_t type : {0u, 1u}) {
+    for (const uint32_t type : kTypes) {
         const TestCursor source(random, type, 8, 8);
         forEachMemoryFault([&] { return scaled(source, 0.75, 2) != nullptr; });
+        for (const auto &[size, scale] : cases)
+            for (const bool isWide : {true, false}) {
+                source.record.width = isWide ? size : 8;
+                source.record.height = isWide ? 8 : size;
+                const MemoryFault fault(0);
+                EXPECT_EQ(scaled(source, isWide ? scale : 1, isWide ? 1 : scale), nullptr);
+                EXPECT_FALSE(fault.happened);
+            }
     }
 }
 

@@ -1,10 +1,10 @@
 // Images made out of others, against a plain painter.
 
-#include <quillon/imageUtil.h>
-#include <quillon/raster.h>
 #include "support/faults.h"
 #include "support/messages.h"
 #include "support/testImage.h"
+#include <quillon/imageUtil.h>
+#include <quillon/raster.h>
 
 #include <algorithm>
 #include <cfloat>
@@ -55,13 +55,14 @@ struct Collage {
 
 TEST(Combine, LikeAPainter) {
     forEachCase(600, [](Random &random) {
-        const Format format = kFormats[random.below(std::size(kFormats))];
+        const Format format = random.oneOf(kFormats);
         Collage collage;
         int32_t left = kMax, top = kMax, right = kMin, bottom = kMin, nextX = -7;
         uint32_t area = 0;
         const bool isTight = random.oneIn(3); // side by side, which leaves no gap
         for (uint32_t i = 0, count = 1 + random.below(4); i < count; ++i) {
-            const uint32_t width = 1 + random.below(12), height = isTight ? 6 : 1 + random.below(12);
+            const uint32_t width = 1 + random.below(12),
+                           height = isTight ? 6 : 1 + random.below(12);
             const RectPoint at = {isTight ? nextX : random.between(-15, 15),
                                   isTight ? 3 : random.between(-15, 15)};
             collage.add(random, format, width, height, at);
@@ -112,7 +113,7 @@ TEST(Combine, NeverReadsOrWritesOutside) {
         };
         Collage collage;
         for (uint32_t i = 0, count = 1 + random.below(3); i < count; ++i) {
-            const Format format = kFormats[random.below(std::size(kFormats))];
+            const Format format = random.oneOf(kFormats);
             collage.add(random, format, 6, 5, {coordinate(), coordinate()});
             // Widths beyond the rows, and formats that differ: rows bound both.
             collage.images[i].width = size();
@@ -197,13 +198,14 @@ TEST(CropAndScale, CutsAndScales) {
             request.right = -1;
         // One side follows the other by proportion.
         const int32_t width = request.width = random.oneOf({-1, cropWidth, random.between(1, 90)});
-        const int32_t height = request.height = random.oneOf({-1, cropHeight, random.between(1, 90)});
+        const int32_t height = request.height =
+            random.oneOf({-1, cropHeight, random.between(1, 90)});
         const int32_t endWidth = width != -1    ? width
-                               : height != -1 ? height * cropWidth / cropHeight
-                                              : cropWidth;
+                                 : height != -1 ? height * cropWidth / cropHeight
+                                                : cropWidth;
         const int32_t endHeight = height != -1  ? height
-                                : width != -1 ? cropHeight * width / cropWidth
-                                              : cropHeight;
+                                  : width != -1 ? cropHeight * width / cropWidth
+                                                : cropHeight;
         Result made;
         ASSERT_EQ(request.run(image.info, made), endWidth > 0 && endHeight > 0);
         if (!made.isMade)

@@ -1,6 +1,6 @@
 #!/bin/bash
-# Installs into an empty folder, moves the tree, and builds a C and a C++ program
-# against it through pkg-config and through find_package.
+# Installs into an empty folder, moves the tree, and builds a program against it
+# through pkg-config, as C and as C++, and through find_package.
 # Usage: install.sh BUILD_DIR CC CXX CMAKE_GENERATOR
 set -euo pipefail
 here=$(cd "$(dirname "$0")" && pwd)
@@ -34,18 +34,16 @@ echo "pkg-config"
 export PKG_CONFIG_PATH=$libDir/pkgconfig
 # No other .pc file may be needed.
 read -ra flags <<<"$(PKG_CONFIG_LIBDIR=$PKG_CONFIG_PATH pkg-config --cflags --libs 'quillon >= 1.0')"
-"$cc" -std=c99 -Wall -Werror "$here/consumer/client.c" -o "$work/client" "${flags[@]}"
-"$cxx" -std=c++17 -Wall -Werror "$here/consumer/host.cpp" -o "$work/host" "${flags[@]}"
-LD_LIBRARY_PATH=$libDir "$work/client"
-LD_LIBRARY_PATH=$libDir "$work/host"
+"$cc" -std=c99 -x c -Wall -Werror "$here/consumer/client.c" -o "$work/inC" "${flags[@]}"
+"$cxx" -std=c++17 -x c++ -Wall -Werror "$here/consumer/client.c" -o "$work/inCpp" "${flags[@]}"
+LD_LIBRARY_PATH=$libDir "$work/inC"
+LD_LIBRARY_PATH=$libDir "$work/inCpp"
 
 echo "find_package"
 # Nobody who uses libquillon may be made to look for what it is built of.
 cmake -S "$here/consumer" -B "$work/build" -G "$generator" \
-    -DCMAKE_C_COMPILER="$cc" -DCMAKE_CXX_COMPILER="$cxx" \
-    -DCMAKE_PREFIX_PATH="$work/moved" -DCMAKE_DISABLE_FIND_PACKAGE_PNG=ON \
+    -DCMAKE_C_COMPILER="$cc" -DCMAKE_PREFIX_PATH="$work/moved" -DCMAKE_DISABLE_FIND_PACKAGE_PNG=ON \
     -DCMAKE_DISABLE_FIND_PACKAGE_PkgConfig=ON >"$work/log" ||
     { cat "$work/log"; exit 1; }
 cmake --build "$work/build" >"$work/log" || { cat "$work/log"; exit 1; }
 "$work/build/client"
-"$work/build/host"

@@ -1,7 +1,5 @@
 #include "reference/pixels.h"
 
-#include <quillon/raster.h>
-
 #include <algorithm>
 #include <bit>
 #include <cstdlib>
@@ -45,29 +43,12 @@ uint32_t moved(uint32_t pixel, uint32_t from, uint32_t to) {
 
 } // namespace
 
+// The code is the truth table: bit 3 - (2 * s + d) is the result for bits s and d.
 uint32_t combined(uint32_t rop, uint32_t s, uint32_t d) {
-    const uint32_t results[][2] = {
-        {RASTER_ROP_CLEAR, 0},
-        {RASTER_ROP_AND, s & d},
-        {RASTER_ROP_AND_REVERSE, s & ~d},
-        {RASTER_ROP_COPY, s},
-        {RASTER_ROP_AND_INVERTED, ~s & d},
-        {RASTER_ROP_NOOP, d},
-        {RASTER_ROP_XOR, s ^ d},
-        {RASTER_ROP_OR, s | d},
-        {RASTER_ROP_NOR, ~(s | d)},
-        {RASTER_ROP_EQUIV, ~(s ^ d)},
-        {RASTER_ROP_INVERT, ~d},
-        {RASTER_ROP_OR_REVERSE, s | ~d},
-        {RASTER_ROP_COPY_INVERTED, ~s},
-        {RASTER_ROP_OR_INVERTED, ~s | d},
-        {RASTER_ROP_NAND, ~(s & d)},
-        {RASTER_ROP_SET, ~uint32_t{0}},
+    const auto where = [&](uint32_t bit, uint32_t bits) {
+        return (rop >> bit & 1) != 0 ? bits : 0;
     };
-    for (const auto &[code, result] : results)
-        if (code == rop)
-            return result;
-    return d;
+    return rop > 15 ? d : where(3, ~s & ~d) | where(2, ~s & d) | where(1, s & ~d) | where(0, s & d);
 }
 
 uint32_t blended(uint32_t src, uint32_t dst) {
@@ -82,7 +63,7 @@ uint32_t blended(uint32_t src, uint32_t dst) {
 uint32_t converted(uint32_t pixel, int32_t srcDepth, int32_t dstDepth) {
     const Layout &src = layoutOf(srcDepth), &dst = layoutOf(dstDepth);
     const uint32_t color = moved(pixel, src.red, dst.red) | moved(pixel, src.green, dst.green) |
-                         moved(pixel, src.blue, dst.blue);
+                           moved(pixel, src.blue, dst.blue);
     return color | (src.alpha == 0 ? dst.alpha : pixel & dst.alpha);
 }
 

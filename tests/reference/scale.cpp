@@ -78,10 +78,10 @@ Axis axisOf(double scale, int32_t first, int32_t end) {
 
 } // namespace
 
-uint32_t scale(uint8_t *dstBuffer, int32_t dstLineIncrement, uint32_t /*dstWidth*/, uint32_t /*dstHeight*/,
-             int32_t left, int32_t top, int32_t right, int32_t bottom, const uint8_t *srcBuffer,
-             int32_t srcLineIncrement, uint32_t srcWidth, uint32_t srcHeight, double scaleX,
-             double scaleY, uint32_t filter) {
+uint32_t scale(uint8_t *dstBuffer, int32_t dstLineIncrement, uint32_t /*dstWidth*/,
+               uint32_t /*dstHeight*/, int32_t left, int32_t top, int32_t right, int32_t bottom,
+               const uint8_t *srcBuffer, int32_t srcLineIncrement, uint32_t srcWidth,
+               uint32_t srcHeight, double scaleX, double scaleY, uint32_t filter) {
     const Axis columns = axisOf(scaleX, left, right), lines = axisOf(scaleY, top, bottom);
     const bool isNearest = filter == 0 || lines.step == kOne, isLinear = lines.step < kOne;
 

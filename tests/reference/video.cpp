@@ -50,8 +50,8 @@ uint32_t channel(int64_t sum) {
 
 } // namespace
 
-void yuvToRgb(const uint8_t *srcBuffer, uint8_t *dstBuffer, uint32_t width, uint32_t height, uint32_t format,
-              int32_t bppdepth) {
+void yuvToRgb(const uint8_t *srcBuffer, uint8_t *dstBuffer, uint32_t width, uint32_t height,
+              uint32_t format, int32_t bppdepth) {
     const bool isPlanar = format == RASTER_VIDEO_YV12;
     const auto bytes = static_cast<size_t>(bppdepth + 1) / 8;
     for (uint64_t i = 0; i < uint64_t{width} * height; ++i) {
@@ -62,7 +62,7 @@ void yuvToRgb(const uint8_t *srcBuffer, uint8_t *dstBuffer, uint32_t width, uint
                                     : packedSamples(i, format == RASTER_VIDEO_YUY2);
         if (isWritten) {
             const uint32_t pixel = framePixel(srcBuffer[at.luma], srcBuffer[at.chromaLow],
-                                            srcBuffer[at.chromaHigh], bppdepth);
+                                              srcBuffer[at.chromaHigh], bppdepth);
             std::memcpy(dstBuffer + i * bytes, &pixel, bytes);
         }
     }

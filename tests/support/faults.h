@@ -6,8 +6,8 @@
 // UtilSafeMalloc0 come filled with kStale.
 #pragma once
 
-#include <hearth/hearth.h>
 #include <gtest/gtest.h>
+#include <hearth/hearth.h>
 
 #include <cstdint>
 

@@ -18,7 +18,8 @@ public:
 };
 
 // Since the last expectPanic() or clear(), oldest first.
-inline std::vector<std::string> warnings, logs;
+using Messages = std::vector<std::string>;
+inline Messages warnings, logs;
 
 // Runs a call that has to end in a Panic of the message "<start>:<line><end>\n",
 // such as "NOT_IMPLEMENTED lib/raster/rasterops:95\n".

@@ -48,6 +48,10 @@ public:
     T oneOf(std::initializer_list<T> values) {
         return values.begin()[below(static_cast<uint32_t>(values.size()))];
     }
+    template <class Values>
+    auto oneOf(const Values &values) {
+        return std::data(values)[below(static_cast<uint32_t>(std::size(values)))];
+    }
 
     void fill(void *memory, size_t size) {
         auto *bytes = static_cast<uint8_t *>(memory);

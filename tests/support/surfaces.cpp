@@ -1,5 +1,7 @@
 #include "support/surfaces.h"
 
+#include "support/faults.h"
+
 #include <algorithm>
 #include <cstring>
 
@@ -8,121 +10,140 @@ namespace {
 
 constexpr uint32_t kFencedRows = 3;
 constexpr uint32_t kMost = UINT32_MAX;
-constexpr size_t kLargePages = 450; // more than is kept in the caches of a core
 
-// The largest step there is downwards, and a step that only unsigned line
+// The largest stride there is downwards, and one that only unsigned line
 // increments can have upwards.
 constexpr size_t kFar = size_t{1} << 31;
 
-std::array<TwinMemory, 4> four(size_t pages, size_t runs, size_t spacing) {
-    const auto one = [&] { return TwinMemory(pages * pageSize(), runs, spacing); };
-    return {one(), one(), one(), one()};
+// Sources may have four times the bytes per pixel.
+std::array<TwinMemory, 4> four(size_t pages, size_t runs, size_t spacing, size_t srcPages) {
+    const auto one = [&](size_t size) { return TwinMemory(size * pageSize(), runs, spacing); };
+    return {one(pages), one(srcPages), one(pages), one(pages)};
 }
 
-int64_t rowStep(int64_t line, const Part &part) {
-    const bool isUnit = part.bytes == 2 || part.bytes == 4;
-    return part.rule != RowRule::kExact && isUnit ? line & -int64_t{part.bytes} : line;
-}
-
-// Small, or up to the largest.
-uint32_t randomCoordinate(Random &random) {
-    const uint32_t small = random.below(100);
-    return random.oneOf({0u, small, small, random.word(), kMost - small});
-}
-
-uint32_t randomWidth(Random &random) {
-    const uint32_t width =
-        random.oneIn(16) ? 200 + random.below(600) : random.below(random.oneIn(4) ? 20 : 141);
-    return random.oneIn(4) ? width & ~7u : width; // bitmap rows of whole bytes
-}
-
-// Fitting the row, padded, shorter than the row, next to none.
-int64_t randomLine(Random &random, size_t rowBytes) {
-    const auto row = static_cast<uint32_t>(rowBytes);
-    return random.oneOf({row, row, row + random.below(10), row + random.below(10),
-                         row + random.below(300), random.below(row + 1), random.below(5)});
+int64_t wholePixels(int64_t stride, const Part &part) {
+    const bool isWord = part.bytes == 2 || part.bytes == 4;
+    return part.rule != RowRule::kExact && isWord ? stride & -int64_t{part.bytes} : stride;
 }
 
 // The bytes from a rectangle's first pixel down to its lowest, and up to behind
 // its highest.
-struct Extent {
+struct Reach {
     int64_t below, above;
 };
 
 // One call.
 struct Case {
     const Operation &operation;
-    bool isInRows, isNear;
-    Size size;
+    Shape shape;
     std::array<TwinMemory, 4> &home; // for each surface
+    Size size;
+    bool isNear; // surfaces begin within 128 bytes of each other
     Surfaces at{operation.parts.size()};
     std::vector<TwinMemory *> memories{operation.parts.size()};
-    bool isUpwards = false;
+    bool isUpward = false; // the first row that is walked is the last one
 
+    bool isFenced() const { return shape == Shape::kFenced || shape == Shape::kFarApart; }
     size_t rowBytes(size_t i) const { return operation.parts[i].rowBytes(size.width); }
 
-    // From each row to the next one that is walked.
-    int64_t step(size_t i) const {
-        return rowStep(isUpwards ? -at[i].line : at[i].line, operation.parts[i]);
+    // From each row that is walked to the next.
+    int64_t walkedStride(size_t i) const {
+        return wholePixels(isUpward ? -at[i].stride : at[i].stride, operation.parts[i]);
     }
 
-    Extent extent(size_t i) const {
-        const int64_t toLast = step(i) * (int64_t{size.height} - 1);
+    Reach reach(size_t i) const {
+        const int64_t toLast = walkedStride(i) * (int64_t{size.height} - 1);
         return {std::max<int64_t>(0, -toLast),
                 std::max<int64_t>(0, toLast) + static_cast<int64_t>(rowBytes(i))};
     }
 
     bool overlaps() const {
-        const Extent dst = extent(0), src = extent(1);
+        const Reach dst = reach(0), src = reach(1);
         return memories[0] == memories[1] && at[0].first - dst.below < at[1].first + src.above &&
                at[1].first - src.below < at[0].first + dst.above;
     }
 };
 
+Shape drawShape(Random &random, const Operation &operation) {
+    const uint32_t n = random.below(64);
+    return n < 2                            ? Shape::kEmpty
+           : n < 5                          ? Shape::kLongRows
+           : n < 9                          ? Shape::kFarApart
+           : n < 28                         ? Shape::kFenced
+           : n < 46 && operation.mayOverlap ? Shape::kOverlapping
+                                            : Shape::kScattered;
+}
+
+Size drawSize(Random &random, Shape shape, const TwinMemory &memory, const Part &dst) {
+    const uint32_t rows = random.below(random.oneIn(16) ? 40 : 6);
+    uint32_t width = random.below(141);
+    switch (shape) {
+    case Shape::kOverlapping:
+        return {random.below(100), 1 + random.below(4)};
+    case Shape::kLongRows:
+        return {400 + random.below(2100), 1 + rows};
+    case Shape::kLarge:
+        width = 256 + random.below(2000);
+        return {width, static_cast<uint32_t>(memory.runBytes() / dst.rowBytes(width))};
+    default:
+        width = random.oneIn(16) ? 200 + random.below(600) : random.oneOf({width, width % 20});
+        width &= random.oneIn(4) ? ~7u : ~0u; // bitmap rows of whole bytes
+        return shape == Shape::kScattered ? Size{width, rows} : Size{width % 141, kFencedRows};
+    }
+}
+
+// Small, or up to the largest.
+uint32_t drawCoordinate(Random &random) {
+    const uint32_t small = random.below(100);
+    return random.oneOf({0u, small, small, random.word(), kMost - small});
+}
+
 void drawCoordinates(Random &random, Case &c) {
     const bool isOneCorner = c.operation.isOneCorner;
     const bool isOneColumn = isOneCorner || random.oneIn(4);
     const bool isOneRow = isOneCorner || random.oneIn(2);
-    const uint32_t x = randomCoordinate(random), y = randomCoordinate(random);
+    const uint32_t x = drawCoordinate(random), y = drawCoordinate(random);
     for (Surface &surface : c.at) {
-        surface.x = isOneColumn ? x : randomCoordinate(random);
-        surface.y = isOneRow ? y : randomCoordinate(random);
+        surface.x = isOneColumn ? x : drawCoordinate(random);
+        surface.y = isOneRow ? y : drawCoordinate(random);
     }
-    // Rounded steps are taken from the first row that is walked.
-    c.isUpwards = c.operation.walk == Walk::kAwayFromSource && c.at[1].y < c.at[0].y;
+    c.isUpward = c.operation.walk == Walk::kAwayFromSource && c.at[1].y < c.at[0].y;
 }
 
-void drawLine(Random &random, Case &c, size_t i) {
-    int64_t &line = c.at[i].line;
-    if (c.isInRows) {
-        const int64_t spacing = c.home[i].spacing();
-        const bool isDownwards = spacing > INT32_MAX || random.oneIn(2);
-        line = c.operation.isSigned && isDownwards ? -spacing : spacing;
+void drawStride(Random &random, Case &c, size_t i) {
+    int64_t &stride = c.at[i].stride;
+    if (c.isFenced()) {
+        stride = c.home[i].spacing();
+        if (c.operation.isSigned && (stride > INT32_MAX || random.oneIn(2)))
+            stride = -stride;
         return;
     }
-    line = randomLine(random, c.rowBytes(i));
+    const auto row = static_cast<uint32_t>(c.rowBytes(i));
+    stride = random.oneOf({row, row, row + random.below(10), row + random.below(10),
+                           row + random.below(300), random.below(row + 1), random.below(5)});
     if (random.oneIn(4))
-        line = -line;
+        stride = -stride;
     if (i > 0 && random.oneIn(2)) // as on surfaces of one size, or nearly
-        line = c.at[0].line + (c.isNear && random.oneIn(2) ? random.between(-20, 20) : 0);
+        stride = c.at[0].stride + (c.isNear && random.oneIn(2) ? random.between(-20, 20) : 0);
     if (!c.operation.isSigned)
-        line = std::abs(line);
+        stride = std::abs(stride);
+    const TwinMemory &memory = c.home[c.operation.mayOverlap ? 0 : i];
     for (; c.size.height > 1; --c.size.height) {
-        const Extent extent = c.extent(i);
-        if (extent.below + extent.above <= static_cast<int64_t>(c.home[i].runBytes()))
+        const Reach reach = c.reach(i);
+        if (reach.below + reach.above <= static_cast<int64_t>(memory.runBytes()))
             break;
     }
 }
 
 // Where the first row that is walked begins.
-uint8_t *drawFirst(Random &random, Case &c, size_t i, bool isFlushBehind, bool isNear) {
-    TwinMemory &memory = *c.memories[i];
-    if (c.isInRows)
-        return memory.run(c.step(i) < 0 ? kFencedRows - 1 : 0) +
-               (isFlushBehind ? memory.runBytes() - c.rowBytes(i) : 0);
-    const Extent extent = c.extent(i);
-    uint8_t *const lowest = memory.run(0) + extent.below;
-    const int64_t room = static_cast<int64_t>(memory.runBytes()) - extent.below - extent.above;
+uint8_t *drawFirst(Random &random, const Case &c, size_t i, bool isBehindFence, bool isNear) {
+    const TwinMemory &memory = *c.memories[i];
+    if (c.isFenced())
+        return memory.run(c.walkedStride(i) < 0 ? kFencedRows - 1 : 0) +
+               (isBehindFence ? 0 : memory.runBytes() - c.rowBytes(i));
+    const Reach reach = c.reach(i);
+    uint8_t *const lowest = memory.run(0) + reach.below;
+    const int64_t room = static_cast<int64_t>(memory.runBytes()) - reach.below - reach.above;
     if (isNear && i > 0)
         return std::clamp(c.at[0].first + random.between(-128, 128), lowest, lowest + room);
     const int64_t anywhere = random.below(static_cast<uint32_t>(room) + 1);
@@ -130,27 +151,43 @@ uint8_t *drawFirst(Random &random, Case &c, size_t i, bool isFlushBehind, bool i
 }
 
 void drawPlaces(Random &random, Case &c) {
-    const bool isFlushBehind = random.oneIn(2);
+    const bool isBehindFence = random.oneIn(2);
     const uint32_t nearest = c.at.size() < 3 ? 1 : 1 + random.below(3);
     for (size_t i = 0; i < c.at.size(); ++i) {
         const Part &part = c.operation.parts[i];
         const bool isNear = c.isNear && (i == 0 || i == nearest || random.oneIn(2));
-        const bool isShared = isNear || (!c.isInRows && c.operation.mayOverlap && random.oneIn(3));
+        const bool isShared =
+            isNear || (!c.isFenced() && c.operation.mayOverlap && random.oneIn(3));
         c.memories[i] = &c.home[isShared ? 0 : i];
         Surface &surface = c.at[i];
-        surface.first = part.isTouched ? drawFirst(random, c, i, isFlushBehind, isNear)
+        surface.first = part.isTouched ? drawFirst(random, c, i, isBehindFence, isNear)
                                        : c.memories[i]->nowhere();
-        const uint64_t row = uint64_t{surface.y} + (c.isUpwards ? c.size.height - 1 : 0);
-        const int64_t line =
-            part.rule == RowRule::kRounded ? rowStep(surface.line, part) : surface.line;
+        const uint64_t row = uint64_t{surface.y} + (c.isUpward ? c.size.height - 1 : 0);
+        const int64_t stride =
+            part.rule == RowRule::kRounded ? wholePixels(surface.stride, part) : surface.stride;
         surface.buffer = reinterpret_cast<uint8_t *>(reinterpret_cast<uintptr_t>(surface.first) -
-                                                   row * static_cast<uint64_t>(line) -
-                                                   uint64_t{surface.x} * part.bytes);
+                                                     row * static_cast<uint64_t>(stride) -
+                                                     uint64_t{surface.x} * part.bytes);
     }
 }
 
+void drawContents(Random &random, const Case &c) {
+    for (size_t i = 0; i < c.at.size(); ++i)
+        c.memories[i]->refill(random, c.operation.parts[i].low, c.operation.parts[i].count);
+    for (size_t i = 0; i < c.at.size(); ++i) {
+        const Part &part = c.operation.parts[i];
+        const uint32_t bytes = std::max(part.bytes, 1u);
+        for (uint32_t y = 0; y < c.size.height && !part.runs.empty(); ++y)
+            if (!random.oneIn(3))
+                plantRuns(random, c.at[i].first + y * c.walkedStride(i), c.rowBytes(i) / bytes,
+                          bytes, part.runs);
+    }
+    for (TwinMemory *memory : c.memories)
+        memory->keep();
+}
+
 // Carries out the operation in the model.
-void walk(const Case &c) {
+void walkModel(const Case &c) {
     const std::vector<Part> &parts = c.operation.parts;
     const bool isRowByRow = c.operation.walk == Walk::kRowByRow;
     const bool isAway = c.operation.walk == Walk::kAwayFromSource;
@@ -162,11 +199,11 @@ void walk(const Case &c) {
         std::array<uint8_t *, 4> rows = {};
         for (size_t k = 0; k < parts.size(); ++k)
             rows[k] = c.memories[k]->inModel(c.at[k].first +
-                                             (isFromLast ? height - 1 - i : i) * c.step(k));
-        const bool isLeftwards = (isRowByRow && rows[1] < rows[0]) ||
-                                 (isAway && c.at[1].y == c.at[0].y && c.at[1].x < c.at[0].x);
+                                             (isFromLast ? height - 1 - i : i) * c.walkedStride(k));
+        const bool isLeftward = (isRowByRow && rows[1] < rows[0]) ||
+                                (isAway && c.at[1].y == c.at[0].y && c.at[1].x < c.at[0].x);
         for (int64_t j = 0; j < width; ++j) {
-            const int64_t column = isLeftwards ? width - 1 - j : j;
+            const int64_t column = isLeftward ? width - 1 - j : j;
             Pixels pixels = {};
             for (size_t k = 0; k < parts.size(); ++k) {
                 const uint32_t bytes = parts[k].bytes / split;
@@ -181,34 +218,52 @@ void walk(const Case &c) {
     }
 }
 
-void compare(Random &random, const Case &c) {
-    for (size_t i = 0; i < c.at.size(); ++i)
-        c.memories[i]->refill(random, c.operation.parts[i].low, c.operation.parts[i].count);
-    c.operation.library(c.at, c.size);
-    walk(c);
-    for (const TwinMemory *memory : c.memories)
-        EXPECT_TRUE(memory->agree());
-    if (testing::Test::HasFailure())
+// The call on every instruction set.
+void callLibrary(const Case &c) {
+    static constexpr const char *kShapes[] = {"empty",     "scattered", "overlapping", "fenced",
+                                              "far apart", "long rows", "large"};
+    for (const int64_t target : kTargets) {
+        const OnTarget on(target);
+        for (TwinMemory *memory : c.memories)
+            memory->restore();
+        {
+            const MemoryFault none(UINT64_MAX);
+            c.operation.library(c.at, c.size);
+            EXPECT_EQ(none.requestsLeft, UINT64_MAX) << "memory was asked for";
+        }
+        for (const TwinMemory *memory : c.memories)
+            EXPECT_TRUE(memory->agrees());
+        if (!testing::Test::HasFailure())
+            continue;
+        ADD_FAILURE() << c.operation.name << ", " << kShapes[static_cast<size_t>(c.shape)] << ", "
+                      << c.size.width << " x " << c.size.height << " on "
+                      << hwy::TargetName(target);
         for (const Surface &surface : c.at)
-            ADD_FAILURE() << c.operation.name << ", " << c.size.width << " x " << c.size.height
-                          << " at " << surface.x << ", " << surface.y << ", line " << surface.line;
+            ADD_FAILURE() << "at " << surface.x << ", " << surface.y << ", stride "
+                          << surface.stride << ", address " << uintptr_t(surface.first);
+        return;
+    }
 }
 
 // Nothing is looked at when there is nothing to do, however large the rest.
-void callForNothing(Random &random, const Operation &operation, uint8_t *nowhere) {
-    Surfaces at(operation.parts.size());
-    for (Surface &surface : at)
+void drawNothing(Random &random, Case &c) {
+    uint8_t *const nowhere = random.oneIn(4) ? nullptr : c.home[0].nowhere();
+    std::fill(c.memories.begin(), c.memories.end(), &c.home[0]);
+    for (Surface &surface : c.at)
         surface = {nowhere, nowhere, 64, random.below(9), random.below(9)};
     const uint32_t any = random.oneOf({0u, 1u, kMost});
-    const uint32_t none = operation.parts[0].isTouched ? 0 : random.oneOf({0u, 1u, 999u, kMost});
-    operation.library(at, random.oneIn(2) ? Size{any, none} : Size{none, any});
+    const bool isIdle = !c.operation.parts[0].isTouched;
+    const uint32_t none = isIdle ? random.oneOf({0u, 1u, 999u, kMost}) : 0;
+    c.size = random.oneIn(2) ? Size{any, none} : Size{none, any};
+    c.home[0].keep();
 }
 
 } // namespace
 
 TwinMemory::TwinMemory(size_t runBytes, size_t runs, size_t spacing)
     : runBytes_(runBytes), runs_(runs), spacing_(spacing),
-      pages_((runs - 1) * spacing + runBytes + 2 * pageSize()), model_(pages_.size()) {
+      pages_((runs - 1) * spacing + runBytes + 2 * pageSize()), model_(pages_.size()),
+      kept_(runs * runBytes) {
     for (size_t i = 0; i < runs; ++i)
         for (Mapping *mapping : {&pages_, &model_})
             mapping->open(pageSize() + i * spacing, runBytes);
@@ -222,11 +277,22 @@ void TwinMemory::refill(Random &random, uint32_t low, uint32_t count) {
             std::transform(bytes, bytes + runBytes_, bytes, [=](uint8_t byte) {
                 return static_cast<uint8_t>(low + (byte * count >> 8));
             });
-        std::copy_n(bytes, runBytes_, inModel(bytes));
     }
 }
 
-testing::AssertionResult TwinMemory::agree() const {
+void TwinMemory::keep() {
+    for (size_t i = 0; i < runs_; ++i) {
+        std::copy_n(run(i), runBytes_, &kept_[i * runBytes_]);
+        std::copy_n(run(i), runBytes_, inModel(run(i)));
+    }
+}
+
+void TwinMemory::restore() {
+    for (size_t i = 0; i < runs_; ++i)
+        std::copy_n(&kept_[i * runBytes_], runBytes_, run(i));
+}
+
+testing::AssertionResult TwinMemory::agrees() const {
     for (size_t i = 0; i < runs_; ++i) {
         const uint8_t *bytes = run(i), *model = inModel(run(i));
         if (std::memcmp(bytes, model, runBytes_) == 0)
@@ -239,37 +305,42 @@ testing::AssertionResult TwinMemory::agree() const {
 }
 
 Arena::Arena()
-    : blocks_(four(6, 1, 0)), largeBlocks_(four(kLargePages, 1, 0)),
-      rows_(four(1, kFencedRows, 2 * pageSize())), farRows_(four(1, kFencedRows, kFar)) {}
+    : blocks_(four(6, 1, 0, 6)), largeBlocks_(four(450, 1, 0, 1800)),
+      rows_(four(1, kFencedRows, 2 * pageSize(), 1)), farRows_(four(1, kFencedRows, kFar, 1)) {}
 
-void Arena::check(Random &random, const Operation &operation) {
-    if (!operation.parts[0].isTouched || random.oneIn(32))
-        return callForNothing(random, operation, random.oneIn(4) ? nullptr : blocks_[0].nowhere());
-
-    const bool isLarge = random.oneIn(1000), isFar = !isLarge && random.oneIn(16);
-    const bool isInRows = isFar || (!isLarge && random.oneIn(3));
-    const bool isNear = !isInRows && operation.mayOverlap && random.oneIn(2);
-    Size size = {randomWidth(random), random.below(random.oneIn(16) ? 40 : 6)};
-    if (isInRows) {
-        size = {random.below(141), kFencedRows};
-    } else if (isLarge) {
-        size.width = 256 + random.below(2000);
-        const size_t rowBytes = operation.parts[0].rowBytes(size.width);
-        size.height = static_cast<uint32_t>(largeBlocks_[0].runBytes() / rowBytes);
-    } else if (isNear) {
-        size = {random.below(100), 1 + random.below(4)};
+void Arena::check(Random &random, const Operation &operation, std::optional<Shape> given) {
+    const bool isIdle = !operation.parts[0].isTouched;
+    const Shape shape = isIdle ? Shape::kEmpty : given.value_or(drawShape(random, operation));
+    auto &home = shape == Shape::kLarge      ? largeBlocks_
+                 : shape == Shape::kFarApart ? farRows_
+                 : shape == Shape::kFenced   ? rows_
+                                             : blocks_;
+    const Size size = drawSize(random, shape, home[0], operation.parts[0]);
+    const bool isNear = shape == Shape::kOverlapping || (shape == Shape::kLarge && random.oneIn(2));
+    Case c = {operation, shape, home, size, isNear && operation.mayOverlap};
+    if (shape == Shape::kEmpty) {
+        drawNothing(random, c);
+        return callLibrary(c);
     }
-
-    Case c = {operation, isInRows, isNear, size,
-              isLarge    ? largeBlocks_
-              : isFar    ? farRows_
-              : isInRows ? rows_
-                         : blocks_};
     drawCoordinates(random, c);
     for (size_t i = 0; i < c.at.size(); ++i)
-        drawLine(random, c, i);
+        drawStride(random, c, i);
     drawPlaces(random, c);
-    compare(random, c);
+    drawContents(random, c);
+    walkModel(c);
+    callLibrary(c);
+}
+
+void plantRuns(Random &random, uint8_t *pixels, size_t count, uint32_t bytes,
+               const std::vector<uint32_t> &values) {
+    const uint32_t longest = random.oneOf({2u, 9u, 90u});
+    for (size_t i = 0; i < count;) {
+        const size_t end = std::min<size_t>(count, i + 1 + random.below(longest));
+        const uint32_t value = values[random.below(static_cast<uint32_t>(values.size()))];
+        for (const bool isLeft = random.oneIn(3); i < end; ++i)
+            if (!isLeft)
+                std::memcpy(pixels + i * bytes, &value, bytes);
+    }
 }
 
 } // namespace quillon::test

@@ -1,21 +1,60 @@
-// Operations on rectangles, held to their reference: on random surfaces, in
-// fenced memory that has a model.
+// The random driver.  It holds every operation on rectangles to a reference that
+// handles one pixel, on every instruction set.
+//
+// A case is one call.  From its number are drawn
+//
+//     the operation  by the test: a call with all its arguments but the surfaces
+//                    and the size, and the reference for its pixels;
+//     a Shape        the size, and how the surfaces lie in memory;
+//     contents       random bytes, with runs of the pixels that an operation may
+//                    handle in a way of their own (Part::runs).
+//
+// The memory is fenced and has a model, through which the reference walks pixel by
+// pixel.  The call is made on each instruction set, and every time all of the
+// memory has to equal the model: bytes beside the rectangle count as well.  No
+// call may allocate.
+//
+// A failure names the operation, the shape, the surfaces and the instruction set,
+// and ends with the variables that run this case alone, as does a crash (a fence
+// that was touched):
+//
+//     QUILLON_TEST_SEED=20240229 QUILLON_TEST_CASE=4711 blendTest
 #pragma once
 
-#include <cstdint>
 #include "support/fence.h"
 #include "support/targets.h"
 
 #include <array>
+#include <cstdint>
 #include <functional>
 #include <string>
 #include <vector>
 
 namespace quillon::test {
 
-// Runs of pages between inaccessible ones, and their model.  The call under
-// test works on the pages, the reference on the model, and then they have to
-// agree.
+// What a case stresses.
+enum class Shape {
+    // A width or height of 0: no pointer may be followed.
+    kEmpty,
+    // A few rows anywhere in a block, often up to a fence, with a stride that fits
+    // the row, is longer or shorter, negative or 0: heads and tails at every
+    // alignment, rows that overlap each other.
+    kScattered,
+    // The same with surfaces within 128 bytes of each other: overlap hazards.
+    kOverlapping,
+    // Rows that each begin behind a fence or end ahead of one: nothing beside them
+    // is read either.
+    kFenced,
+    // The same with rows 2 GB apart: addresses beyond 32 bits.
+    kFarApart,
+    // Rows of 400 to 2500 pixels: loops that shorter ones do not enter.
+    kLongRows,
+    // Surfaces of about 1.6 MB: stores around the caches.  Takes long, and is only
+    // drawn where a test asks for it.
+    kLarge,
+};
+
+// Runs of pages between inaccessible ones, and their model.
 class TwinMemory {
 public:
     TwinMemory(size_t runBytes, size_t runs, size_t spacing); // in whole pages
@@ -27,28 +66,32 @@ public:
 
     // New bytes, from low to low + count - 1 each.
     void refill(Random &random, uint32_t low = 0, uint32_t count = 256);
+    // Makes the present bytes those of the model, and the ones to go back to.
+    void keep();
+    void restore();
 
     uint8_t *inModel(uint8_t *address) const { return model_.data() + (address - pages_.data()); }
-
-    testing::AssertionResult agree() const;
+    testing::AssertionResult agrees() const; // with the model
 
 private:
     size_t runBytes_, runs_, spacing_;
     Mapping pages_, model_;
+    std::vector<uint8_t> kept_;
 };
 
-// How the rows of a surface follow each other, see raster.h.
+// How the rows of a surface follow each other, see raster.h: by the stride, by the
+// stride rounded down to whole pixels, or rounded ahead of the first row, too.
 enum class RowRule { kExact, kRoundedSteps, kRounded };
 
 // A surface, and a rectangle on it: its corner, and the address of its first pixel.
 struct Surface {
     uint8_t *buffer; // of pixel (0, 0), which may lie outside of memory
     uint8_t *first;
-    int64_t line;
+    int64_t stride;
     uint32_t x, y;
 
-    int32_t signedLine() const { return static_cast<int32_t>(line); }
-    uint32_t unsignedLine() const { return static_cast<uint32_t>(line); }
+    int32_t signedStride() const { return static_cast<int32_t>(stride); }
+    uint32_t unsignedStride() const { return static_cast<uint32_t>(stride); }
 };
 using Surfaces = std::vector<Surface>;
 
@@ -62,6 +105,7 @@ struct Part {
     RowRule rule = RowRule::kExact;
     uint32_t low = 0, count = 256; // the values that bytes may have
     bool isTouched = true;
+    std::vector<uint32_t> runs = {}; // values of pixels, or of 8 bits
 
     size_t rowBytes(uint32_t width) const {
         return bytes == 0 ? (size_t{width} + 7) / 8 : size_t{width} * bytes;
@@ -71,7 +115,7 @@ struct Part {
 // The order in which an operation goes through its pixels, each of which it
 // reads on all surfaces before it stores one.
 enum class Walk {
-    kForwards,
+    kForward,
     // From the last row where the source begins higher up, from the right where
     // it begins further left in the same row.  Three bytes count one by one.
     kAwayFromSource,
@@ -82,16 +126,15 @@ enum class Walk {
 
 using Pixels = std::array<uint32_t, 4>; // of each surface
 
-// A call with all its arguments but the surfaces, of which the first is the
-// destination, and the size.
+// The first surface is the destination.
 struct Operation {
     std::string name;
     std::vector<Part> parts;
     std::function<void(const Surfaces &, Size)> library;
     std::function<uint32_t(const Pixels &)> reference; // the pixel that is stored
-    Walk walk = Walk::kForwards;
+    Walk walk = Walk::kForward;
     bool mayOverlap = true;
-    bool isSigned = true;     // the line increments
+    bool isSigned = true;     // the strides
     bool isOneCorner = false; // the coordinates are the same on all surfaces
 };
 
@@ -99,22 +142,23 @@ class Arena {
 public:
     Arena();
 
-    // One call: anywhere in memory, often flush against a fence; or with
-    // surfaces so near that a vector can run into itself; or with a fence at an
-    // edge of every row, the rows up to 2 GB apart; or so large that caches are
-    // passed by; or with nothing to do.
-    void check(Random &random, const Operation &operation);
+    // One case, of a random shape other than kLarge unless one is given.
+    void check(Random &random, const Operation &operation, std::optional<Shape> shape = {});
 
 private:
     std::array<TwinMemory, 4> blocks_, largeBlocks_, rows_, farRows_; // for each surface
 };
 
-// Random operations, on every instruction set.
+// Random operations, by draw(random).
 template <class Draw>
-void holdToReference(uint64_t cases, const Draw &draw) {
+void holdToReference(uint64_t cases, const Draw &draw, std::optional<Shape> shape = {}) {
     Arena arena;
-    forEachTarget(
-        [&] { forEachCase(cases, [&](Random &random) { arena.check(random, draw(random)); }); });
+    forEachCase(cases, [&](Random &random) { arena.check(random, draw(random), shape); });
 }
+
+// Overwrites pixels by runs of one of the values each, with some left between: of
+// one or two pixels, so that vectors are mixed, or of many.
+void plantRuns(Random &random, uint8_t *pixels, size_t count, uint32_t bytes,
+               const std::vector<uint32_t> &values);
 
 } // namespace quillon::test

@@ -13,20 +13,28 @@
 
 namespace quillon::test {
 
-template <class Run>
-void forEachTarget(const Run &run) {
-    struct Restore {
-        ~Restore() {
-            hwy::SetSupportedTargetsForTest(0);
-            running.target = "any";
-        }
-    } const restore;
-    const std::vector<int64_t> targets = hwy::SupportedAndGeneratedTargets();
-    ASSERT_FALSE(targets.empty());
-    for (const int64_t target : targets) {
-        SCOPED_TRACE(hwy::TargetName(target));
+inline const std::vector<int64_t> kTargets = hwy::SupportedAndGeneratedTargets();
+
+// While one lives, the library runs on this target.
+struct OnTarget {
+    explicit OnTarget(int64_t target) {
         running.target = hwy::TargetName(target);
         hwy::SetSupportedTargetsForTest(target);
+    }
+    ~OnTarget() {
+        running.target = "any";
+        hwy::SetSupportedTargetsForTest(0);
+    }
+    OnTarget(const OnTarget &) = delete;
+    OnTarget &operator=(const OnTarget &) = delete;
+};
+
+template <class Run>
+void forEachTarget(const Run &run) {
+    ASSERT_FALSE(kTargets.empty());
+    for (const int64_t target : kTargets) {
+        const OnTarget on(target);
+        SCOPED_TRACE(hwy::TargetName(target));
         run();
         if (testing::Test::HasFailure())
             return;

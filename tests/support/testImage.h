@@ -1,9 +1,9 @@
 // Images with random pixels, and a plain reading of their colours.
 #pragma once
 
-#include <quillon/imageUtil.h>
 #include "support/fence.h"
 #include "support/random.h"
+#include <quillon/imageUtil.h>
 
 namespace quillon::test {
 

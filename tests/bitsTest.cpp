@@ -1,8 +1,7 @@
 // Bit and stencil expansion against their reference.
 
-#include <quillon/raster.h>
-#include "support/messages.h"
 #include "support/surfaces.h"
+#include <quillon/raster.h>
 
 #include <atomic>
 #include <thread>
@@ -17,20 +16,24 @@ constexpr Opaque kOpaque[] = {RasterBitsToPixels8, RasterBitsToPixels16, RasterB
 constexpr Stencil kStencil[] = {RasterBitsToPixelsStencil8, RasterBitsToPixelsStencil16,
                                 RasterBitsToPixelsStencil24, RasterBitsToPixelsStencil32};
 
-// By the general function, or the one that has the pixel size in its name.
-Operation expansion(Random &random, bool isStencil) {
+// By the general function, or the one that has the pixel size in its name.  Widths
+// below 1 and unknown pixel sizes leave nothing to do.
+Operation expansion(Random &random, bool isStencil, bool isIdle) {
     const uint32_t member = random.below(4), pixel = random.word(), background = random.word();
-    const auto bytes = static_cast<int32_t>(member + 1);
-    const bool isNamed = random.oneIn(2);
-    const uint32_t low = random.oneOf({0u, 0u, 0u, 0xFFu}), count = low == 0 ? 256 : 1;
+    const bool isNamed = random.oneIn(2), isNegative = isIdle && (isNamed || random.oneIn(2));
+    const int32_t bytes = isIdle && !isNegative
+                              ? random.oneOf({0, 5, -1, 8, 0x101, INT32_MIN, INT32_MAX})
+                              : static_cast<int32_t>(member + 1);
     return {(isStencil ? "stencil " : "opaque ") + std::to_string(bytes),
-            {{.bytes = member + 1}, {.bytes = 0, .low = low, .count = count}},
+            {{.bytes = member + 1, .isTouched = !isIdle},
+             {.bytes = 0, .isTouched = !isIdle, .runs = {0x00, 0xFF}}},
             [=](const Surfaces &at, Size size) {
                 const auto expand = [&](auto function, auto... rest) {
-                    function(at[1].first, at[1].signedLine(), at[0].first, at[0].signedLine(),
+                    function(at[1].first, at[1].signedStride(), at[0].first, at[0].signedStride(),
                              rest...);
                 };
-                const auto width = static_cast<int32_t>(size.width);
+                const int32_t width =
+                    static_cast<int32_t>(size.width) | (isNegative ? INT32_MIN : 0);
                 if (isStencil && isNamed)
                     expand(kStencil[member], width, size.height, pixel);
                 else if (isStencil)
@@ -44,53 +47,59 @@ Operation expansion(Random &random, bool isStencil) {
                 const uint32_t clear = isStencil ? old[0] : background;
                 return old[1] != 0 ? pixel : clear;
             },
-            Walk::kForwards,
+            Walk::kForward,
             false};
 }
 
-TEST(BitsToPixels, matchesReference) {
-    warnings.clear();
-    holdToReference(16000, [](Random &random) { return expansion(random, random.oneIn(2)); });
-    EXPECT_TRUE(warnings.empty());
+Operation drawExpansion(Random &random) {
+    return expansion(random, random.oneIn(2), random.oneIn(64));
 }
 
-// A page of which pixels under set bits are part, amid inaccessible ones where
-// all bits are clear.
-TEST(BitsToPixelsStencil, touchesNoPageWhereAllBitsAreClear) {
-    const FencedBuffer page(pageSize());
-    const auto end = static_cast<int32_t>(page.size());
-    forEachTarget([&] {
-        forEachCase(6000, [&](Random &random) {
-            const Operation call = expansion(random, true);
-            const auto bytes = static_cast<int32_t>(call.parts[0].bytes);
-            const auto width = random.between(1, 300);
-            // The first byte's place in the page, across one of its ends.
-            const int32_t start = random.oneOf({0, end}) - random.between(0, width * bytes);
-            std::vector<uint8_t> bitmap(64);
-            random.fill(bitmap.data(), bitmap.size());
-            random.fill(page.data(), page.size());
-            std::vector<uint8_t> expected(page.data(), page.end());
-            for (int32_t x = 0, at = start; x < width; ++x, at += bytes) {
-                uint8_t &bits = bitmap[static_cast<size_t>(x / 8)];
-                const auto bit = static_cast<uint8_t>(0x80 >> x % 8);
-                if (at < 0 || at + bytes > end)
-                    bits &= static_cast<uint8_t>(~bit);
-                const uint32_t pixel = call.reference({0, 1});
-                if ((bits & bit) != 0)
-                    std::memcpy(&expected[static_cast<size_t>(at)], &pixel, call.parts[0].bytes);
-            }
-            call.library(
-                {{nullptr, page.data() + start, 0, 0, 0}, {nullptr, bitmap.data(), 0, 0, 0}},
-                {static_cast<uint32_t>(width), 1});
+TEST(Bits, matchesReference) {
+    holdToReference(16000, drawExpansion);
+}
+
+TEST(Bits, matchesReferenceOnLargeSurfaces) {
+    holdToReference(24, drawExpansion, Shape::kLarge);
+}
+
+// Pixels under clear bits lie beyond a fence.
+TEST(Stencil, touchesNoPageWhereAllBitsAreClear) {
+    forEachCase(6000, [](Random &random) {
+        const Operation call = expansion(random, true, false);
+        const uint32_t bytes = call.parts[0].bytes, inside = random.below(150);
+        const uint32_t outside = random.below(150), width = inside + outside;
+        const bool isAhead = random.oneIn(2);
+        const FencedBuffer page(size_t{inside} * bytes, isAhead ? FencedBuffer::Flush::kBefore
+                                                                : FencedBuffer::Flush::kBehind);
+        std::vector<uint8_t> bitmap(width / 8 + 1), before(page.size());
+        random.fill(bitmap.data(), bitmap.size());
+        plantRuns(random, bitmap.data(), bitmap.size(), 1, {0x00, 0xFF});
+        random.fill(before.data(), before.size());
+        std::vector<uint8_t> expected = before;
+        for (uint32_t x = 0, i = 0; x < width; ++x) {
+            const auto bit = static_cast<uint8_t>(0x80 >> x % 8);
+            if (isAhead ? x < outside : x >= inside)
+                bitmap[x / 8] &= static_cast<uint8_t>(~bit);
+            else if (const uint32_t pixel = call.reference({0, 1}); (bitmap[x / 8] & bit) != 0)
+                std::memcpy(&expected[bytes * i++], &pixel, bytes);
+            else
+                ++i;
+        }
+        forEachTarget([&] {
+            std::copy(before.begin(), before.end(), page.data());
+            uint8_t *const first = page.data() - (isAhead ? size_t{outside} * bytes : 0);
+            call.library({{nullptr, first, 0, 0, 0}, {nullptr, bitmap.data(), 0, 0, 0}},
+                         {width, 1});
             EXPECT_TRUE(std::equal(page.data(), page.end(), expected.begin()))
-                << call.name << ", from byte " << start << " of the page";
+                << call.name << ", " << inside << " pixels inside, " << outside << " outside";
         });
     });
 }
 
 // Pixels under clear bits belong to others: what another thread writes there is
 // never lost to a pixel that is read and written back.
-TEST(BitsToPixelsStencil, leavesClearPixelsToAnotherThread) {
+TEST(Stencil, leavesClearPixelsToAnotherThread) {
     constexpr uint32_t kWidth = 64;
     constexpr int kRounds = 1000; // of the other thread
     const auto check = [&](size_t bytes, uint8_t pattern) {
@@ -121,23 +130,6 @@ TEST(BitsToPixelsStencil, leavesClearPixelsToAnotherThread) {
             for (const uint8_t pattern : {uint8_t{0x00}, uint8_t{0x55}, uint8_t{0x7E}})
                 check(bytes, pattern);
     });
-}
-
-// Widths below 1 and unknown pixel sizes: nothing is looked at, or said.
-TEST(BitsToPixels, touchesNothingWhereThereIsNothingToDo) {
-    const FencedBuffer fence(1);
-    uint8_t *nowhere = fence.end();
-    warnings.clear();
-    const auto call = [&](int32_t bytes, int32_t width) {
-        Raster_BitsToPixels(nowhere, 8, nowhere, 64, bytes, width, 9, 1, 2);
-        Raster_BitsToPixelsStencil(nowhere, 8, nowhere, 64, bytes, width, 9, 1);
-    };
-    for (const int32_t bytes : {1, 2, 3, 4})
-        for (const int32_t width : {-1, -8, INT32_MIN})
-            call(bytes, width);
-    for (const int32_t bytes : {0, 5, -1, 8, 0x101, INT32_MIN, INT32_MAX})
-        call(bytes, 9);
-    EXPECT_TRUE(warnings.empty());
 }
 
 } // namespace

@@ -35,12 +35,10 @@ std::vector<Entry> used(const RasterRectList &list) {
     return {std::begin(list.entries), end};
 }
 
-uint32_t add(RasterRectList &list, const Entry &e) {
-    return Raster_AddRect(&list, e.x, e.y, e.width, e.height);
-}
+using Change = decltype(Raster_AddRect);
 
-uint32_t subtract(RasterRectList &list, const Entry &e) {
-    return Raster_SubRect(&list, e.x, e.y, e.width, e.height);
+uint32_t apply(Change *change, RasterRectList &list, const Entry &e) {
+    return change(&list, e.x, e.y, e.width, e.height);
 }
 
 uint32_t areaOf(const std::vector<Entry> &entries) {
@@ -153,7 +151,8 @@ struct Placement {
     explicit Placement(Random &random) {
         for (const int axis : {0, 1}) {
             size[axis] = random.oneOf({1, 1, 3, 1000, kMax / kCells});
-            origin[axis] = random.oneOf({0, -7, kMin, int32_t(kMax - int64_t{size[axis]} * kCells)});
+            origin[axis] =
+                random.oneOf({0, -7, kMin, int32_t(kMax - int64_t{size[axis]} * kCells)});
         }
     }
     Entry operator()(const Entry &e) const {
@@ -188,7 +187,7 @@ TEST(RectList, agreesWithABitmap) {
             RasterRectList list = placement(cells);
             const uint32_t expected = model(cells, rect, isAdding);
             const Entry placed = placement(rect);
-            EXPECT_EQ(isAdding ? add(list, placed) : subtract(list, placed),
+            EXPECT_EQ(apply(isAdding ? Raster_AddRect : Raster_SubRect, list, placed),
                       expected * uint32_t(placement.size[0]) * uint32_t(placement.size[1]));
             EXPECT_EQ(list, placement(cells));
         }
@@ -205,14 +204,16 @@ TEST(RectList, refusesWhatHasNoSize) {
         // Together they are wider than an entry tells.
         RasterRectList list = listOf({turned({kMin, 0, kMax, 1})});
         const RasterRectList before = list;
-        EXPECT_EQ(add(list, turned({-1, 0, 100, 1})), 0u);
+        EXPECT_EQ(apply(Raster_AddRect, list, turned({-1, 0, 100, 1})), 0u);
         // Whose edge wraps covers nothing.
-        EXPECT_EQ(add(list, turned({kMax - 5, 0, 10, 10})), uint32_t(kMax));
-        EXPECT_EQ(subtract(list, turned({kMax - 5, 0, 10, 10})), uint32_t(kMax));
+        EXPECT_EQ(apply(Raster_AddRect, list, turned({kMax - 5, 0, 10, 10})), uint32_t(kMax));
+        EXPECT_EQ(apply(Raster_SubRect, list, turned({kMax - 5, 0, 10, 10})), uint32_t(kMax));
         for (const Entry &e : {Entry{0, 0, -1, 5}, Entry{0, 0, 5, kMin}, Entry{0, 0, -1, -1}})
             expectPanic(
-                "VERIFY lib/raster/rasterRect", [&] { add(list, turned(e)); }, " bugNr=15740");
-        EXPECT_EQ(add(list, turned({0, 0, 0, -5})), 0u); // a size of 0 comes first
+                "VERIFY lib/raster/rasterRect", [&] { apply(Raster_AddRect, list, turned(e)); },
+                " bugNr=15740");
+        EXPECT_EQ(apply(Raster_AddRect, list, turned({0, 0, 0, -5})),
+                  0u); // a size of 0 comes first
         EXPECT_EQ(list, before);
     }
 }
@@ -231,11 +232,11 @@ TEST(RectList, survivesAnyNumbers) {
         const Entry rect = {number(), number(), random.between(0, kMax), random.between(0, kMax)};
         const Entry nothing = {0, 0, -1, -1};
         try {
-            random.oneIn(2) ? add(list, rect) : subtract(list, rect);
-            if (subtract(list, nothing) == 0)
+            apply(random.oneIn(2) ? Raster_AddRect : Raster_SubRect, list, rect);
+            if (apply(Raster_SubRect, list, nothing) == 0)
                 return;
             const RasterRectList normal = list;
-            EXPECT_EQ(subtract(list, nothing), areaOf(used(normal)));
+            EXPECT_EQ(apply(Raster_SubRect, list, nothing), areaOf(used(normal)));
             EXPECT_EQ(list, normal);
         } catch (const PanicError &) {
         }
@@ -248,14 +249,16 @@ TEST(RectList, sixteenSpansInARow) {
         columns.entries[i] = {10 * i, 0, 5, 20};
     RasterRectList list = columns;
     // From the first row on, the split finds no free span.
-    expectPanic("VERIFY lib/raster/rasterRect", [&] { subtract(list, {1, -5, 2, 10}); });
+    expectPanic("VERIFY lib/raster/rasterRect", [&] {
+        apply(Raster_SubRect, list, {1, -5, 2, 10});
+    });
     // Further down the sixteen entries are too many before it comes to that.
-    EXPECT_EQ(subtract(list, {1, 5, 2, 10}), 0u);
+    EXPECT_EQ(apply(Raster_SubRect, list, {1, 5, 2, 10}), 0u);
     EXPECT_EQ(list, columns);
     // A seventeenth rectangle takes full part, whether it fits or not.
-    EXPECT_EQ(add(list, {0, 0, 150, 20}), 3100u);
+    EXPECT_EQ(apply(Raster_AddRect, list, {0, 0, 150, 20}), 3100u);
     list = columns;
-    EXPECT_EQ(add(list, {200, 0, 5, 30}), 205u * 30u);
+    EXPECT_EQ(apply(Raster_AddRect, list, {200, 0, 5, 30}), 205u * 30u);
 }
 
 } // namespace

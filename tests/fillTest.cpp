@@ -1,0 +1,51 @@
+// Fills against their reference.
+
+#include "support/messages.h"
+#include "support/surfaces.h"
+#include <quillon/raster.h>
+
+namespace quillon::test {
+namespace {
+
+Operation drawFill(Random &random) {
+    const uint32_t bytes = 1 + random.below(4), alpha = random.below(256);
+    const uint32_t pixel = random.oneIn(4) ? alpha * 0x01010101 : random.word();
+    if (random.oneIn(3))
+        return {"alpha fill",
+                {{4}},
+                [=](const Surfaces &at, Size size) {
+                    Raster_RectFillAlpha(at[0].buffer, at[0].signedStride(),
+                                         static_cast<uint8_t>(alpha), at[0].x, at[0].y, size.width,
+                                         size.height);
+                },
+                [=](const Pixels &old) { return (old[0] & 0xFFFFFF) | alpha << 24; }};
+    return {"fill " + std::to_string(bytes),
+            {{.bytes = bytes, .rule = RowRule::kRoundedSteps}},
+            [=](const Surfaces &at, Size size) {
+                Raster_RectFill(at[0].buffer, at[0].signedStride(), static_cast<int32_t>(bytes),
+                                pixel, at[0].x, at[0].y, size.width, size.height);
+            },
+            [=](const Pixels & /*old*/) { return pixel; }};
+}
+
+TEST(Fill, matchesReference) {
+    holdToReference(12000, drawFill);
+}
+
+TEST(Fill, matchesReferenceOnLargeSurfaces) {
+    holdToReference(24, drawFill, Shape::kLarge);
+}
+
+// Ahead of any store, and whatever there is to do.
+TEST(Fill, refusesPixelSizes) {
+    const FencedBuffer fence(1);
+    for (const int32_t bytes : {0, 5, -1, 0x101, INT32_MIN, INT32_MAX})
+        for (const uint32_t width : {0u, 1u}) {
+            expectPanic("NOT_IMPLEMENTED lib/raster/rasterops",
+                        [&] { Raster_RectFill(fence.end(), 4, bytes, 0, 0, 0, width, 1); });
+            EXPECT_EQ(warnings, (Messages{"Raster: Unsupported frame buffer depth\n"}));
+        }
+}
+
+} // namespace
+} // namespace quillon::test
