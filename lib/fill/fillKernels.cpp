@@ -48,7 +48,7 @@ void fillRowsBy(D d, DstRows dst, ByteExtent extent, const PixelPattern &pattern
             body.vectors = {d, pattern, begin};
         }
         storeBytes(d, first, body.dst);
-        if (extent.rowBytes > begin)
+        if (extent.rowBytes > 2 * n)
             walkFrom<kPolicy, Access>(Chunk<n>(), begin, extent.rowBytes - 1, body);
         if (extent.rowBytes != n)
             storeBytes(d, last, body.dst + extent.rowBytes - n);

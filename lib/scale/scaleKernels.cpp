@@ -66,7 +66,7 @@ void scaleNearest(const ScaleJob &job, void *cache) {
         walkNearestRows<NearestEveryOf2>(job);
     else if (step == 4 * kScaleOne)
         walkNearestRows<NearestEveryOf4>(job);
-    else if (step == 8 * kScaleOne && job.x.dstSize >= scaleLongRowBy8(kVectorBytes))
+    else if (step == 8 * kScaleOne && job.x.dstSize >= kScaleLongRowBy8)
         walkNearestRows<NearestEveryOf8>(job);
     else if (canPick(2))
         walkNearestRows<NearestPickedFrom2>(job);

@@ -135,7 +135,7 @@ HWY_INLINE void walkWholeChunks(size_t begin, size_t tail, const Body &body,
                                 [[maybe_unused]] PrefetchDistance distance) {
     constexpr size_t kStep = kPolicy.unroll * kUnits;
     size_t i = begin;
-    for (; kPolicy.unroll == 1 ? i != tail : tail - i >= kStep; i += kStep) {
+    for (; tail - i >= kStep; i += kStep) {
         if constexpr (kPolicy.prefetches)
             body.prefetch(Chunk<kStep>(), i, distance);
         walkTurns<Access, kUnits>(i, body, std::make_index_sequence<kPolicy.unroll>());
