@@ -33,8 +33,8 @@ struct DamagedScreen {
 Part clipped(int32_t x, int32_t y, int32_t width, int32_t height) {
     const int32_t left = std::clamp(x, 0, kWidth), right = std::clamp(x + width, 0, kWidth);
     const int32_t top = std::clamp(y, 0, kHeight), bottom = std::clamp(y + height, 0, kHeight);
-    return {static_cast<uint32_t>(left), static_cast<uint32_t>(top), static_cast<uint32_t>(right - left),
-            static_cast<uint32_t>(bottom - top)};
+    return {static_cast<uint32_t>(left), static_cast<uint32_t>(top),
+            static_cast<uint32_t>(right - left), static_cast<uint32_t>(bottom - top)};
 }
 
 // The client fills a part of its frame buffer.

@@ -151,7 +151,8 @@ void expandPalette(const Image &indexed, Image &colored) {
     std::array<uint32_t, 256> palette = {};
     for (size_t i = 0; i < palette.size(); ++i) {
         const ImageUtilColor &color = indexed.palette[i];
-        palette[i] = 0xFF000000u | uint32_t{color.red} << 16 | uint32_t{color.green} << 8 | color.blue;
+        palette[i] =
+            0xFF000000u | uint32_t{color.red} << 16 | uint32_t{color.green} << 8 | color.blue;
     }
     colored.width = indexed.width;
     colored.height = indexed.height;

@@ -10,7 +10,7 @@ namespace gallery {
 namespace {
 
 constexpr std::array<uint32_t, 8> kRings = {0xFF1B4965, 0xFF2F6690, 0xFF5FA8D3, 0xFFBEE9E8,
-                                          0xFFFFF3B0, 0xFFF6BD60, 0xFFE8590C, 0xFF9E2A2B};
+                                            0xFFFFF3B0, 0xFFF6BD60, 0xFFE8590C, 0xFF9E2A2B};
 
 // Squares within squares, filled in pixels of the given layout; depth 8 stands
 // for indices into kRings.

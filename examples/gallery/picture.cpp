@@ -127,7 +127,8 @@ int32_t textWidth(std::string_view text) {
     return static_cast<int32_t>(text.size()) * kGlyphWidth;
 }
 
-void write(Picture &ground, int32_t x, int32_t y, std::string_view text, uint32_t ink, uint32_t paper) {
+void write(Picture &ground, int32_t x, int32_t y, std::string_view text, uint32_t ink,
+           uint32_t paper) {
     checkInside(ground, x, y, textWidth(text), kGlyphHeight);
     const auto step = static_cast<int32_t>(text.size());
     Raster_BitsToPixels(bitmapOf(text).data(), step, ground.at(x, y), ground.step(), 4,

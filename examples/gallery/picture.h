@@ -14,7 +14,7 @@
 namespace gallery {
 
 inline constexpr uint32_t kWhite = 0xFFFFFFFF, kInk = 0xFF1F2A36, kPale = 0xFFE4E9EE,
-                        kBlue = 0xFF2F6690, kOrange = 0xFFE8590C;
+                          kBlue = 0xFF2F6690, kOrange = 0xFFE8590C;
 
 // Whatever goes wrong ends the program with a message.
 [[noreturn]] void fail(const std::string &what);
@@ -72,7 +72,8 @@ void blend(Picture &ground, const Picture &top, int32_t x, int32_t y);
 Picture premultiplied(const Picture &picture);
 
 // A line of text, every pixel of its box written, and one with only the letters.
-void write(Picture &ground, int32_t x, int32_t y, std::string_view text, uint32_t ink, uint32_t paper);
+void write(Picture &ground, int32_t x, int32_t y, std::string_view text, uint32_t ink,
+           uint32_t paper);
 void stencil(Picture &ground, int32_t x, int32_t y, std::string_view text, uint32_t ink);
 int32_t textWidth(std::string_view text);
 

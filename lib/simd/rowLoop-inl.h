@@ -184,7 +184,9 @@ HWY_INLINE void walkFrom(Chunk<kUnits> chunk, size_t begin, size_t end, const Bo
             if (tail != end)
                 body(chunk, tail, FirstLanes{end - tail});
         } else if constexpr (kUnits > 1) {
-            walkHalves<kUnits / 2>(tail, end, body);
+            // One test for all of them where there are none.
+            if (tail != end)
+                walkHalves<kUnits / 2>(tail, end, body);
         }
     } else if constexpr (kPolicy.tail == Tail::kPartial) {
         if (tail != end)
