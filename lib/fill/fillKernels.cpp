@@ -37,7 +37,7 @@ void fillRowsBy(D d, DstRows dst, ByteExtent extent, const PixelPattern &pattern
     constexpr RowPolicy kPolicy = {.tail = Tail::kNone, .unroll = 6};
     const auto first = pattern.from(d, 0);
     const auto last = pattern.from(d, extent.rowBytes - n);
-    const bool isAligned = extent.rowBytes > 4 * n;
+    const bool isAligned = extent.rowBytes >= 4 * n;
     size_t begin = n;
     FillBody<D> body = {dst.first, {d, pattern, begin}};
     for (size_t y = 0; y < extent.height; ++y) {
