@@ -15,7 +15,10 @@ namespace quillon {
 struct ChannelMasks {
     uint32_t red, green, blue;
 
-    bool operator==(const ChannelMasks &) const = default;
+    // Not defaulted: GCC 14 does not take that for constexpr.
+    constexpr bool operator==(const ChannelMasks &other) const {
+        return red == other.red && green == other.green && blue == other.blue;
+    }
 };
 
 // Masks of the one-byte formats, by depth: red, green, blue.  Depths 3, 6 and 8
