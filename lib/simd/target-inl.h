@@ -70,10 +70,6 @@ inline constexpr bool kHasMaskedStores = QUILLON_X86_AVX512 ||
 // Whether a gather is faster than to load its lanes one by one.
 inline constexpr bool kHasFastGather = QUILLON_X86_AVX512;
 
-// A vector's blocks are 128 bits.  Shuffles across blocks cost more than those
-// within them, so that what can be done by either is worth two forms.
-inline constexpr bool kHasManyBlocks = kVectorBytes > 16;
-
 } // namespace quillon::HWY_NAMESPACE
 HWY_AFTER_NAMESPACE();
 
