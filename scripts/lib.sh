@@ -10,6 +10,8 @@ peerPackages=(libpixman-1-dev libyuv-dev libopencv-imgproc-dev libswscale-dev li
 formatPackages=(clang-format)
 clangPackages=(clang libclang-rt-dev)
 lintPackages=(clang clang-tidy)
+arm64Packages=(g++-aarch64-linux-gnu qemu-user)
+arm64Libraries=(libpng-dev libhwy-dev libgtest-dev) # for that processor
 
 say() { printf '\n== %s\n' "$*"; }
 fail() {

@@ -40,7 +40,8 @@ TEST(Targets, areThoseOfTheLibrary) {
     const auto indexOfKernel = [] {
         uint8_t pixel = 0;
         Raster_RectFill(&pixel, 1, 1, 7, 0, 0, 1, 1);
-        EXPECT_TRUE(hwy::GetChosenTarget().IsInitialized());
+        // A single target is not chosen.
+        EXPECT_EQ(hwy::GetChosenTarget().IsInitialized(), kTargets.size() > 1);
         return hwy::GetChosenTarget().GetIndex();
     };
     std::set<size_t> indices;

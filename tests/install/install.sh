@@ -1,10 +1,12 @@
 #!/bin/bash
 # Installs into an empty folder, moves the tree, and builds a program against it
 # through pkg-config, as C and as C++, and through find_package.
-# Usage: install.sh BUILD_DIR CC CXX CMAKE_GENERATOR
+# Usage: install.sh BUILD_DIR CC CXX CMAKE_GENERATOR TOOLCHAIN_FILE SYSROOT [EMULATOR...]
+# where TOOLCHAIN_FILE and SYSROOT are empty but in a cross build.
 set -euo pipefail
 here=$(cd "$(dirname "$0")" && pwd)
-buildDir=$1 cc=$2 cxx=$3 generator=$4
+buildDir=$1 generator=$4 toolchain=$5
+cc=("$2" ${6:+--sysroot="$6"}) cxx=("$3" ${6:+--sysroot="$6"}) emulator=("${@:7}")
 work=$(mktemp -d)
 trap 'rm -rf "$work"' EXIT
 
@@ -14,11 +16,11 @@ libDir=$(dirname "$(find "$work/moved" -name libquillon.so)")
 
 strict=(-fsyntax-only -Wall -Wextra -Wpedantic -Werror -I"$work/moved/include/quillon-1")
 everyStandard() { # FILE, by itself
-    for standard in c99 c11 c17; do
-        "$cc" -std=$standard "${strict[@]}" -x c -include "$1" - <<<"int unused;"
+    for standard in c99 c11 c17 c2x; do
+        "${cc[@]}" -std=$standard "${strict[@]}" -x c -include "$1" - <<<"int unused;"
     done
-    for standard in c++11 c++14 c++17 c++20; do
-        "$cxx" -std=$standard "${strict[@]}" -x c++ -include "$1" - <<<"int unused;"
+    for standard in c++11 c++14 c++17 c++20 c++2b; do
+        "${cxx[@]}" -std=$standard "${strict[@]}" -x c++ -include "$1" - <<<"int unused;"
     done
 }
 
@@ -34,16 +36,17 @@ echo "pkg-config"
 export PKG_CONFIG_PATH=$libDir/pkgconfig
 # No other .pc file may be needed.
 read -ra flags <<<"$(PKG_CONFIG_LIBDIR=$PKG_CONFIG_PATH pkg-config --cflags --libs 'quillon >= 1.0')"
-"$cc" -std=c99 -x c -Wall -Werror "$here/consumer/client.c" -o "$work/inC" "${flags[@]}"
-"$cxx" -std=c++17 -x c++ -Wall -Werror "$here/consumer/client.c" -o "$work/inCpp" "${flags[@]}"
-LD_LIBRARY_PATH=$libDir "$work/inC"
-LD_LIBRARY_PATH=$libDir "$work/inCpp"
+"${cc[@]}" -std=c99 -x c -Wall -Werror "$here/consumer/client.c" -o "$work/inC" "${flags[@]}"
+"${cxx[@]}" -std=c++17 -x c++ -Wall -Werror "$here/consumer/client.c" -o "$work/inCpp" "${flags[@]}"
+for program in "$work"/inC{,pp}; do
+    LD_LIBRARY_PATH=$libDir "${emulator[@]}" "$program"
+done
 
 echo "find_package"
 # Nobody who uses libquillon may be made to look for what it is built of.
 cmake -S "$here/consumer" -B "$work/build" -G "$generator" \
-    -DCMAKE_C_COMPILER="$cc" -DCMAKE_PREFIX_PATH="$work/moved" -DCMAKE_DISABLE_FIND_PACKAGE_PNG=ON \
+    -DCMAKE_C_COMPILER="${cc[0]}" ${toolchain:+-DCMAKE_TOOLCHAIN_FILE="$toolchain"} -DCMAKE_PREFIX_PATH="$work/moved" -DCMAKE_DISABLE_FIND_PACKAGE_PNG=ON \
     -DCMAKE_DISABLE_FIND_PACKAGE_PkgConfig=ON >"$work/log" ||
     { cat "$work/log"; exit 1; }
 cmake --build "$work/build" >"$work/log" || { cat "$work/log"; exit 1; }
-"$work/build/client"
+"${emulator[@]}" "$work/build/client"

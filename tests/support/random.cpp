@@ -43,4 +43,9 @@ std::optional<uint64_t> onlyCase() {
     return number;
 }
 
+uint64_t thinned(uint64_t count) {
+    static const uint64_t share = numberFrom("QUILLON_TEST_THINNING").value_or(1);
+    return (count + share - 1) / share;
+}
+
 } // namespace quillon::test

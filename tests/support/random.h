@@ -3,7 +3,8 @@
 //
 //     QUILLON_TEST_SEED=<seed> QUILLON_TEST_CASE=<number> <test program>
 //
-// Another seed gives other cases.
+// Another seed gives other cases.  QUILLON_TEST_THINNING=<n> runs one n-th of them,
+// where the processor is an emulated one.
 #pragma once
 
 #include <gtest/gtest.h>
@@ -67,6 +68,7 @@ private:
 
 uint64_t baseSeed();                // QUILLON_TEST_SEED, or a fixed one
 std::optional<uint64_t> onlyCase(); // QUILLON_TEST_CASE
+uint64_t thinned(uint64_t count);   // QUILLON_TEST_THINNING
 
 // What is running, for the report of a crash (a fence that bit).
 struct Running {
@@ -81,7 +83,8 @@ template <class Run>
 void forEachCase(uint64_t count, const Run &run) {
     reportCrashes();
     const std::optional<uint64_t> only = onlyCase();
-    for (uint64_t number = only.value_or(0); number < (only ? *only + 1 : count); ++number) {
+    for (uint64_t number = only.value_or(0); number < (only ? *only + 1 : thinned(count));
+         ++number) {
         running.number = number;
         // Mixed once more, lest neighbouring cases share their numbers.
         Random random(Random(baseSeed() + number).bits());
