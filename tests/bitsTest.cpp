@@ -1,100 +1,24 @@
-// Bit and stencil expansion against their reference.
-
-#include "support/surfaces.h"
+#include "operations.h"
+#include "support/judge.h"
 #include <quillon/raster.h>
 
 #include <atomic>
+#include <gtest/gtest.h>
 #include <thread>
 
 namespace quillon::test {
 namespace {
 
-using Opaque = decltype(&RasterBitsToPixels8);
-using Stencil = decltype(&RasterBitsToPixelsStencil8);
-constexpr Opaque kOpaque[] = {RasterBitsToPixels8, RasterBitsToPixels16, RasterBitsToPixels24,
-                              RasterBitsToPixels32};
-constexpr Stencil kStencil[] = {RasterBitsToPixelsStencil8, RasterBitsToPixelsStencil16,
-                                RasterBitsToPixelsStencil24, RasterBitsToPixelsStencil32};
-
-// By the general function, or the one that has the pixel size in its name.  Widths
-// below 1 and unknown pixel sizes leave nothing to do.
-Operation expansion(Random &random, bool isStencil, bool isIdle) {
-    const uint32_t member = random.below(4), pixel = random.word(), background = random.word();
-    const bool isNamed = random.oneIn(2), isNegative = isIdle && (isNamed || random.oneIn(2));
-    const int32_t bytes = isIdle && !isNegative
-                              ? random.oneOf({0, 5, -1, 8, 0x101, INT32_MIN, INT32_MAX})
-                              : static_cast<int32_t>(member + 1);
-    return {(isStencil ? "stencil " : "opaque ") + std::to_string(bytes),
-            {{.bytes = member + 1, .isTouched = !isIdle},
-             {.bytes = 0, .isTouched = !isIdle, .runs = {0x00, 0xFF}}},
-            [=](const Surfaces &at, Size size) {
-                const auto expand = [&](auto function, auto... rest) {
-                    function(at[1].first, at[1].signedStride(), at[0].first, at[0].signedStride(),
-                             rest...);
-                };
-                const int32_t width =
-                    static_cast<int32_t>(size.width) | (isNegative ? INT32_MIN : 0);
-                if (isStencil && isNamed)
-                    expand(kStencil[member], width, size.height, pixel);
-                else if (isStencil)
-                    expand(Raster_BitsToPixelsStencil, bytes, width, size.height, pixel);
-                else if (isNamed)
-                    expand(kOpaque[member], width, size.height, pixel, background);
-                else
-                    expand(Raster_BitsToPixels, bytes, width, size.height, pixel, background);
-            },
-            [=](const Pixels &old) {
-                const uint32_t clear = isStencil ? old[0] : background;
-                return old[1] != 0 ? pixel : clear;
-            },
-            Walk::kForward,
-            false};
-}
-
-Operation drawExpansion(Random &random) {
-    return expansion(random, random.oneIn(2), random.oneIn(64));
-}
-
 TEST(Bits, matchesReference) {
-    holdToReference(16000, drawExpansion);
+    forEachCase(16000, [](Random &random) { tryBits(random); });
 }
 
 TEST(Bits, matchesReferenceOnLargeSurfaces) {
-    holdToReference(24, drawExpansion, Shape::kLarge);
+    forEachCase(24, [](Random &random) { tryBits(random, Shape::kLarge); });
 }
 
-// Pixels under clear bits lie beyond a fence.
 TEST(Stencil, touchesNoPageWhereAllBitsAreClear) {
-    forEachCase(6000, [](Random &random) {
-        const Operation call = expansion(random, true, false);
-        const uint32_t bytes = call.parts[0].bytes, inside = random.below(150);
-        const uint32_t outside = random.below(150), width = inside + outside;
-        const bool isAhead = random.oneIn(2);
-        const FencedBuffer page(size_t{inside} * bytes, isAhead ? FencedBuffer::Flush::kBefore
-                                                                : FencedBuffer::Flush::kBehind);
-        std::vector<uint8_t> bitmap(width / 8 + 1), before(page.size());
-        random.fill(bitmap.data(), bitmap.size());
-        plantRuns(random, bitmap.data(), bitmap.size(), 1, {0x00, 0xFF});
-        random.fill(before.data(), before.size());
-        std::vector<uint8_t> expected = before;
-        for (uint32_t x = 0, i = 0; x < width; ++x) {
-            const auto bit = static_cast<uint8_t>(0x80 >> x % 8);
-            if (isAhead ? x < outside : x >= inside)
-                bitmap[x / 8] &= static_cast<uint8_t>(~bit);
-            else if (const uint32_t pixel = call.reference({0, 1}); (bitmap[x / 8] & bit) != 0)
-                std::memcpy(&expected[bytes * i++], &pixel, bytes);
-            else
-                ++i;
-        }
-        forEachTarget([&] {
-            std::copy(before.begin(), before.end(), page.data());
-            uint8_t *const first = page.data() - (isAhead ? size_t{outside} * bytes : 0);
-            call.library({{nullptr, first, 0, 0, 0}, {nullptr, bitmap.data(), 0, 0, 0}},
-                         {width, 1});
-            EXPECT_TRUE(std::equal(page.data(), page.end(), expected.begin()))
-                << call.name << ", " << inside << " pixels inside, " << outside << " outside";
-        });
-    });
+    forEachCase(6000, tryStencilBesidePage);
 }
 
 // Pixels under clear bits belong to others: what another thread writes there is
@@ -121,7 +45,8 @@ TEST(Stencil, leavesClearPixelsToAnotherThread) {
         while (rounds < 0)
             std::this_thread::yield();
         while (rounds < kRounds)
-            kStencil[bytes - 1](bitmap.data(), 0, surface.data(), 0, kWidth, 1, 0x12345678);
+            Raster_BitsToPixelsStencil(bitmap.data(), 0, surface.data(), 0,
+                                       static_cast<int32_t>(bytes), kWidth, 1, 0x12345678);
         other.join();
         EXPECT_EQ(lost, 0) << bytes << " bytes per pixel";
     };

@@ -1,30 +1,19 @@
-// The blend against its reference.
-
+#include "operations.h"
 #include "reference/pixels.h"
-#include "support/surfaces.h"
+#include "support/judge.h"
 #include <quillon/raster.h>
+
+#include <gtest/gtest.h>
 
 namespace quillon::test {
 namespace {
 
-// Runs of pixels that are clear, without alpha but not clear, or opaque.
-Operation drawBlend(Random &random) {
-    return {"blend",
-            {{4}, {.bytes = 4, .runs = {0, random.word() >> 8, random.word() | 0xFF000000}}},
-            [](const Surfaces &at, Size size) {
-                Raster_AlphaBlendOver(at[0].buffer, at[0].x, at[0].y, at[0].signedStride(),
-                                      at[1].buffer, at[1].x, at[1].y, at[1].signedStride(),
-                                      size.width, size.height);
-            },
-            [](const Pixels &old) { return reference::blended(old[1], old[0]); }};
-}
-
 TEST(Blend, matchesReference) {
-    holdToReference(12000, drawBlend);
+    forEachCase(12000, [](Random &random) { tryBlend(random); });
 }
 
 TEST(Blend, matchesReferenceOnLargeSurfaces) {
-    holdToReference(12, drawBlend, Shape::kLarge);
+    forEachCase(12, [](Random &random) { tryBlend(random, Shape::kLarge); });
 }
 
 // Every alpha over every destination value.

@@ -8,6 +8,7 @@
 #include <bit>
 #include <cfloat>
 #include <cmath>
+#include <gtest/gtest.h>
 
 namespace quillon::test {
 namespace {

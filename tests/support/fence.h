@@ -4,10 +4,12 @@
 
 #include <cstddef>
 #include <cstdint>
+#include <memory>
 
 namespace quillon::test {
 
 size_t pageSize();
+size_t wholePages(size_t size); // rounded up to them
 
 // Inaccessible address space, of which parts can be opened.  Takes no memory
 // until it is touched, so it may be far larger than the machine.
@@ -35,7 +37,7 @@ public:
     enum class Flush { kBehind, kBefore }; // where the page lies that the block touches
 
     explicit FencedBuffer(size_t size, Flush flush = Flush::kBehind);
-    ~FencedBuffer(); // fails the test if a canary has lost its value
+    ~FencedBuffer(); // looks whether the canaries kept their value
     FencedBuffer(const FencedBuffer &) = delete;
     FencedBuffer &operator=(const FencedBuffer &) = delete;
 
@@ -44,8 +46,8 @@ public:
     size_t size() const { return size_; }
 
 private:
-    Mapping mapping_;
-    uint8_t *open_; // the accessible pages
+    std::unique_ptr<Mapping> mapping_; // from those that are free
+    uint8_t *open_;                    // the accessible pages
     size_t openSize_;
     uint8_t *data_;
     size_t size_;

@@ -1,9 +1,10 @@
 #include "support/surfaces.h"
 
-#include "support/faults.h"
+#include "support/judge.h"
 
 #include <algorithm>
 #include <cstring>
+#include <sstream>
 
 namespace quillon::test {
 namespace {
@@ -15,10 +16,40 @@ constexpr uint32_t kMost = UINT32_MAX;
 // increments can have upwards.
 constexpr size_t kFar = size_t{1} << 31;
 
-// Sources may have four times the bytes per pixel.
-std::array<TwinMemory, 4> four(size_t pages, size_t runs, size_t spacing, size_t srcPages) {
-    const auto one = [&](size_t size) { return TwinMemory(size * pageSize(), runs, spacing); };
-    return {one(pages), one(srcPages), one(pages), one(pages)};
+// Memory of each surface; made when a case first has use for it.
+using Home = std::array<TwinMemory, 4>;
+
+// The same sizes whatever the pages of the system: cases are drawn from them.
+constexpr size_t kPage = 4096;
+
+Home makeHome(size_t runPages, size_t srcPages, size_t runs = 1, size_t spacing = 0) {
+    const auto one = [&](size_t pages) { return TwinMemory(pages * kPage, runs, spacing); };
+    return {one(runPages), one(srcPages), one(runPages), one(runPages)};
+}
+
+Home &homeOf(Shape shape) {
+    switch (shape) {
+    case Shape::kLarge: { // sources may have four times the bytes per pixel
+        static Home home = makeHome(450, 1800);
+        return home;
+    }
+    case Shape::kLongRows: {
+        static Home home = makeHome(6, 6);
+        return home;
+    }
+    case Shape::kFenced: {
+        static Home home = makeHome(1, 1, kFencedRows, 2 * pageSize());
+        return home;
+    }
+    case Shape::kFarApart: {
+        static Home home = makeHome(1, 1, kFencedRows, kFar);
+        return home;
+    }
+    default: {
+        static Home home = makeHome(2, 2);
+        return home;
+    }
+    }
 }
 
 int64_t wholePixels(int64_t stride, const Part &part) {
@@ -36,7 +67,7 @@ struct Reach {
 struct Case {
     const Operation &operation;
     Shape shape;
-    std::array<TwinMemory, 4> &home; // for each surface
+    Home &home;
     Size size;
     bool isNear; // surfaces begin within 128 bytes of each other
     Surfaces at{operation.parts.size()};
@@ -218,31 +249,26 @@ void walkModel(const Case &c) {
     }
 }
 
-// The call on every instruction set.
-void callLibrary(const Case &c) {
+std::string description(const Case &c) {
     static constexpr const char *kShapes[] = {"empty",     "scattered", "overlapping", "fenced",
                                               "far apart", "long rows", "large"};
-    for (const int64_t target : kTargets) {
-        const OnTarget on(target);
+    std::ostringstream text;
+    text << c.operation.name << ", " << kShapes[static_cast<size_t>(c.shape)] << ", "
+         << c.size.width << " x " << c.size.height;
+    for (const Surface &surface : c.at)
+        text << "; at " << surface.x << ", " << surface.y << ", stride " << surface.stride
+             << ", address " << uintptr_t(surface.first);
+    return text.str();
+}
+
+void callLibrary(const Case &c) {
+    forEachTarget([&] {
         for (TwinMemory *memory : c.memories)
             memory->restore();
-        {
-            const MemoryFault none(UINT64_MAX);
-            c.operation.library(c.at, c.size);
-            EXPECT_EQ(none.requestsLeft, UINT64_MAX) << "memory was asked for";
-        }
+        withoutMemory([&] { c.operation.library(c.at, c.size); });
         for (const TwinMemory *memory : c.memories)
-            EXPECT_TRUE(memory->agrees());
-        if (!testing::Test::HasFailure())
-            continue;
-        ADD_FAILURE() << c.operation.name << ", " << kShapes[static_cast<size_t>(c.shape)] << ", "
-                      << c.size.width << " x " << c.size.height << " on "
-                      << hwy::TargetName(target);
-        for (const Surface &surface : c.at)
-            ADD_FAILURE() << "at " << surface.x << ", " << surface.y << ", stride "
-                          << surface.stride << ", address " << uintptr_t(surface.first);
-        return;
-    }
+            memory->compare([&] { return description(c); });
+    });
 }
 
 // Nothing is looked at when there is nothing to do, however large the rest.
@@ -262,11 +288,12 @@ void drawNothing(Random &random, Case &c) {
 
 TwinMemory::TwinMemory(size_t runBytes, size_t runs, size_t spacing)
     : runBytes_(runBytes), runs_(runs), spacing_(spacing),
-      pages_((runs - 1) * spacing + runBytes + 2 * pageSize()), model_(pages_.size()),
+      first_(pageSize() + wholePages(runBytes) - runBytes),
+      pages_((runs - 1) * spacing + wholePages(runBytes) + 2 * pageSize()), model_(pages_.size()),
       kept_(runs * runBytes) {
     for (size_t i = 0; i < runs; ++i)
         for (Mapping *mapping : {&pages_, &model_})
-            mapping->open(pageSize() + i * spacing, runBytes);
+            mapping->open(pageSize() + i * spacing, wholePages(runBytes));
 }
 
 void TwinMemory::refill(Random &random, uint32_t low, uint32_t count) {
@@ -292,29 +319,15 @@ void TwinMemory::restore() {
         std::copy_n(&kept_[i * runBytes_], runBytes_, run(i));
 }
 
-testing::AssertionResult TwinMemory::agrees() const {
-    for (size_t i = 0; i < runs_; ++i) {
-        const uint8_t *bytes = run(i), *model = inModel(run(i));
-        if (std::memcmp(bytes, model, runBytes_) == 0)
-            continue;
-        const auto at = std::mismatch(bytes, bytes + runBytes_, model).first - bytes;
-        return testing::AssertionFailure() << "byte " << at << " of run " << i << " is "
-                                           << int{bytes[at]} << ", should be " << int{model[at]};
-    }
-    return testing::AssertionSuccess();
+void TwinMemory::compare(const std::function<std::string()> &description) const {
+    for (size_t i = 0; i < runs_; ++i)
+        test::compare(run(i), inModel(run(i)), runBytes_, description);
 }
 
-Arena::Arena()
-    : blocks_(four(6, 1, 0, 6)), largeBlocks_(four(450, 1, 0, 1800)),
-      rows_(four(1, kFencedRows, 2 * pageSize(), 1)), farRows_(four(1, kFencedRows, kFar, 1)) {}
-
-void Arena::check(Random &random, const Operation &operation, std::optional<Shape> given) {
+void tryOperation(Random &random, const Operation &operation, std::optional<Shape> given) {
     const bool isIdle = !operation.parts[0].isTouched;
     const Shape shape = isIdle ? Shape::kEmpty : given.value_or(drawShape(random, operation));
-    auto &home = shape == Shape::kLarge      ? largeBlocks_
-                 : shape == Shape::kFarApart ? farRows_
-                 : shape == Shape::kFenced   ? rows_
-                                             : blocks_;
+    Home &home = homeOf(shape);
     const Size size = drawSize(random, shape, home[0], operation.parts[0]);
     const bool isNear = shape == Shape::kOverlapping || (shape == Shape::kLarge && random.oneIn(2));
     Case c = {operation, shape, home, size, isNear && operation.mayOverlap};

@@ -3,16 +3,17 @@
 //
 // A case is one call.  From its number are drawn
 //
-//     the operation  by the test: a call with all its arguments but the surfaces
+//     the operation  by operations/: a call with all its arguments but the surfaces
 //                    and the size, and the reference for its pixels;
 //     a Shape        the size, and how the surfaces lie in memory;
 //     contents       random bytes, with runs of the pixels that an operation may
-//                    handle in a way of their own (Part::runs).
+//                    handle in a way of its own (Part::runs).
 //
 // The memory is fenced and has a model, through which the reference walks pixel by
 // pixel.  The call is made on each instruction set, and every time all of the
 // memory has to equal the model: bytes beside the rectangle count as well.  No
-// call may allocate.
+// call may allocate.  (So it is in the tests; what the fuzzers and the fingerprint
+// do with a case is in judge.h.)
 //
 // A failure names the operation, the shape, the surfaces and the instruction set,
 // and ends with the variables that run this case alone, as does a crash (a fence
@@ -22,11 +23,12 @@
 #pragma once
 
 #include "support/fence.h"
-#include "support/targets.h"
+#include "support/random.h"
 
 #include <array>
 #include <cstdint>
 #include <functional>
+#include <optional>
 #include <string>
 #include <vector>
 
@@ -54,12 +56,13 @@ enum class Shape {
     kLarge,
 };
 
-// Runs of pages between inaccessible ones, and their model.
+// Runs of bytes, each up to an inaccessible page, and behind one where it is of whole
+// pages; and their model.
 class TwinMemory {
 public:
-    TwinMemory(size_t runBytes, size_t runs, size_t spacing); // in whole pages
+    TwinMemory(size_t runBytes, size_t runs, size_t spacing); // whole pages from run to run
 
-    uint8_t *run(size_t index) const { return pages_.data() + pageSize() + index * spacing_; }
+    uint8_t *run(size_t index) const { return pages_.data() + first_ + index * spacing_; }
     uint8_t *nowhere() const { return pages_.data(); }
     size_t runBytes() const { return runBytes_; }
     int64_t spacing() const { return static_cast<int64_t>(spacing_); }
@@ -71,10 +74,10 @@ public:
     void restore();
 
     uint8_t *inModel(uint8_t *address) const { return model_.data() + (address - pages_.data()); }
-    testing::AssertionResult agrees() const; // with the model
+    void compare(const std::function<std::string()> &description) const; // with the model
 
 private:
-    size_t runBytes_, runs_, spacing_;
+    size_t runBytes_, runs_, spacing_, first_;
     Mapping pages_, model_;
     std::vector<uint8_t> kept_;
 };
@@ -138,23 +141,8 @@ struct Operation {
     bool isOneCorner = false; // the coordinates are the same on all surfaces
 };
 
-class Arena {
-public:
-    Arena();
-
-    // One case, of a random shape other than kLarge unless one is given.
-    void check(Random &random, const Operation &operation, std::optional<Shape> shape = {});
-
-private:
-    std::array<TwinMemory, 4> blocks_, largeBlocks_, rows_, farRows_; // for each surface
-};
-
-// Random operations, by draw(random).
-template <class Draw>
-void holdToReference(uint64_t cases, const Draw &draw, std::optional<Shape> shape = {}) {
-    Arena arena;
-    forEachCase(cases, [&](Random &random) { arena.check(random, draw(random), shape); });
-}
+// Tries one case, of a random shape other than kLarge unless one is given.
+void tryOperation(Random &random, const Operation &operation, std::optional<Shape> shape = {});
 
 // Overwrites pixels by runs of one of the values each, with some left between: of
 // one or two pixels, so that vectors are mixed, or of many.
