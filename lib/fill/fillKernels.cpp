@@ -18,40 +18,65 @@ namespace {
 
 // ---- Fill -----------------------------------------------------------------
 
+// A row whose first and last vector are stored as they come and overlap those
+// between, which are aligned.
 template <class D>
 struct FillBody {
-    uint8_t *dst;
-    PatternVectors<D> vectors; // from the first whole chunk on
+    const PixelPattern &pattern;
+    uint8_t *dst = nullptr;
+    size_t begin = kBytesOf<D>; // of the aligned vectors
+    PatternVectors<D> vectors = {D(), pattern, begin};
 
     template <class C, class Access>
     HWY_INLINE void operator()(C /*chunk*/, size_t i, Access access) const {
         access.store(D(), vectors.template get<C::kTurn>(), dst + i);
+        keepStoreOrder();
+    }
+
+    HWY_INLINE void moveTo(uint8_t *row) {
+        dst = row;
+        const size_t newBegin = kBytesOf<D> - reinterpret_cast<uintptr_t>(row) % kBytesOf<D>;
+        if (newBegin == begin)
+            return;
+        if (!pattern.isSameAt(begin, newBegin))
+            vectors = {D(), pattern, newBegin};
+        begin = newBegin;
     }
 };
 
-// Rows of at least one vector.  The first and the last vector are stored as they
-// come and may overlap those between, which are aligned in rows of some length.
-template <class Access, class D>
-void fillRowsBy(D d, DstRows dst, ByteExtent extent, const PixelPattern &pattern) {
+// Rows that kVectors vectors hold, of which the last may overlap the one before.
+template <size_t kVectors, class D>
+void fillShortRows(D d, DstRows dst, ByteExtent extent, const PixelPattern &pattern) {
     constexpr size_t n = kBytesOf<D>;
-    constexpr RowPolicy kPolicy = {.tail = Tail::kNone, .unroll = 6};
     const auto first = pattern.from(d, 0);
     const auto last = pattern.from(d, extent.rowBytes - n);
-    const bool isAligned = extent.rowBytes >= 4 * n;
-    size_t begin = n;
-    FillBody<D> body = {dst.first, {d, pattern, begin}};
+    FillBody<D> body = {pattern};
     for (size_t y = 0; y < extent.height; ++y) {
-        body.dst = dst.row(y);
-        const size_t toAligned = n - reinterpret_cast<uintptr_t>(body.dst) % n;
-        if (isAligned && begin != toAligned) {
-            begin = toAligned;
-            body.vectors = {d, pattern, begin};
-        }
+        body.moveTo(dst.row(y));
         storeBytes(d, first, body.dst);
-        if (extent.rowBytes > 2 * n)
-            walkFrom<kPolicy, Access>(Chunk<n>(), begin, extent.rowBytes - 1, body);
-        if (extent.rowBytes != n)
+        if constexpr (kVectors > 2) {
+            walkTurns<Unaligned, n>(body.begin, body, std::make_index_sequence<kVectors - 2>());
+            if (body.begin + (kVectors - 1) * n < extent.rowBytes)
+                body(Chunk<n, kVectors - 2>(), body.begin + (kVectors - 2) * n, Unaligned());
+        }
+        if constexpr (kVectors > 1)
             storeBytes(d, last, body.dst + extent.rowBytes - n);
+    }
+}
+
+template <class Access>
+void fillLongRows(DstRows dst, ByteExtent extent, const PixelPattern &pattern) {
+    constexpr RowPolicy kPolicy = {.tail = Tail::kNone, .unroll = 6};
+    constexpr Chunk<kVectorBytes> kChunk;
+    const Widest<uint32_t> d;
+    const auto first = pattern.from(d, 0);
+    const auto last = pattern.from(d, extent.rowBytes - kVectorBytes);
+    FillBody<Widest<uint32_t>> body = {pattern};
+    for (size_t y = 0; y < extent.height; ++y) {
+        body.moveTo(dst.row(y));
+        storeBytes(d, first, body.dst);
+        walkFrom<kPolicy, Access>(kChunk, body.begin, extent.rowBytes - 1, body);
+        storeBytes(d, last, body.dst + extent.rowBytes - kVectorBytes);
     }
 }
 
@@ -73,14 +98,15 @@ void fillKernel(DstRows dst, Extent extent, int32_t bytesPerPixel, uint32_t pixe
         bytes = asOneRow(bytes);
     const PixelPattern pattern(pixel, bytesPerPixel);
     if (isNonTemporal(bytes)) {
-        fillRowsBy<NonTemporal>(Widest<uint32_t>(), dst, bytes, pattern);
+        fillLongRows<NonTemporal>(dst, bytes, pattern);
         hwy::FlushStream();
+    } else if (bytes.rowBytes > kFillShortVectors * kVectorBytes) {
+        fillLongRows<Unaligned>(dst, bytes, pattern);
     } else if (bytes.rowBytes < 4) {
         fillFewBytes(dst, bytes, pattern);
     } else {
-        withWidestChunk<kVectorBytes, 64, 32, 16, 8, 4>(bytes.rowBytes, [&](auto chunk) HWY_ATTR {
-            const hn::CappedTag<uint32_t, chunk.kUnits / 4> d;
-            fillRowsBy<Unaligned>(d, dst, bytes, pattern);
+        withShortRow<kFillShortVectors>(bytes.rowBytes, [&](auto d, auto vectors) HWY_ATTR {
+            fillShortRows<vectors>(d, dst, bytes, pattern);
         });
     }
 }

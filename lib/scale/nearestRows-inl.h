@@ -156,10 +156,26 @@ private:
 
 // ---- Steps of a few pixels ------------------------------------------------
 
-// Steps of up to kWindows pixels: those in front of the last pixel or, with kToEnd,
-// any.  srcSize is kWindows chunks or more.
-template <uint32_t kWindows, bool kToEnd>
+// Steps of up to kWindows pixels.  srcSize is kWindows chunks or more.
+template <uint32_t kWindows>
 struct NearestBody {
+    uint8_t *dst;
+    const uint8_t *src;
+    uint32_t start, step;
+
+    template <class C, class Access>
+    HWY_INLINE void operator()(C /*chunk*/, size_t i, Access access) const {
+        const PixelTag<C> d;
+        const uint32_t first = start + static_cast<uint32_t>(i) * step;
+        const auto index = hn::ShiftRight<16>(positionsFrom(d, first & 0xFFFF, step));
+        const uint8_t *window = src + size_t{4} * (first >> 16);
+        access.store(d, pickFromWindows<kWindows>(d, window, index), dst + 4 * i);
+    }
+};
+
+// The same where windows or positions may reach past the end of the row.
+template <uint32_t kWindows>
+struct NearestToEndBody {
     static constexpr size_t kDstBytes = 4;
     uint8_t *dst;
     const uint8_t *src;
@@ -170,29 +186,47 @@ struct NearestBody {
         const PixelTag<C> d;
         const uint32_t first = start + static_cast<uint32_t>(i) * step;
         const uint32_t base = std::min(first >> 16, srcSize - kWindows * uint32_t{C::kUnits});
-        auto index = hn::ShiftRight<16>(positionsFrom(d, first - (base << 16), step));
-        if constexpr (kToEnd)
-            index = hn::Min(index, hn::Set(d, srcSize - 1 - base));
+        const auto index = hn::Min(hn::ShiftRight<16>(positionsFrom(d, first - (base << 16), step)),
+                                   hn::Set(d, srcSize - 1 - base));
         access.store(d, pickFromWindows<kWindows>(d, src + size_t{4} * base, index), dst + 4 * i);
     }
 };
 
 template <uint32_t kWindows, class Access>
-struct NearestPicked : RasterScaleRowNearest {
-    using RasterScaleRowNearest::RasterScaleRowNearest;
+class NearestPicked {
+public:
+    explicit NearestPicked(const ScaleAxis &axis)
+        : start_(axis.start), step_(axis.step), srcSize_(axis.srcSize), count_(axis.dstSize),
+          inner_(innerOf(axis)) {}
 
     HWY_INLINE void operator()(uint8_t *dst, const uint8_t *src) const {
         constexpr RowPolicy kInner = {.tail = Tail::kNone};
-        const Chunk<kVectorPixels> chunk;
-        const NearestBody<kWindows, true> toEnd = {dst, src, start_, step_, srcSize_};
-        if (srcSize_ < kWindows * kVectorPixels || count_ < kVectorPixels)
+        constexpr Chunk<kVectorPixels> kChunk;
+        const NearestToEndBody<kWindows> toEnd = {dst, src, start_, step_, srcSize_};
+        if (srcSize_ < kWindowPixels || count_ < kVectorPixels)
             return walkPixels(count_, toEnd, srcSize_ / kWindows);
         if constexpr (std::is_same_v<Access, NonTemporal>)
-            return walkAlignedRow<NonTemporal>(chunk, count_, toEnd);
-        const NearestBody<kWindows, false> inside = {dst, src, start_, step_, srcSize_};
-        walkFrom<kInner, Unaligned>(chunk, 0, inner_, inside);
-        walkFrom<RowPolicy{}, Unaligned>(chunk, inner_ - inner_ % kVectorPixels, count_, toEnd);
+            return walkAlignedRow<NonTemporal>(kChunk, count_, toEnd);
+        walkFrom<kInner, Unaligned>(kChunk, 0, inner_,
+                                    NearestBody<kWindows>{dst, src, start_, step_});
+        walkFrom<RowPolicy{}, Unaligned>(kChunk, inner_, count_, toEnd);
     }
+
+private:
+    static constexpr uint32_t kWindowPixels = kWindows * uint32_t{kVectorPixels};
+
+    // The pixels of those whole chunks whose windows lie in the source row.
+    static uint32_t innerOf(const ScaleAxis &axis) {
+        if (axis.srcSize < kWindowPixels)
+            return 0;
+        const uint32_t end = (axis.srcSize - kWindowPixels + 1) << 16;
+        const uint32_t chunks = (stepsBefore(axis.start, end, axis.step) + kVectorPixels - 1) /
+                                uint32_t{kVectorPixels};
+        return std::min(chunks, axis.dstSize / uint32_t{kVectorPixels}) * uint32_t{kVectorPixels};
+    }
+
+    uint32_t start_, step_, srcSize_, count_;
+    uint32_t inner_;
 };
 
 // ---- Steps of 2, 4 and 8 pixels -------------------------------------------

@@ -101,6 +101,24 @@ HWY_INLINE void withWidestChunk(size_t count, const Use &use) {
     }
 }
 
+// Rows of 4 bytes to kMostVectors of the widest vectors: calls use with the tag of
+// the widest vectors that fit, and with how many of them hold the row, the last of
+// which may overlap the one before.
+template <size_t kMostVectors, class Use>
+HWY_INLINE void withShortRow(size_t rowBytes, const Use &use) {
+    withWidestChunk<kVectorBytes, 64, 32, 16, 8, 4>(rowBytes, [&](auto chunk) HWY_ATTR {
+        constexpr size_t n = chunk.kUnits;
+        const hn::CappedTag<uint32_t, n / 4> d;
+        const size_t vectors = (rowBytes + n - 1) / n;
+        const auto useOf = [&]<size_t... kLess>(std::index_sequence<kLess...>) HWY_ATTR {
+            (void)((vectors == kLess + 1 &&
+                    (use(d, std::integral_constant<size_t, kLess + 1>()), true)) ||
+                   ...);
+        };
+        useOf(std::make_index_sequence<n == kVectorBytes ? kMostVectors : 2>());
+    });
+}
+
 // The rest of a row of which less than 2 * kUnits units are left, each smaller
 // chunk at most once.
 template <size_t kUnits, class Body>

@@ -29,6 +29,14 @@ HWY_INLINE hn::Vec<D> lookupInTwo(D d, hn::Vec<D> low, hn::Vec<D> high, hn::Vec<
         return {_mm256_permutex2var_epi32(low.raw, index.raw, high.raw)};
     else if constexpr (n == 4)
         return {_mm_permutex2var_epi32(low.raw, index.raw, high.raw)};
+#elif QUILLON_X86_AVX2
+    if constexpr (n == 8) {
+        // By the sign bit.
+        const auto isHigh = _mm256_castsi256_ps(_mm256_slli_epi32(index.raw, 28));
+        const auto a = _mm256_castsi256_ps(_mm256_permutevar8x32_epi32(low.raw, index.raw));
+        const auto b = _mm256_castsi256_ps(_mm256_permutevar8x32_epi32(high.raw, index.raw));
+        return {_mm256_castps_si256(_mm256_blendv_ps(a, b, isHigh))};
+    }
 #endif
     const auto lane = hn::IndicesFromVec(d, hn::And(index, hn::Set(d, n - 1)));
     const auto isLow = hn::Eq(hn::And(index, hn::Set(d, n)), hn::Zero(d));

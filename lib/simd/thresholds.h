@@ -49,6 +49,9 @@ constexpr bool isPrefetchedStencil(ByteExtent dst) {
 
 // ---- Lengths of rows, in bytes ---------------------------------------------
 
+// The fill: rows of up to so many vectors are stored as they come, without a loop.
+inline constexpr size_t kFillShortVectors = 8;
+
 // The copy: rows up to here are held in registers, where the call of memmove would
 // take longer than the row.
 inline constexpr size_t kCopyShortRow = 128;
