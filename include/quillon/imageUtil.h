@@ -10,7 +10,9 @@
  * says so.
  *
  * A function that fails returns false.  Failures of file output are also reported through
- * Log (see hearth/hearth.h), and libpng prints its errors and warnings to standard error.
+ * Log (see hearth/hearth.h); nothing else is.  libpng's error and warning handlers are left
+ * at their defaults: on reading and on writing PNG it prints lines that begin "libpng error:"
+ * or "libpng warning:" to standard error, past Log, about what is wrong with a file.
  */
 #ifndef QUILLON_IMAGE_UTIL_H
 #define QUILLON_IMAGE_UTIL_H
@@ -95,8 +97,15 @@ QUILLON_API bool ImageUtil_ReadPNG(ImageInfo *image, const char *fileName, uint3
  *
  * RGB, RGBA and palette files are read.  Grey files, with or without alpha, are refused.
  * 16 bits per channel are reduced to 8.  A palette file gives one byte per pixel.
- * Transparency chunks are ignored.  bytesPerLine is a multiple of 4; the padding at the
- * end of a row is not written.
+ * Transparency chunks are ignored.
+ *
+ * Texts, profiles, suggested palettes and the like are neither kept nor inflated: beside
+ * the pixels, and libpng's buffers for two rows of them, decoding takes less than 16 MB,
+ * whatever is in the file.  Where more than 64 KB of compressed pixels follow behind the
+ * picture, they are not inflated either, and whether their stream comes to an end is not
+ * looked at.
+ *
+ * bytesPerLine is a multiple of 4; the padding at the end of a row is not written.
  *
  * | image after false      | cause                                                             |
  * |------------------------|-------------------------------------------------------------------|

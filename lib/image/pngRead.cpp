@@ -3,6 +3,7 @@
 #include <quillon/imageUtil.h>
 
 #include "image/imageRecord.h"
+#include "image/pngChunks.h"
 
 #include <algorithm>
 #include <csetjmp>
@@ -14,7 +15,20 @@ using namespace quillon;
 
 namespace {
 
-constexpr uint32_t kSignatureBytes = 8;
+// Compressed bytes behind the last row that libpng may inflate, only to throw away what
+// comes out (up to 1032 times as much): it does so to learn where their stream ends.
+constexpr uint32_t kMaxSurplusBytes = 1 << 16;
+
+// What setjmp returns when a file has more: its pixels are complete.
+constexpr int kTooMuchSurplus = 2;
+
+// The io pointer of libpng.
+struct PngInput {
+    ImageUtilPngReadState state;
+    bool isInPixels;       // libpng reads rows, and the rest of their stream
+    uint32_t height;       // in rows, then
+    uint32_t surplusBytes; // read behind the last row
+};
 
 // The state of one decoding.  An error in libpng is a longjmp, which runs no
 // destructors, so everything that has to be released is a plain pointer here, outside
@@ -22,19 +36,22 @@ constexpr uint32_t kSignatureBytes = 8;
 struct PngReader {
     ImageInfo *image;
     uint32_t flags;
-    ImageUtilPngReadState *state;
+    PngInput *input;
     png_structp png;
     png_infop info;
     png_bytep *rows; // from the top of the picture
 };
 
+PngFile fileOf(const PngReader &reader) {
+    return PngFile{reader.input->state.buffer, reader.input->state.size};
+}
+
 bool openReader(PngReader &reader, const uint8_t *buffer, uint32_t size) {
-    reader.state =
-        static_cast<ImageUtilPngReadState *>(UtilSafeCalloc0(1, sizeof(ImageUtilPngReadState)));
-    if (reader.state == nullptr)
+    reader.input = static_cast<PngInput *>(UtilSafeCalloc0(1, sizeof(PngInput)));
+    if (reader.input == nullptr)
         return false;
-    *reader.state = ImageUtilPngReadState{buffer, 0, size};
-    if (size < kSignatureBytes || png_sig_cmp(buffer, 0, kSignatureBytes) != 0)
+    reader.input->state = ImageUtilPngReadState{buffer, 0, size};
+    if (size < kPngSignatureBytes || png_sig_cmp(buffer, 0, kPngSignatureBytes) != 0)
         return false;
     reader.png = png_create_read_struct(PNG_LIBPNG_VER_STRING, nullptr, nullptr, nullptr);
     if (reader.png == nullptr)
@@ -46,7 +63,7 @@ bool openReader(PngReader &reader, const uint8_t *buffer, uint32_t size) {
 void closeReader(PngReader &reader) {
     png_destroy_read_struct(&reader.png, &reader.info, nullptr);
     std::free(reader.rows);
-    std::free(reader.state);
+    std::free(reader.input);
 }
 
 void takePalette(const PngReader &reader) {
@@ -59,13 +76,30 @@ void takePalette(const PngReader &reader) {
         image.palette[i] = ImageUtilColor{colors[i].blue, colors[i].green, colors[i].red, 0};
 }
 
+bool isBehindLastRow(png_structp png, const PngInput &input) {
+    constexpr png_byte kInterlacePasses = 7;
+    return input.isInPixels && (png_get_current_pass_number(png) >= kInterlacePasses ||
+                                png_get_current_row_number(png) >= input.height);
+}
+
+void readForLibpng(png_structp png, png_bytep dest, size_t length) {
+    auto *const input = static_cast<PngInput *>(png_get_io_ptr(png));
+    if (isBehindLastRow(png, *input)) {
+        input->surplusBytes += static_cast<uint32_t>(length);
+        if (input->surplusBytes > kMaxSurplusBytes)
+            png_longjmp(png, kTooMuchSurplus);
+    }
+    ImageUtilReadPngCallback(png, dest, length);
+}
+
 // Reads the chunks ahead of the pixels, fills the record but for its stride and
 // pixels, and sets libpng up to deliver one of the record's three formats.  False
 // for a grey file.
 bool readHeader(const PngReader &reader) {
     png_structp png = reader.png;
     png_infop info = reader.info;
-    png_set_read_fn(png, reader.state, ImageUtilReadPngCallback);
+    png_set_read_fn(png, reader.input, readForLibpng);
+    skipCostlyChunks(png, fileOf(reader));
     png_read_info(png, info);
 
     const int colorType = png_get_color_type(png, info);
@@ -135,11 +169,20 @@ bool prepareRows(PngReader &reader) {
 
 // The frame that an error in libpng jumps back to.
 bool decode(PngReader &reader) {
-    if (setjmp(png_jmpbuf(reader.png)) != 0)
+    switch (setjmp(png_jmpbuf(reader.png))) {
+    case 0:
+        break;
+    case kTooMuchSurplus:
+        return isWholeBehind(fileOf(reader), reader.input->state.offset);
+    default:
         return false;
+    }
     if (!readHeader(reader) || !prepareRows(reader))
         return false;
+    reader.input->height = reader.image->height;
+    reader.input->isInPixels = true;
     png_read_image(reader.png, reader.rows);
+    reader.input->isInPixels = false;
     png_read_end(reader.png, nullptr);
     return true;
 }

@@ -2,9 +2,11 @@
 
 #include <hearth/hearth.h>
 
+#include <algorithm>
 #include <cstdlib>
 #include <cstring>
 #include <dlfcn.h>
+#include <malloc.h>
 
 namespace quillon::test {
 namespace {
@@ -54,8 +56,11 @@ void *__libc_memalign(size_t alignment, size_t size);
 void __libc_free(void *block);
 
 static void *noted(void *block, int64_t count = 1) {
-    if (current != nullptr && block != nullptr)
-        current->blocksHeld += count;
+    if (current == nullptr || block == nullptr)
+        return block;
+    current->blocksHeld += count;
+    current->bytesHeld += count * static_cast<int64_t>(malloc_usable_size(block));
+    current->mostBytes = std::max(current->mostBytes, current->bytesHeld);
     return block;
 }
 
@@ -70,7 +75,12 @@ void *calloc(size_t count, size_t size) noexcept {
 void *realloc(void *block, size_t size) noexcept {
     if (block == nullptr)
         return malloc(size);
-    return requestFails(false) ? nullptr : __libc_realloc(block, size);
+    if (requestFails(false))
+        return nullptr;
+    noted(block, -1);
+    void *const resized = __libc_realloc(block, size);
+    noted(resized == nullptr ? block : resized);
+    return resized;
 }
 
 void *aligned_alloc(size_t alignment, size_t size) noexcept {
@@ -86,7 +96,7 @@ void free(void *block) noexcept {
 
 void *UtilSafeMalloc0(size_t size) {
     static auto *const next = hidden(UtilSafeMalloc0, "UtilSafeMalloc0");
-    void *const block = requestFails() ? nullptr : next(size);
+    void *const block = requestFails() || size > mostBytesPerBlock ? nullptr : next(size);
     // Not all of a block that no page is behind yet.
     return block == nullptr ? nullptr : std::memset(block, kStale, size < 1u << 24 ? size : 0);
 }

@@ -15,6 +15,9 @@ namespace quillon::test {
 
 inline constexpr uint8_t kStale = 0xA5;
 
+// UtilSafeMalloc0 gives null for more.
+inline size_t mostBytesPerBlock = SIZE_MAX;
+
 // While one lives, the n-th request for memory, from 0, fails: that one alone.
 // All requests count, or only those to libhearth.
 struct MemoryFault {
@@ -26,9 +29,9 @@ struct MemoryFault {
     uint64_t requestsLeft; // until the one that fails
     const bool isOfHearth;
     bool happened = false;
-    // Blocks taken since construction and not given back.  0 under a sanitizer,
-    // which finds leaks itself.
-    int64_t blocksHeld = 0;
+    // Blocks taken since construction and not given back, the bytes in them, and the
+    // most that these have been.  0 under a sanitizer, which finds leaks itself.
+    int64_t blocksHeld = 0, bytesHeld = 0, mostBytes = 0;
 };
 
 // Calls run() once for each request for memory it makes, with that one failing,
