@@ -59,5 +59,5 @@ build() { # PRESET [TARGET...]
 # C and C++ files of this repository, below the given folders or everywhere.
 sources() { # [FOLDER...]
     find "${@:-.}" -name build\* -prune -o -name .git -prune -o \
-        \( -name '*.h' -o -name '*.c' -o -name '*.cpp' \) -print | sort
+        \( -name '*.h' -o -name '*.hpp' -o -name '*.c' -o -name '*.cpp' \) -print | sort
 }
