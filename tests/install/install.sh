@@ -29,6 +29,19 @@ for header in "$work"/moved/include/quillon-1/{quillon,hearth}/*.h; do
     everyStandard "$header"
 done
 
+echo "The C++ face compiles in a strict program, with every compiler that there is"
+face=(-fsyntax-only -Wall -Wextra -Wpedantic -Wconversion -Wsign-conversion -Wshadow
+    -Wold-style-cast -Werror -I"$work/moved/include/quillon-1")
+for standard in c++17 c++20 c++2b; do
+    "${cxx[@]}" -std=$standard "${face[@]}" "$here/consumer/face.cpp"
+    for compiler in g++ clang++; do
+        [ -z "$(command -v $compiler)" ] || $compiler -std=$standard "${face[@]}" "$here/consumer/face.cpp"
+    done
+done
+for header in "$work"/moved/include/quillon-1/quillon/face/*.hpp; do
+    "${cxx[@]}" -std=c++17 "${face[@]}" -x c++ -include "$header" - <<<"int unused;"
+done
+
 echo "The preprocessor can compare versions"
 everyStandard "$here/consumer/version.h"
 
@@ -38,7 +51,8 @@ export PKG_CONFIG_PATH=$libDir/pkgconfig
 read -ra flags <<<"$(PKG_CONFIG_LIBDIR=$PKG_CONFIG_PATH pkg-config --cflags --libs 'quillon >= 1.0')"
 "${cc[@]}" -std=c99 -x c -Wall -Werror "$here/consumer/client.c" -o "$work/inC" "${flags[@]}"
 "${cxx[@]}" -std=c++17 -x c++ -Wall -Werror "$here/consumer/client.c" -o "$work/inCpp" "${flags[@]}"
-for program in "$work"/inC{,pp}; do
+"${cxx[@]}" -std=c++17 "$here/consumer/face.cpp" -o "$work/face" "${flags[@]}"
+for program in "$work"/{inC,inCpp,face}; do
     LD_LIBRARY_PATH=$libDir "${emulator[@]}" "$program"
 done
 
