@@ -24,6 +24,8 @@ std::vector<Operation> allOperations() {
         std::ranges::move(pixelOperations(area), std::back_inserter(plan.operations));
     addRegions(plan);
     addImages(plan);
+    plan.area = {"calls of the C++ face", 8, 8, 640};
+    addFace(plan);
     addPeers(plan.operations);
     return plan.operations;
 }

@@ -50,6 +50,7 @@ void addVideo(Plan &plan);
 void addColorKeys(Plan &plan);
 void addRegions(Plan &plan); // these have no area
 void addImages(Plan &plan);
+void addFace(Plan &plan); // in small rectangles
 
 // Those that have an area.
 std::vector<Operation> pixelOperations(const Area &area);
