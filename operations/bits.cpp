@@ -89,4 +89,8 @@ void tryStencilBesidePage(Random &random) {
     });
 }
 
+void family::bits(Random &random) {
+    random.oneIn(4) ? tryStencilBesidePage(random) : tryBits(random);
+}
+
 } // namespace quillon::test

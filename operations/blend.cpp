@@ -24,4 +24,8 @@ void tryBlend(Random &random, std::optional<Shape> shape) {
     tryOperation(random, drawBlend(random), shape);
 }
 
+void family::blend(Random &random) {
+    tryBlend(random);
+}
+
 } // namespace quillon::test

@@ -36,4 +36,8 @@ void tryColorKey(Random &random, std::optional<Shape> shape) {
     tryOperation(random, drawKey(random), shape);
 }
 
+void family::colorKey(Random &random) {
+    tryColorKey(random);
+}
+
 } // namespace quillon::test

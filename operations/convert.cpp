@@ -146,4 +146,8 @@ void tryConvertOne(Random &random) {
     tryRGBParam(random);
 }
 
+void family::convert(Random &random) {
+    random.oneIn(4) ? tryConvertOne(random) : tryConvert(random);
+}
+
 } // namespace quillon::test

@@ -27,4 +27,8 @@ void tryCopy(Random &random, std::optional<Shape> shape) {
     tryOperation(random, drawCopy(random), shape);
 }
 
+void family::copy(Random &random) {
+    tryCopy(random);
+}
+
 } // namespace quillon::test

@@ -221,4 +221,8 @@ void tryScaleCursor(Random &random) {
                     {random.below(2), random.below(33), random.below(20), scale(), scale()});
 }
 
+void family::cursor(Random &random) {
+    random.oneOf({tryCursorPlanes, tryCursorBox, tryDrawCursor, tryScaleCursor})(random);
+}
+
 } // namespace quillon::test

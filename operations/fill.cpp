@@ -31,4 +31,8 @@ void tryFill(Random &random, std::optional<Shape> shape) {
     tryOperation(random, drawFill(random), shape);
 }
 
+void family::fill(Random &random) {
+    tryFill(random);
+}
+
 } // namespace quillon::test

@@ -67,4 +67,20 @@ void tryRectPoints(Random &random);
 void tryRectMoves(Random &random);
 void tryRectMaps(Random &random);
 
+// Any call of a family, in the shares that fuzzers and the fingerprint try them.
+namespace family {
+void bits(Random &random);
+void blend(Random &random);
+void colorKey(Random &random);
+void convert(Random &random);
+void copy(Random &random);
+void cursor(Random &random);
+void fill(Random &random);
+void rect(Random &random);
+void region(Random &random);
+void rop(Random &random);
+void scale(Random &random);
+void video(Random &random);
+} // namespace family
+
 } // namespace quillon::test

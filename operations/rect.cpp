@@ -202,4 +202,8 @@ void tryRectMaps(Random &random) {
     compare(clipped, common, "Rect_MapRect, clipped");
 }
 
+void family::rect(Random &random) {
+    random.oneOf({tryRectSets, tryRectPoints, tryRectMoves, tryRectMaps})(random);
+}
+
 } // namespace quillon::test

@@ -165,11 +165,11 @@ struct Placement {
 
 } // namespace
 
-// Up to thirty changes of a list.
+// A few changes of a list.
 void tryRectList(Random &random) {
     const Placement placement(random);
     RasterRectList cells = random.oneIn(2) ? randomList(random) : RasterRectList{};
-    for (uint32_t step = 0, steps = 1 + random.below(30); step < steps; ++step) {
+    for (uint32_t step = 0, steps = 1 + random.below(10); step < steps; ++step) {
         if (random.oneIn(30))
             Raster_ClearRectList(&cells);
         if (random.oneIn(8))
@@ -209,6 +209,10 @@ void tryAnyRectList(Random &random) {
         compare(list, normal, "list in normal form");
     } catch (const std::runtime_error &) { // a Panic
     }
+}
+
+void family::region(Random &random) {
+    random.oneIn(2) ? tryAnyRectList(random) : tryRectList(random);
 }
 
 } // namespace quillon::test

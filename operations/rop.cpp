@@ -58,4 +58,8 @@ void tryRop(Random &random, std::optional<Shape> shape) {
     tryOperation(random, random.oneIn(4) ? ropFill(rop, pixel, bytes) : ropCopy(rop, bytes), shape);
 }
 
+void family::rop(Random &random) {
+    tryRop(random);
+}
+
 } // namespace quillon::test

@@ -141,4 +141,8 @@ void tryScaleSrcCoordinates(Random &random) {
     compare(rect, Rect{columns.low, lines.low, columns.high, lines.high}, "source coordinates");
 }
 
+void family::scale(Random &random) {
+    random.oneIn(8) ? tryScaleSrcCoordinates(random) : tryScale(random);
+}
+
 } // namespace quillon::test

@@ -69,4 +69,8 @@ void tryYuvToBgrx(Random &random) {
     compare(RasterRGB_YUVtoBGRX(y, u, v), reference::yuvToBgrx(y, u, v), "triple");
 }
 
+void family::video(Random &random) {
+    random.oneIn(8) ? tryYuvToBgrx(random) : tryVideo(random);
+}
+
 } // namespace quillon::test

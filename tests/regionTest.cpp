@@ -22,7 +22,7 @@ uint32_t apply(decltype(Raster_AddRect) *change, RasterRectList &list, const Ent
 }
 
 TEST(RectList, agreesWithABitmap) {
-    forEachCase(16000, tryRectList);
+    forEachCase(48000, tryRectList);
 }
 
 // Any numbers at all.

@@ -54,10 +54,13 @@ public:
 
     void fill(void *memory, size_t size) {
         auto *bytes = static_cast<uint8_t *>(memory);
-        for (size_t i = 0; i < size; i += sizeof(uint64_t)) {
-            const uint64_t word = generated();
-            std::memcpy(bytes + i, &word, std::min(size - i, sizeof(word)));
+        uint64_t word = 0;
+        for (; size >= sizeof(word); size -= sizeof(word), bytes += sizeof(word)) {
+            word = generated();
+            std::memcpy(bytes, &word, sizeof(word));
         }
+        for (word = size == 0 ? 0 : generated(); size > 0; --size, word >>= 8)
+            *bytes++ = static_cast<uint8_t>(word);
     }
 
 private:

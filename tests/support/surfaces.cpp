@@ -217,6 +217,25 @@ void drawContents(Random &random, const Case &c) {
         memory->keep();
 }
 
+// A call of memcpy for so few bytes would take most of the time.
+uint32_t loadPixel(const uint8_t *from, uint32_t bytes) {
+    uint32_t pixel = 0;
+    if (bytes == sizeof pixel)
+        std::memcpy(&pixel, from, sizeof pixel);
+    else
+        for (uint32_t i = 0; i < bytes; ++i)
+            pixel |= uint32_t{from[i]} << (8 * i);
+    return pixel;
+}
+
+void storePixel(uint8_t *to, uint32_t bytes, uint32_t pixel) {
+    if (bytes == sizeof pixel)
+        std::memcpy(to, &pixel, sizeof pixel);
+    else
+        for (uint32_t i = 0; i < bytes; ++i)
+            to[i] = static_cast<uint8_t>(pixel >> (8 * i));
+}
+
 // Carries out the operation in the model.
 void walkModel(const Case &c) {
     const std::vector<Part> &parts = c.operation.parts;
@@ -241,10 +260,10 @@ void walkModel(const Case &c) {
                 if (bytes == 0)
                     pixels[k] = rows[k][column / 8] >> (7 - column % 8) & 1;
                 else if (parts[k].isTouched)
-                    std::memcpy(&pixels[k], rows[k] + column * bytes, bytes);
+                    pixels[k] = loadPixel(rows[k] + column * bytes, bytes);
             }
-            const uint32_t result = c.operation.reference(pixels), bytes = parts[0].bytes / split;
-            std::memcpy(rows[0] + column * bytes, &result, bytes);
+            const uint32_t bytes = parts[0].bytes / split;
+            storePixel(rows[0] + column * bytes, bytes, c.operation.reference(pixels));
         }
     }
 }
@@ -352,7 +371,7 @@ void plantRuns(Random &random, uint8_t *pixels, size_t count, uint32_t bytes,
         const uint32_t value = values[random.below(static_cast<uint32_t>(values.size()))];
         for (const bool isLeft = random.oneIn(3); i < end; ++i)
             if (!isLeft)
-                std::memcpy(pixels + i * bytes, &value, bytes);
+                storePixel(pixels + i * bytes, bytes, value);
     }
 }
 
