@@ -1,6 +1,6 @@
-// thumbnail: cuts and scales a PNG picture, and writes it as PNG or BMP.
+// quillon-thumbnail: cuts and scales a PNG picture, and writes it as PNG or BMP.
 //
-//     thumbnail IN.png OUT.{png,bmp} [--width W] [--height H] [--crop X,Y,WxH]
+//     quillon-thumbnail IN.png OUT.{png,bmp} [--width W] [--height H] [--crop X,Y,WxH]
 //
 // Build it by itself with
 //
@@ -8,6 +8,7 @@
 
 #include <quillon/imageUtil.h>
 #include <quillon/raster.h>
+#include <quillon/version.h>
 
 #include <array>
 #include <cerrno>
@@ -29,7 +30,7 @@
 namespace {
 
 constexpr char kUsage[] =
-    "usage: thumbnail IN.png OUT.{png,bmp} [--width W] [--height H] [--crop X,Y,WxH]\n"
+    "usage: quillon-thumbnail IN.png OUT.{png,bmp} [--width W] [--height H] [--crop X,Y,WxH]\n"
     "\n"
     "Cuts and scales a PNG picture.  The name of the output tells its format.\n"
     "\n"
@@ -40,6 +41,7 @@ constexpr char kUsage[] =
     "  --crop X,Y,WxH take W by H pixels from column X, row Y on; the whole picture\n"
     "                 otherwise\n"
     "  --help         show this text\n"
+    "  --version      show the version\n"
     "\n"
     "A PNG output has alpha when any pixel of the input is not opaque.\n"
     "Colour and palette files are read, grey ones are not.\n";
@@ -105,12 +107,13 @@ bool endsWith(const std::string &text, const char *ending) {
     return text.size() > length && strcasecmp(text.c_str() + text.size() - length, ending) == 0;
 }
 
-// Nothing when the text of --help is all that was asked for.
+// Nothing when all that was asked for is a text, which is out already.
 std::optional<Request> parseArguments(int argc, char **argv) {
-    static const std::array<option, 5> kOptions = {{{"width", required_argument, nullptr, 'w'},
+    static const std::array<option, 6> kOptions = {{{"width", required_argument, nullptr, 'w'},
                                                     {"height", required_argument, nullptr, 'h'},
                                                     {"crop", required_argument, nullptr, 'c'},
                                                     {"help", no_argument, nullptr, 'u'},
+                                                    {"version", no_argument, nullptr, 'v'},
                                                     {nullptr, 0, nullptr, 0}}};
     Request request;
     int found = 0;
@@ -128,6 +131,11 @@ std::optional<Request> parseArguments(int argc, char **argv) {
             request.crop = parseCrop(optarg);
             break;
         case 'u':
+            std::fputs(kUsage, stdout);
+            return std::nullopt;
+        case 'v':
+            std::printf("quillon-thumbnail %d.%d.%d\n", QUILLON_VERSION_MAJOR,
+                        QUILLON_VERSION_MINOR, QUILLON_VERSION_PATCH);
             return std::nullopt;
         default:
             throw std::runtime_error(std::string(argv[optind - 1]) +
@@ -242,14 +250,12 @@ void run(const Request &request) {
 int main(int argc, char **argv) {
     try {
         const std::optional<Request> request = parseArguments(argc, argv);
-        if (!request) {
-            std::fputs(kUsage, stdout);
-            return 0;
+        if (request) {
+            run(*request);
         }
-        run(*request);
         return 0;
     } catch (const std::exception &problem) {
-        std::fprintf(stderr, "thumbnail: %s\n", problem.what());
+        std::fprintf(stderr, "quillon-thumbnail: %s\n", problem.what());
         return 1;
     }
 }

@@ -1,6 +1,13 @@
 # What the scripts share; each one sources it first.  It goes to the root of the
-# repository.
+# repository, and answers --help with the comment at the top of the script.
 set -eu
+case "${1:-}" in
+-h | --help)
+    sed -n '2,/^[^#]/s/^# \{0,1\}//p' "$0"
+    exit 0
+    ;;
+esac
+callerFolder=$PWD
 cd "$(dirname "${BASH_SOURCE[0]}")/.."
 
 # Debian packages, by what they are needed for.
@@ -39,9 +46,11 @@ need() {
         asRoot=(sudo)
     fi
     say "Installing ${missing[*]}"
-    { "${asRoot[@]}" apt-get update -q &&
-        "${asRoot[@]}" env DEBIAN_FRONTEND=noninteractive \
-            apt-get install -y -q --no-install-recommends "${missing[@]}"; } ||
+    # An installation that was interrupted is finished first.
+    { "${asRoot[@]}" env DEBIAN_FRONTEND=noninteractive dpkg --configure -a &&
+        "${asRoot[@]}" apt-get update -q &&
+        "${asRoot[@]}" env DEBIAN_FRONTEND=noninteractive apt-get install -y -q --fix-broken \
+            --no-install-recommends -o DPkg::Lock::Timeout=300 "${missing[@]}"; } ||
         fail "Missing, and could not be installed: ${missing[*]}"
 }
 

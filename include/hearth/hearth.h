@@ -2,8 +2,9 @@
  *
  * libhearth: messages, memory, a growable byte buffer and files for libquillon.
  *
- * It is a separate shared library without symbol versions, so that a host can replace any
- * of its functions: libquillon calls the one that the host's executable defines.
+ * It is a separate library without symbol versions, so that a host can replace any of its
+ * functions: libquillon calls the one that the host's executable defines.  Include this header
+ * where you define one: the compiler then sees that it has the right parameters.
  *
  * A host's Panic may throw a C++ exception or longjmp out of the call: libquillon holds no
  * memory at that moment that would leak.
@@ -15,11 +16,18 @@
 #include <stddef.h>
 #include <stdint.h>
 
-#if defined(__GNUC__)
+#if defined(HEARTH_BUILD)
+/* Weak: the host's function goes before this one in a static library too. */
+#define HEARTH_API __attribute__((visibility("default"), weak))
+#elif defined(__GNUC__)
 #define HEARTH_API __attribute__((visibility("default")))
-#define HEARTH_PRINTF __attribute__((format(printf, 1, 2)))
 #else
 #define HEARTH_API
+#endif
+
+#if defined(__GNUC__)
+#define HEARTH_PRINTF __attribute__((format(printf, 1, 2)))
+#else
 #define HEARTH_PRINTF
 #endif
 

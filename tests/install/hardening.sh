@@ -23,7 +23,7 @@ for library; do
         awk '/^[0-9a-f]+ <.*>:$/ { name = substr($2, 2, length($2) - 3); getline
                                    print ($2 ~ /^(endbr64|bti|paciasp)$/), name }' |
         awk '$1 == 0 { print $2 }' | sort)
-    exports=$("$nm" -D --defined-only "$library" | awk '$2 == "T" { sub(/@.*/, "", $3); print $3 }' | sort)
+    exports=$("$nm" -D --defined-only "$library" | awk '$2 ~ /[TW]/ { sub(/@.*/, "", $3); print $3 }' | sort)
     [ -n "$exports" ] || { echo "$library exports nothing"; failed=1; }
     open=$(comm -12 <(echo "$unmarked") <(echo "$exports"))
     [ -z "$open" ] || { echo "$library: no mark for indirect calls at" $open; failed=1; }

@@ -1,6 +1,7 @@
 #!/bin/bash
 # Installs into an empty folder, moves the tree, and builds a program against it
-# through pkg-config, as C and as C++, and through find_package.
+# through pkg-config, as C and as C++, and through find_package; the libraries are
+# shared or static, as the build made them.
 # Usage: install.sh BUILD_DIR CC CXX CMAKE_GENERATOR TOOLCHAIN_FILE SYSROOT [EMULATOR...]
 # where TOOLCHAIN_FILE and SYSROOT are empty but in a cross build.
 set -euo pipefail
@@ -12,7 +13,8 @@ trap 'rm -rf "$work"' EXIT
 
 cmake --install "$buildDir" --prefix "$work/first" >"$work/log"
 mv "$work/first" "$work/moved"
-libDir=$(dirname "$(find "$work/moved" -name libquillon.so)")
+libDir=$(dirname "$(find "$work/moved" -name 'libquillon.*' | head -n 1)")
+isShared=$([ -e "$libDir/libquillon.so" ] && echo yes || true)
 
 strict=(-fsyntax-only -Wall -Wextra -Wpedantic -Werror -I"$work/moved/include/quillon-1")
 everyStandard() { # FILE, by itself
@@ -47,20 +49,36 @@ everyStandard "$here/consumer/version.h"
 
 echo "pkg-config"
 export PKG_CONFIG_PATH=$libDir/pkgconfig
-# No other .pc file may be needed.
-read -ra flags <<<"$(PKG_CONFIG_LIBDIR=$PKG_CONFIG_PATH pkg-config --cflags --libs 'quillon >= 1.0')"
+# What shared libraries are built of is nobody else's affair: neither pkg-config nor
+# CMake may look for it.
+[ -z "$isShared" ] || export PKG_CONFIG_LIBDIR=$PKG_CONFIG_PATH
+read -ra flags <<<"$(pkg-config --cflags --libs $([ -n "$isShared" ] || echo --static) 'quillon >= 1.0')"
 "${cc[@]}" -std=c99 -x c -Wall -Werror "$here/consumer/client.c" -o "$work/inC" "${flags[@]}"
 "${cxx[@]}" -std=c++17 -x c++ -Wall -Werror "$here/consumer/client.c" -o "$work/inCpp" "${flags[@]}"
 "${cxx[@]}" -std=c++17 "$here/consumer/face.cpp" -o "$work/face" "${flags[@]}"
+export LD_LIBRARY_PATH=$libDir
 for program in "$work"/{inC,inCpp,face}; do
-    LD_LIBRARY_PATH=$libDir "${emulator[@]}" "$program"
+    "${emulator[@]}" "$program"
 done
 
+echo "A function of the host's that has the name of one of libhearth's"
+clash() { # CALLS [FLAG...]
+    "${cc[@]}" "$here/consumer/clash.c" -o "$work/clash" "${@:2}" "${flags[@]}"
+    local calls=0
+    "${emulator[@]}" "$work/clash" 2>/dev/null || calls=$?
+    [ "$calls" = "$1" ] || { echo "clash ${*:2}: $calls calls instead of $1"; exit 1; }
+}
+clash 0 -DLINKAGE=static -Wno-unused-function
+[ -z "$isShared" ] || clash 0 -fvisibility=hidden
+clash 1
+[ -z "$isShared" ] || nm -D --defined-only "$work/clash" | grep -qw Log
+unset LD_LIBRARY_PATH
+
 echo "find_package"
-# Nobody who uses libquillon may be made to look for what it is built of.
-cmake -S "$here/consumer" -B "$work/build" -G "$generator" \
-    -DCMAKE_C_COMPILER="${cc[0]}" ${toolchain:+-DCMAKE_TOOLCHAIN_FILE="$toolchain"} -DCMAKE_PREFIX_PATH="$work/moved" -DCMAKE_DISABLE_FIND_PACKAGE_PNG=ON \
-    -DCMAKE_DISABLE_FIND_PACKAGE_PkgConfig=ON >"$work/log" ||
+configure=(-DCMAKE_C_COMPILER="${cc[0]}" -DCMAKE_PREFIX_PATH="$work/moved"
+    ${toolchain:+-DCMAKE_TOOLCHAIN_FILE="$toolchain"}
+    ${isShared:+-DCMAKE_DISABLE_FIND_PACKAGE_PNG=ON -DCMAKE_DISABLE_FIND_PACKAGE_PkgConfig=ON})
+cmake -S "$here/consumer" -B "$work/build" -G "$generator" "${configure[@]}" >"$work/log" ||
     { cat "$work/log"; exit 1; }
 cmake --build "$work/build" >"$work/log" || { cat "$work/log"; exit 1; }
 "${emulator[@]}" "$work/build/client"

@@ -30,4 +30,13 @@ compare "quillon.map against the headers" "$headers" "$map"
 compare "libquillon against quillon.map" "$map" "$(exported "$libquillon")"
 compare "libhearth against hearth.h" "$(declared HEARTH_API "$sourceDir/include/hearth/hearth.h")" \
     "$(exported "$libhearth")"
+
+# What a host can replace, and nothing else: the library's own functions are bound
+# within it.
+lookedUp() { # PATTERN
+    readelf --relocs --wide "$libquillon" | awk '/R_/ { print $5 }' | grep -E "$1" | sort -u || true
+}
+compare "names looked up in the host against hearth.h" \
+    "$(declared HEARTH_API "$sourceDir/include/hearth/hearth.h")" "$(lookedUp '^[A-Z][A-Za-z0-9_]*$')"
+[ -z "$(lookedUp QUILLON_)" ] || { echo "Looked up, though its own: $(lookedUp QUILLON_)"; failed=1; }
 exit $failed
