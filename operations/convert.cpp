@@ -69,8 +69,9 @@ uint32_t convertedByReference(const Pair &pair, uint32_t pixel) {
 // A palette of which there are no entries but those that pixels use, on one side; and
 // the bytes that pixels may have.
 const uint32_t *drawPalette(Random &random, Part &part) {
-    static const FencedBuffer behindFence(256 * sizeof(uint32_t), FencedBuffer::Flush::kBefore);
-    static const FencedBuffer aheadOfFence(256 * sizeof(uint32_t));
+    static thread_local const FencedBuffer behindFence(256 * sizeof(uint32_t),
+                                                       FencedBuffer::Flush::kBefore);
+    static thread_local const FencedBuffer aheadOfFence(256 * sizeof(uint32_t));
     const bool isLow = random.oneIn(2);
     const FencedBuffer &colors = isLow ? aheadOfFence : behindFence;
     random.fill(colors.data(), colors.size());
@@ -129,7 +130,7 @@ void tryConvert(Random &random, std::optional<Shape> shape) {
 }
 
 void tryConvertOne(Random &random) {
-    static uint32_t palette[300]; // an index is not cut to a byte
+    static thread_local uint32_t palette[300]; // an index is not cut to a byte
     const uint32_t pixel = random.word(), index = random.below(300);
     const int32_t dst = random.oneOf(kLayouts), src = random.oneOf(kSources);
     palette[index] = pixel;

@@ -220,8 +220,8 @@ private:
         if (axis.srcSize < kWindowPixels)
             return 0;
         const uint32_t end = (axis.srcSize - kWindowPixels + 1) << 16;
-        const uint32_t chunks = (stepsBefore(axis.start, end, axis.step) + kVectorPixels - 1) /
-                                uint32_t{kVectorPixels};
+        const uint32_t chunks =
+            (stepsBefore(axis.start, end, axis.step) + kVectorPixels - 1) / uint32_t{kVectorPixels};
         return std::min(chunks, axis.dstSize / uint32_t{kVectorPixels}) * uint32_t{kVectorPixels};
     }
 

@@ -45,7 +45,9 @@ HWY_INLINE V inRegister(V v) {
 // Keeps the stores before it ahead of those after it in the code.  Processors write
 // two vectors to one cache line at once where their stores come one after the other,
 // and GCC takes any order.
-HWY_INLINE void keepStoreOrder() { asm volatile("" ::: "memory"); }
+HWY_INLINE void keepStoreOrder() {
+    asm volatile("" ::: "memory");
+}
 
 // Whole vectors at any address, through the caches.
 struct Unaligned {

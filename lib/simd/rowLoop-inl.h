@@ -115,7 +115,7 @@ HWY_INLINE void withShortRow(size_t rowBytes, const Use &use) {
                     (use(d, std::integral_constant<size_t, kLess + 1>()), true)) ||
                    ...);
         };
-        useOf(std::make_index_sequence<n == kVectorBytes ? kMostVectors : 2>());
+        useOf(std::make_index_sequence < n == kVectorBytes ? kMostVectors : 2 > ());
     });
 }
 

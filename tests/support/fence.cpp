@@ -17,7 +17,7 @@ constexpr uint8_t kCanary = 0xC5;
 
 // By their accessible bytes: to map memory takes longer than most calls do.
 constexpr size_t kMostKept = 1 << 20;
-std::map<size_t, std::vector<std::unique_ptr<Mapping>>> freeMappings;
+thread_local std::map<size_t, std::vector<std::unique_ptr<Mapping>>> freeMappings;
 
 std::unique_ptr<Mapping> takeMapping(size_t openSize) {
     auto &free = freeMappings[openSize];

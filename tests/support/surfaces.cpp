@@ -30,23 +30,23 @@ Home makeHome(size_t runPages, size_t srcPages, size_t runs = 1, size_t spacing 
 Home &homeOf(Shape shape) {
     switch (shape) {
     case Shape::kLarge: { // sources may have four times the bytes per pixel
-        static Home home = makeHome(450, 1800);
+        static thread_local Home home = makeHome(450, 1800);
         return home;
     }
     case Shape::kLongRows: {
-        static Home home = makeHome(6, 6);
+        static thread_local Home home = makeHome(6, 6);
         return home;
     }
     case Shape::kFenced: {
-        static Home home = makeHome(1, 1, kFencedRows, 2 * pageSize());
+        static thread_local Home home = makeHome(1, 1, kFencedRows, 2 * pageSize());
         return home;
     }
     case Shape::kFarApart: {
-        static Home home = makeHome(1, 1, kFencedRows, kFar);
+        static thread_local Home home = makeHome(1, 1, kFencedRows, kFar);
         return home;
     }
     default: {
-        static Home home = makeHome(2, 2);
+        static thread_local Home home = makeHome(2, 2);
         return home;
     }
     }

@@ -3,6 +3,8 @@
 
 #include "support/fence.h"
 #include "support/random.h"
+
+#include <gtest/gtest.h>
 #include <quillon/imageUtil.h>
 
 namespace quillon::test {
