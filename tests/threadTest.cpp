@@ -67,7 +67,7 @@ TEST(Threads, agreeFromTheFirstCallOn) {
                                     onRectangles<tryColorKey>,
                                     tryVideo,
                                     tryDrawCursor,
-                                    tryScaleCursor,
+
                                     tryRectList,
                                     tryRectMaps,
                                     tryConvertOne};

@@ -7,6 +7,11 @@
 #include <cstring>
 #include <dlfcn.h>
 #include <malloc.h>
+#if __has_include(<valgrind/memcheck.h>)
+#include <valgrind/memcheck.h>
+#else
+#define VALGRIND_MAKE_MEM_UNDEFINED(address, size) ((void)0)
+#endif
 
 namespace quillon::test {
 namespace {
@@ -97,8 +102,12 @@ void free(void *block) noexcept {
 void *UtilSafeMalloc0(size_t size) {
     static auto *const next = hidden(UtilSafeMalloc0, "UtilSafeMalloc0");
     void *const block = requestFails() || size > mostBytesPerBlock ? nullptr : next(size);
-    // Not all of a block that no page is behind yet.
-    return block == nullptr ? nullptr : std::memset(block, kStale, size < 1u << 24 ? size : 0);
+    if (block != nullptr) {
+        // Not all of a block that no page is behind yet.
+        std::memset(block, kStale, size < 1u << 24 ? size : 0);
+        VALGRIND_MAKE_MEM_UNDEFINED(block, size);
+    }
+    return block;
 }
 
 void *UtilSafeCalloc0(size_t count, size_t size) {
