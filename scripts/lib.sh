@@ -17,6 +17,7 @@ peerPackages=(libpixman-1-dev libyuv-dev libopencv-imgproc-dev libswscale-dev li
 formatPackages=(clang-format)
 clangPackages=(clang libclang-rt-dev)
 lintPackages=(clang clang-tidy)
+interfacePackages=(abigail-tools)
 arm64Packages=(g++-aarch64-linux-gnu qemu-user)
 arm64Libraries=(libpng-dev libhwy-dev libgtest-dev) # for that processor
 
