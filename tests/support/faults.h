@@ -36,17 +36,18 @@ struct MemoryFault {
 
 // Calls run() once for each request for memory it makes, with that one failing,
 // and once more with none failing.  run() gives back what it got, and tells
-// whether there was anything.
+// whether there was anything.  Returns the number of requests.
 template <class Run>
-void forEachMemoryFault(const Run &run) {
-    bool failed = true;
-    for (uint64_t n = 0; failed && !testing::Test::HasFailure(); ++n) {
+uint64_t forEachMemoryFault(const Run &run) {
+    uint64_t n = 0;
+    for (bool failed = true; failed && !testing::Test::HasFailure(); n += failed ? 1 : 0) {
         const MemoryFault fault(n);
         const bool succeeded = run();
         failed = fault.happened;
         EXPECT_EQ(fault.blocksHeld, 0) << "request " << n;
         EXPECT_EQ(succeeded, !failed) << "request " << n;
     }
+    return n;
 }
 
 } // namespace quillon::test

@@ -4,6 +4,7 @@
 
 #include <cstdarg>
 #include <cstdio>
+#include <dlfcn.h>
 
 using namespace quillon::test;
 
@@ -16,8 +17,13 @@ static std::string formatted(const char *format, va_list arguments) {
 void Panic(const char *format, ...) {
     va_list arguments;
     va_start(arguments, format);
-    const std::string text = formatted(format, arguments);
+    char text[1024]; // held by nobody when a jump leaves
+    vsnprintf(text, sizeof text, format, arguments);
     va_end(arguments);
+    if (panicWay == PanicWay::kJump)
+        longjmp(panicJump, 1);
+    if (panicWay == PanicWay::kAbort)
+        reinterpret_cast<decltype(&Panic)>(dlsym(RTLD_NEXT, "Panic"))("%s", text);
     throw PanicError(text);
 }
 

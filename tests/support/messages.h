@@ -1,9 +1,11 @@
 // Panic, Warning and Log of the test programs.  They take the place of
-// libhearth's: a panic becomes an exception, the other messages are kept.
+// libhearth's: a panic becomes an exception, or what panicWay says; the other
+// messages are kept.
 #pragma once
 
 #include <gtest/gtest.h>
 
+#include <csetjmp>
 #include <regex>
 #include <stdexcept>
 #include <string>
@@ -16,6 +18,10 @@ class PanicError : public std::runtime_error {
 public:
     using std::runtime_error::runtime_error;
 };
+
+enum class PanicWay { kThrow, kJump, kAbort };
+inline PanicWay panicWay = PanicWay::kThrow;
+inline jmp_buf panicJump; // where to, with kJump
 
 // Since the last expectPanic() or clear(), oldest first.
 using Messages = std::vector<std::string>;

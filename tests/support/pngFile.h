@@ -2,8 +2,9 @@
 #pragma once
 
 #include <cstdint>
+#include <fcntl.h>
 #include <string>
-#include <string_view>
+#include <unistd.h>
 #include <vector>
 #include <zlib.h>
 
@@ -68,5 +69,31 @@ inline Bytes joined(const std::vector<Bytes> &chunks) {
         file += chunk;
     return file;
 }
+
+// A colour profile that libpng takes for good but for its end.
+inline Bytes colorProfile(uint32_t size) {
+    Bytes bytes = bigEndian(size) + Bytes(size - 4, 0);
+    const auto put = [&](size_t at, const Bytes &value) { bytes.replace(at, value.size(), value); };
+    put(12, "mntrRGB XYZ ");
+    put(36, "acsp");
+    put(68, bigEndian(0xF6D6) + bigEndian(0x10000) + bigEndian(0xD32D));
+    return bytes;
+}
+
+// While one lives, standard error goes nowhere: libpng says a lot of these files.
+struct Silence {
+    Silence() : saved(dup(STDERR_FILENO)) {
+        const int nowhere = open("/dev/null", O_WRONLY);
+        dup2(nowhere, STDERR_FILENO);
+        close(nowhere);
+    }
+    ~Silence() {
+        dup2(saved, STDERR_FILENO);
+        close(saved);
+    }
+    Silence(const Silence &) = delete;
+    Silence &operator=(const Silence &) = delete;
+    const int saved;
+};
 
 } // namespace quillon::test
