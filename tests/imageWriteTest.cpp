@@ -148,6 +148,14 @@ TEST(ImageWrite, WhatCannotBeWritten) {
     }
 }
 
+// Found by fuzzing: rows of no bytes were copied from null.
+TEST(ImageWrite, BmpWithoutColumnsOrPixels) {
+    ImageInfo image = {};
+    image.height = 13;
+    image.depth = image.bpp = 24;
+    EXPECT_EQ(fileOf(image, IMAGEUTIL_FORMAT_BMP).size(), 54u);
+}
+
 // The block stays for the caller to release; what is in it is given up.
 TEST(ImageWrite, PngStreamBeyond4GiB) {
     png_structp png = png_create_write_struct(PNG_LIBPNG_VER_STRING, nullptr, nullptr, nullptr);

@@ -109,6 +109,8 @@ uint64_t fillRow(uint8_t *fileRow, const BmpLayout &layout, const ImageInfo &ima
 }
 
 void fillRows(uint8_t *block, const BmpLayout &layout, const ImageInfo &image) {
+    if (layout.imageBytes == 0)
+        return; // and there may be no block, nor data
     for (uint32_t i = 0; i < image.height; ++i) {
         const uint32_t row = isBottomUp(image) ? i : image.height - 1 - i;
         uint8_t *const fileRow = block + i * layout.rowBytes;
