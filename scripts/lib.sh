@@ -19,12 +19,18 @@ clangPackages=(clang libclang-rt-dev)
 lintPackages=(clang clang-tidy)
 interfacePackages=(abigail-tools)
 arm64Packages=(g++-aarch64-linux-gnu qemu-user)
+docsPackages=(doxygen python3 python3-numpy)
+packagePackages=(build-essential debhelper fakeroot lintian)
 arm64Libraries=(libpng-dev libhwy-dev libgtest-dev) # for that processor
 
 say() { printf '\n== %s\n' "$*"; }
 fail() {
     printf '%s\n' "$*" >&2
     exit 1
+}
+
+asRoot() { # COMMAND...
+    if [ "$(id -u)" -eq 0 ]; then "$@"; else sudo "$@"; fi
 }
 
 # Installs those of the given packages that are missing.
@@ -40,17 +46,12 @@ need() {
     done
     [ ${#missing[@]} -gt 0 ] || return 0
 
-    local asRoot=()
-    if [ "$(id -u)" -ne 0 ]; then
-        command -v sudo >/dev/null ||
-            fail "Missing, and only root can install them: apt-get install ${missing[*]}"
-        asRoot=(sudo)
-    fi
+    [ "$(id -u)" -eq 0 ] || command -v sudo >/dev/null ||
+        fail "Missing, and only root can install them: apt-get install ${missing[*]}"
     say "Installing ${missing[*]}"
     # An installation that was interrupted is finished first.
-    { "${asRoot[@]}" env DEBIAN_FRONTEND=noninteractive dpkg --configure -a &&
-        "${asRoot[@]}" apt-get update -q &&
-        "${asRoot[@]}" env DEBIAN_FRONTEND=noninteractive apt-get install -y -q --fix-broken \
+    { asRoot env DEBIAN_FRONTEND=noninteractive dpkg --configure -a && asRoot apt-get update -q &&
+        asRoot env DEBIAN_FRONTEND=noninteractive apt-get install -y -q --fix-broken \
             --no-install-recommends -o DPkg::Lock::Timeout=300 "${missing[@]}"; } ||
         fail "Missing, and could not be installed: ${missing[*]}"
 }

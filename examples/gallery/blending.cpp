@@ -24,7 +24,9 @@ Picture decorated(const Material &material) {
 // One sprite over the picture, with its alpha replaced unless alpha is negative.
 Picture withAlpha(const Material &material, int32_t alpha) {
     constexpr int32_t kSize = 136;
+    //! [fillAlpha]
     Picture sprite = resized(material.sprite, kSize, kSize);
+    //! [fillAlpha]
     if (alpha >= 0)
         Raster_RectFillAlpha(sprite.data(), sprite.step(), static_cast<uint8_t>(alpha), 0, 0, kSize,
                              kSize);

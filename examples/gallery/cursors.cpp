@@ -48,6 +48,7 @@ Cursor maskCursor(const std::string_view (&rows)[height], uint32_t hotspot) {
     const uint32_t imageSize = Raster_CalculateCursorSize(width, height, 32);
     Cursor cursor;
     cursor.images.resize(size_t{imageSize} * 2);
+    //! [cursorPlanes]
     Raster_ExpandPlanarCursorData(width, height, 1, andPlane.data(), 1, xorPlane.data(), 32,
                                   cursor.images.data(), imageSize * 2);
     RasterCursor &record = cursor.record;
@@ -57,6 +58,7 @@ Cursor maskCursor(const std::string_view (&rows)[height], uint32_t hotspot) {
     record.height = height;
     record.andImage = cursor.images.data();
     record.xorImage = record.andImage + imageSize;
+    //! [cursorPlanes]
     return cursor;
 }
 
@@ -73,10 +75,12 @@ RasterCursor alphaCursor(const Picture &image) {
 }
 
 void draw(Picture &screen, const RasterCursor &cursor, int32_t x, int32_t y) {
+    //! [cursorDraw]
     const RasterCursorScreen size = {screen.info().width, screen.info().height};
     RasterCursorBox box;
     if (Raster_ComputeCursorBox(&size, &cursor, x, y, &box))
         Raster_DrawCursor(screen.data(), screen.step(), nullptr, 0, &cursor, &box);
+    //! [cursorDraw]
 }
 
 void drawScaled(Picture &screen, const RasterCursor &cursor, int32_t x, int32_t y, double scale) {

@@ -19,6 +19,7 @@ Picture filledRings(int32_t depth) {
     const bool indices = depth == 8;
     const int32_t bytes = (depth + 7) / 8, step = kSize * bytes;
     std::vector<uint8_t> surface(size_t{kSize} * static_cast<size_t>(step));
+    //! [fill]
     for (uint32_t ring = 0; ring < kRings.size(); ++ring) {
         const uint32_t colour = kRings[ring];
         const uint32_t pixel =
@@ -27,6 +28,7 @@ Picture filledRings(int32_t depth) {
         Raster_RectFill(surface.data(), step, bytes, pixel, inset, inset, kSize - 2 * inset,
                         kSize - 2 * inset);
     }
+    //! [fill]
     Picture shown = blank(kSize, kSize, 0);
     Raster_ConvertPixelsTo32(shown.data(), shown.info().bytesPerLine, surface.data(), natural(step),
                              depth, indices, kRings.data(), 0, 0, 0, 0, kSize, kSize);
@@ -60,9 +62,11 @@ std::string labelOf(uint32_t rop) {
 constexpr int32_t kTileWidth = 168, kTileHeight = 112;
 
 Picture againstConstant(const Picture &photo, uint32_t rop) {
+    //! [ropFill]
     Picture picture = covering(photo, kTileWidth, kTileHeight);
     Raster_RectROPfill(picture.data(), picture.step(), 4, kOrange, rop, 28, 20, kTileWidth - 56,
                        kTileHeight - 40);
+    //! [ropFill]
     return picture;
 }
 
@@ -81,10 +85,12 @@ std::vector<uint8_t> disc(int32_t centreX) {
 }
 
 Picture betweenDiscs(uint32_t rop) {
+    //! [ropCopy]
     const std::vector<uint8_t> source = disc(62);
     std::vector<uint8_t> surface = disc(106);
     Raster_RectROPcopy(surface.data(), kTileWidth, source.data(), kTileWidth, 1, 0, 0, rop, 0, 0,
                        kTileWidth, kTileHeight);
+    //! [ropCopy]
     std::vector<uint32_t> palette(256);
     palette[0x00] = kPale;
     palette[0xFF] = kBlue;
@@ -114,8 +120,10 @@ void showFills(Page &page, const Material &material) {
     Picture before = covering(material.photo, kWidth, kHeight);
     Picture after = copyOf(before);
     outline(before, from, kOrange, 2);
+    //! [copy]
     Raster_RectCopy(after.data(), after.step(), after.data(), after.step(), 4, natural(from.left),
                     natural(from.top), natural(to.left), natural(to.top), 150, 110);
+    //! [copy]
     outline(after, to, kOrange, 2);
     Sheet copies(2);
     copies.add(std::move(before), "what is copied");

@@ -50,9 +50,11 @@ void addCombined(Sheet &sheet, const Picture &photo, int32_t gap, const std::str
         images.push_back(quarters.back().info());
         corners.push_back({column * (width + gap), row * (height + gap)});
     }
+    //! [combine]
     ImageInfo combined = {};
     if (!ImageUtil_Combine(images.data(), corners.data(), 4, &combined))
         fail("images cannot be combined");
+    //! [combine]
     const Picture result(combined);
     const std::string bits = std::to_string(combined.bpp) + " bits a pixel";
     if (combined.bpp == 32) {
@@ -67,11 +69,13 @@ void addCombined(Sheet &sheet, const Picture &photo, int32_t gap, const std::str
 }
 
 Picture cutAndScaled(const Picture &photo, const Rect &part, int32_t width, int32_t height) {
+    //! [cropAndScale]
     ImageInfo result = {};
     if (!ImageUtil_CropAndScaleImage(&photo.info(), part.left, part.top, part.right, part.bottom, 0,
                                      0, width, height, &result))
         fail("a part cannot be scaled");
     return Picture(result);
+    //! [cropAndScale]
 }
 
 // Scaled to a longest side.

@@ -55,9 +55,11 @@ std::vector<uint32_t> paletteOf(int32_t depth) {
 Picture throughLayout(const Picture &picture, const Layout &layout) {
     const uint32_t width = picture.info().width, height = picture.info().height;
     const uint32_t step = width * static_cast<uint32_t>(layout.bytes);
+    //! [convert]
     std::vector<uint8_t> surface(size_t{step} * height);
     Raster_ConvertPixelsFrom32(surface.data(), step, layout.depth, picture.data(),
                                picture.info().bytesPerLine, 0, 0, 0, 0, width, height);
+    //! [convert]
 
     const bool indices = layout.bytes == 1;
     std::vector<uint32_t> palette;

@@ -108,8 +108,10 @@ void paste(Picture &ground, const Picture &top, int32_t x, int32_t y) {
 
 void blend(Picture &ground, const Picture &top, int32_t x, int32_t y) {
     checkInside(ground, x, y, top.width(), top.height());
+    //! [blend]
     Raster_AlphaBlendOver(ground.data(), natural(x), natural(y), ground.step(), top.data(), 0, 0,
                           top.step(), top.info().width, top.info().height);
+    //! [blend]
 }
 
 Picture premultiplied(const Picture &picture) {
@@ -130,16 +132,20 @@ int32_t textWidth(std::string_view text) {
 void write(Picture &ground, int32_t x, int32_t y, std::string_view text, uint32_t ink,
            uint32_t paper) {
     checkInside(ground, x, y, textWidth(text), kGlyphHeight);
+    //! [text]
     const auto step = static_cast<int32_t>(text.size());
     Raster_BitsToPixels(bitmapOf(text).data(), step, ground.at(x, y), ground.step(), 4,
                         textWidth(text), kGlyphHeight, ink, paper);
+    //! [text]
 }
 
 void stencil(Picture &ground, int32_t x, int32_t y, std::string_view text, uint32_t ink) {
     checkInside(ground, x, y, textWidth(text), kGlyphHeight);
     const auto step = static_cast<int32_t>(text.size());
+    //! [stencil]
     Raster_BitsToPixelsStencil(bitmapOf(text).data(), step, ground.at(x, y), ground.step(), 4,
                                textWidth(text), kGlyphHeight, ink);
+    //! [stencil]
 }
 
 Picture copyOf(const Picture &source) {

@@ -11,6 +11,7 @@ constexpr int32_t kWidth = 168, kHeight = 128;
 // The entries of a list, and the rectangle that was last added or cut.
 Picture drawn(const RasterRectList &list, const Rect &last, uint32_t colour) {
     Picture picture = blank(kWidth, kHeight, kPale);
+    //! [regionWalk]
     for (const RasterRectListEntry &entry : list.entries) {
         if (entry.width < 1)
             break;
@@ -18,6 +19,7 @@ Picture drawn(const RasterRectList &list, const Rect &last, uint32_t colour) {
         fill(picture, part, 0xFF9CC5DC);
         outline(picture, part, kBlue);
     }
+    //! [regionWalk]
     outline(picture, last, colour, 2);
     return picture;
 }
@@ -80,10 +82,12 @@ void showRegions(Page &page) {
               "the region becomes the box around it.");
 
     // Which part of a source is seen in a clip, and where that goes in a target.
+    //! [rect]
     const Rect source = area(20, 20, 96, 72), clip = area(72, 48, 80, 64);
     const Rect target = area(24, 12, 120, 104);
     Rect seen, goes;
     Rect_IntersectPair(&seen, &source, &clip, &goes, &target);
+    //! [rect]
     Picture left = blank(kWidth, kHeight, kPale), right = blank(kWidth, kHeight, kPale);
     fill(left, seen, 0xFF9CC5DC);
     outline(left, source, kBlue);

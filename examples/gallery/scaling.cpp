@@ -13,12 +13,14 @@ enum Filter : uint32_t { kNearest = 0, kFiltered = 1 };
 Picture scaled(const Picture &source, int32_t width, int32_t height, Filter filter) {
     Picture result = blank(width, height, 0);
     const Rect all = result.bounds();
+    //! [scale]
     if (!Raster_Scale(result.data(), result.step(), result.info().width, result.info().height,
                       all.left, all.top, all.right, all.bottom, source.data(), source.step(),
                       source.info().width, source.info().height,
                       static_cast<double>(width) / source.width(),
                       static_cast<double>(height) / source.height(), filter))
         fail("a picture cannot be scaled");
+    //! [scale]
     return result;
 }
 
@@ -52,9 +54,11 @@ void addDamage(Sheet &sheet, const Picture &source, int32_t factor) {
     Rect part = area(source.width() / 2 - 6, source.height() / 2 - 4, 8, 6);
     Picture small = copyOf(source);
     fill(small, part, kOrange);
+    //! [scaleDamage]
     Picture large = scaled(small, source.width() * factor, source.height() * factor, kFiltered);
     Raster_ScaleSrcCoordinates(&part, source.info().width, source.info().height, factor, factor);
     outline(large, part, kWhite);
+    //! [scaleDamage]
     sheet.add(zoomed(small, factor), "8 by 6 pixels have changed");
     sheet.add(std::move(large), "what to scale again, outlined");
 }

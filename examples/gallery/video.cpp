@@ -72,8 +72,10 @@ Frame planarFrame(const Picture &picture) {
 
 Picture converted(const Frame &frame, uint32_t format, int32_t depth) {
     const auto bytes = static_cast<uint32_t>((depth + 7) / 8);
+    //! [video]
     std::vector<uint8_t> pixels(size_t{kWidth} * kHeight * bytes);
     Raster_YUVtoRGB(frame.data(), pixels.data(), kWidth, kHeight, format, depth);
+    //! [video]
     // Depth 15 comes out one bit higher than the other functions have it.
     for (size_t i = 0; depth == 15 && i < pixels.size(); i += 2) {
         uint16_t pixel = 0;
@@ -162,10 +164,12 @@ void showColorKey(Page &page, const Material &material) {
     const Picture background = desktop(screen);
     const Picture film = covering(material.photo, 240, 160);
     Picture result = copyOf(background);
+    //! [colorKey]
     Raster_ApplyColorKey(background.data(), result.data(), film.data(), background.data(),
                          background.step(), result.step(), film.step(), background.step(),
                          kKey & 0xFFFFFF, natural(screen.left), natural(screen.top),
                          film.info().width, film.info().height, 32);
+    //! [colorKey]
     Sheet sheet(2);
     sheet.add(copyOf(background), "the desktop, with the key in magenta");
     sheet.add(std::move(result), "with the film in its place");
