@@ -326,9 +326,11 @@ QUILLON_API bool ImageUtil_Combine(const ImageInfo *images, const RectPoint *pos
 
 /** Cuts a rectangle, the crop, out of a 32-bit image and scales it.
  *
- * Scaling is filtered, see Raster_Scale.  Without an output size the crop keeps its size;
- * with a width or a height alone, the other one is in proportion, truncated, with the
- * product taken modulo 2^32.
+ * Scaling is filtered, see Raster_Scale: where the width shrinks, the last column comes out
+ * dark (white at half the size as 126), alpha included, and a height that shrinks by more
+ * than 32 does as a whole.  Surface::copyScaled of quillon.hpp avoids both.  Without an output size
+ * the crop keeps its size; with a width or a height alone, the other one is in proportion,
+ * truncated, with the product taken modulo 2^32.
  *
  * @param src                  taken to have 32 bits per pixel, whatever its bpp; only
  *                             read; with a crop as wide as the image that is not scaled,

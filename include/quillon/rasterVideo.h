@@ -42,9 +42,12 @@ typedef enum RasterVideoFormat {
  *     mid  = (298 * c - 208 * (U - 128) - 100 * (V - 128) + 128) >> 8
  *     high = (298 * c + 516 * (V - 128) + 128) >> 8
  *
- * Compared with RasterRGB_YUVtoBGRX, U and V are exchanged.  A frame with U and V
- * exchanged gives the colours of that function, but rounded, with red in the low field and
- * blue in the high one.
+ * **U and V are exchanged**, compared with RasterRGB_YUVtoBGRX and with other programs: red,
+ * (81, 90, 240), gives high 255, mid 63, low 15.  A frame with U and V exchanged gives the
+ * right colours, those of that function but rounded, with red in the low field and blue in
+ * the high one.  So for right colours pass I420 as YV12, YVYU as YUY2 and VYUY as UYVY, and
+ * take the output for R G B; or exchange red and blue of it.  Surface::copyVideo of
+ * quillon.hpp has the right colours for each format.
  *
  * | bppdepth | bytes | high   | mid    | low    | rest                 |
  * |----------|-------|--------|--------|--------|----------------------|
