@@ -6,10 +6,10 @@
 //
 //     c++ -std=c++20 thumbnail.cpp $(pkg-config --cflags --libs quillon)
 
-#include <quillon/imageUtil.h>
-#include <quillon/raster.h>
+#include <quillon/quillon.hpp>
 #include <quillon/version.h>
 
+#include <algorithm>
 #include <array>
 #include <cerrno>
 #include <charconv>
@@ -17,7 +17,6 @@
 #include <cstdlib>
 #include <cstring>
 #include <getopt.h>
-#include <new>
 #include <optional>
 #include <stdexcept>
 #include <string>
@@ -34,8 +33,8 @@ constexpr char kUsage[] =
     "\n"
     "Cuts and scales a PNG picture.  The name of the output tells its format.\n"
     "\n"
-    "  --width W      pixels per row of the output, 1 to 32767\n"
-    "  --height H     rows of the output, 1 to 32767\n"
+    "  --width W      pixels per row of the output, 1 to 32766\n"
+    "  --height H     rows of the output, 1 to 32766\n"
     "                 With only one of them given the other follows by proportion;\n"
     "                 with none the picture keeps its size.\n"
     "  --crop X,Y,WxH take W by H pixels from column X, row Y on; the whole picture\n"
@@ -46,12 +45,8 @@ constexpr char kUsage[] =
     "A PNG output has alpha when any pixel of the input is not opaque.\n"
     "Colour and palette files are read, grey ones are not.\n";
 
-constexpr int32_t kMaxSide = 32767; // what the scaler takes
-constexpr int32_t kNotGiven = -1;   // as the library has it
-
-struct Crop {
-    int32_t x, y, width, height;
-};
+constexpr int32_t kMaxSide = 32766; // what the scaler takes
+constexpr int32_t kNotGiven = -1;
 
 struct Request {
     std::string input;
@@ -59,15 +54,7 @@ struct Request {
     bool isBmp = false;
     int32_t width = kNotGiven;
     int32_t height = kNotGiven;
-    std::optional<Crop> crop;
-};
-
-// An image record that gives its pixels back.
-struct Image : ImageInfo {
-    Image() { static_cast<ImageInfo &>(*this) = ImageInfo{}; }
-    Image(const Image &) = delete;
-    Image &operator=(const Image &) = delete;
-    ~Image() { ImageUtil_FreeImageData(this); }
+    std::optional<quillon::Rect> crop;
 };
 
 // Takes a decimal number off the front of text.
@@ -92,14 +79,14 @@ int32_t parseSide(const char *option, std::string_view text) {
     return side;
 }
 
-Crop parseCrop(std::string_view text) {
-    Crop crop = {};
-    if (!takeNumber(text, 0, crop.x) || !takeMark(text, ',') || !takeNumber(text, 0, crop.y) ||
-        !takeMark(text, ',') || !takeNumber(text, 1, crop.width) || !takeMark(text, 'x') ||
-        !takeNumber(text, 1, crop.height) || !text.empty()) {
+quillon::Rect parseCrop(std::string_view text) {
+    int32_t x = 0, y = 0, width = 0, height = 0;
+    if (!takeNumber(text, 0, x) || !takeMark(text, ',') || !takeNumber(text, 0, y) ||
+        !takeMark(text, ',') || !takeNumber(text, 1, width) || !takeMark(text, 'x') ||
+        !takeNumber(text, 1, height) || !text.empty()) {
         throw std::runtime_error("--crop takes X,Y,WxH in whole pixels, for example 10,20,300x200");
     }
-    return crop;
+    return {x, y, width, height};
 }
 
 bool endsWith(const std::string &text, const char *ending) {
@@ -154,49 +141,25 @@ std::optional<Request> parseArguments(int argc, char **argv) {
     return request;
 }
 
-// Expands a palette image to opaque 32-bit pixels.
-void expandPalette(const Image &indexed, Image &colored) {
-    std::array<uint32_t, 256> palette = {};
-    for (size_t i = 0; i < palette.size(); ++i) {
-        const ImageUtilColor &color = indexed.palette[i];
-        palette[i] =
-            0xFF000000u | uint32_t{color.red} << 16 | uint32_t{color.green} << 8 | color.blue;
-    }
-    colored.width = indexed.width;
-    colored.height = indexed.height;
-    colored.depth = 24;
-    colored.bpp = 32;
-    colored.bytesPerLine = indexed.width * 4;
-    colored.data = static_cast<uint8_t *>(std::calloc(indexed.height, colored.bytesPerLine));
-    if (colored.data == nullptr) {
-        throw std::bad_alloc();
-    }
-    Raster_ConvertIndexTo32(colored.data, colored.bytesPerLine, indexed.data, indexed.bytesPerLine,
-                            palette.data(), 0, 0, 0, 0, indexed.width, indexed.height);
-}
-
-// Reads the input as 32-bit pixels, which is what the scaler takes.
-void readInput(const Request &request, Image &picture) {
+// Reads the input, with colours multiplied by their alpha: only so are the edges of
+// what is transparent scaled right.
+quillon::Image readInput(const Request &request) {
     if (access(request.input.c_str(), R_OK) != 0) {
         throw std::runtime_error(request.input + ": " + std::generic_category().message(errno));
     }
-    Image read;
-    if (!ImageUtil_ReadPNG(&read, request.input.c_str(),
-                           IMAGEUTIL_READ_KEEP_ALPHA | IMAGEUTIL_READ_ADD_ALPHA)) {
+    std::optional<quillon::Image> picture = quillon::Image::readPng(request.input.c_str());
+    if (!picture) {
         throw std::runtime_error(request.input + ": not a whole PNG picture in colour");
     }
-    if (read.bpp == 8) {
-        expandPalette(read, picture);
-    } else {
-        std::swap<ImageInfo>(read, picture);
-    }
+    picture->premultiply();
+    return std::move(*picture);
 }
 
-bool isOpaque(const Image &picture) {
-    for (uint32_t y = 0; y < picture.height; ++y) {
-        const uint8_t *const row = picture.data + size_t{y} * picture.bytesPerLine;
-        for (uint32_t x = 0; x < picture.width; ++x) {
-            if (row[size_t{x} * 4 + 3] != 255) {
+bool isOpaque(const quillon::Image &picture) {
+    for (int32_t y = 0; y < picture.height(); ++y) {
+        const uint8_t *const row = picture.row(y);
+        for (std::ptrdiff_t x = 0; x < picture.width(); ++x) {
+            if (row[4 * x + 3] != 255) {
                 return false;
             }
         }
@@ -204,28 +167,45 @@ bool isOpaque(const Image &picture) {
     return true;
 }
 
-void cropAndScale(const Request &request, const Image &picture, Image &thumbnail) {
-    Rect part = {0, 0, kNotGiven, kNotGiven};
-    if (request.crop) {
-        Rect_SetFromXYWH(&part, request.crop->x, request.crop->y, request.crop->width,
-                         request.crop->height);
+// The size of the output; a side that is not given follows by proportion.
+quillon::Size outputSize(const Request &request, quillon::Size part) {
+    const auto scaled = [](int32_t side, int32_t from, int32_t to) {
+        return static_cast<int32_t>(std::clamp<int64_t>(int64_t{side} * to / from, 1, INT32_MAX));
+    };
+    if (request.width == kNotGiven && request.height == kNotGiven) {
+        return part;
     }
-    if (!ImageUtil_CropAndScaleImage(&picture, part.left, part.top, part.right, part.bottom, 0, 0,
-                                     request.width, request.height, &thumbnail)) {
-        throw std::runtime_error("a picture of " + std::to_string(picture.width) + " by " +
-                                 std::to_string(picture.height) +
+    if (request.height == kNotGiven) {
+        return {request.width, scaled(part.height, part.width, request.width)};
+    }
+    if (request.width == kNotGiven) {
+        return {scaled(part.width, part.height, request.height), request.height};
+    }
+    return {request.width, request.height};
+}
+
+quillon::Image cropAndScale(const Request &request, quillon::Image &picture) {
+    const quillon::Rect part = request.crop.value_or(picture.bounds());
+    const quillon::Size size = outputSize(request, part.size());
+    std::optional<quillon::Image> thumbnail;
+    if (picture.bounds().contains(part)) {
+        thumbnail = quillon::Image::create(size);
+    }
+    if (!thumbnail || !thumbnail->copyScaled(thumbnail->bounds(), picture.part(part))) {
+        throw std::runtime_error("a picture of " + std::to_string(picture.width()) + " by " +
+                                 std::to_string(picture.height()) +
                                  " cannot be cut and scaled like this");
     }
+    thumbnail->unpremultiply();
+    return std::move(*thumbnail);
 }
 
 // Writes beside the target and renames, so that the target is the whole picture
 // or what it was before.
-void writeOutput(const Request &request, const Image &thumbnail, bool keepAlpha) {
+void writeOutput(const Request &request, const quillon::Image &thumbnail, quillon::Alpha alpha) {
     const std::string part = request.output + ".part" + std::to_string(getpid());
-    const ImageUtilPngOptions options = {.compressionLevel = -1, .stripAlpha = !keepAlpha};
     const bool isWritten =
-        request.isBmp ? ImageUtil_WriteImage(&thumbnail, part.c_str(), IMAGEUTIL_FORMAT_BMP)
-                      : ImageUtil_WritePNG(&thumbnail, part.c_str(), &options);
+        request.isBmp ? thumbnail.writeBmp(part.c_str()) : thumbnail.writePng(part.c_str(), alpha);
     if (!isWritten) {
         std::remove(part.c_str());
         throw std::runtime_error(request.output + ": cannot be written");
@@ -238,11 +218,9 @@ void writeOutput(const Request &request, const Image &thumbnail, bool keepAlpha)
 }
 
 void run(const Request &request) {
-    Image picture;
-    readInput(request, picture);
-    Image thumbnail;
-    cropAndScale(request, picture, thumbnail);
-    writeOutput(request, thumbnail, !isOpaque(picture));
+    quillon::Image picture = readInput(request);
+    const quillon::Alpha alpha = isOpaque(picture) ? quillon::Alpha::kDrop : quillon::Alpha::kKeep;
+    writeOutput(request, cropAndScale(request, picture), alpha);
 }
 
 } // namespace

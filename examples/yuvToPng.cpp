@@ -1,17 +1,18 @@
 // yuvToPng: turns one raw video frame into a PNG picture.
 //
-//     yuvToPng IN.yuv WIDTH HEIGHT {YUY2|UYVY|YV12} OUT.png
+//     yuvToPng IN.yuv WIDTH HEIGHT FORMAT OUT.png
+//
+// FORMAT is I420 (yuv420p of ffmpeg), YV12, NV12, YUY2, UYVY, YVYU or VYUY.
 //
 //     c++ -std=c++17 yuvToPng.cpp $(pkg-config --cflags --libs quillon)
-#include <quillon/imageUtil.h>
-#include <quillon/raster.h>
+#include <quillon/quillon.hpp>
 
-#include <algorithm>
 #include <charconv>
 #include <cstdio>
 #include <exception>
 #include <filesystem>
 #include <fstream>
+#include <optional>
 #include <stdexcept>
 #include <string>
 #include <string_view>
@@ -21,9 +22,11 @@
 
 namespace {
 
-uint32_t parseSide(const char *what, std::string_view text) {
-    constexpr uint32_t kMaxSide = 16384; // so that no count of bytes passes 32 bits
-    uint32_t side = 0;
+constexpr char kFormatNames[] = "I420, YV12, NV12, YUY2, UYVY, YVYU or VYUY";
+
+int32_t parseSide(const char *what, std::string_view text) {
+    constexpr int32_t kMaxSide = 16384;
+    int32_t side = 0;
     const char *const last = text.data() + text.size();
     const auto [end, error] = std::from_chars(text.data(), last, side);
     if (error != std::errc{} || end != last || side < 1 || side > kMaxSide)
@@ -32,20 +35,22 @@ uint32_t parseSide(const char *what, std::string_view text) {
     return side;
 }
 
-uint32_t parseFormat(std::string_view text) {
-    if (text == "YUY2")
-        return RASTER_VIDEO_YUY2;
-    if (text == "UYVY")
-        return RASTER_VIDEO_UYVY;
-    if (text == "YV12")
-        return RASTER_VIDEO_YV12;
-    throw std::runtime_error("the format must be YUY2, UYVY or YV12, not '" + std::string(text) +
-                             "'");
+quillon::VideoFormat parseFormat(std::string_view text) {
+    using quillon::VideoFormat;
+    static const std::pair<std::string_view, VideoFormat> kFormats[] = {
+        {"I420", VideoFormat::kI420}, {"YV12", VideoFormat::kYv12}, {"NV12", VideoFormat::kNv12},
+        {"YUY2", VideoFormat::kYuy2}, {"UYVY", VideoFormat::kUyvy}, {"YVYU", VideoFormat::kYvyu},
+        {"VYUY", VideoFormat::kVyuy}};
+    for (const auto &[name, format] : kFormats)
+        if (text == name)
+            return format;
+    throw std::runtime_error("the format must be " + std::string(kFormatNames) + ", not '" +
+                             std::string(text) + "'");
 }
 
 // Reads a file that must have just the given size: a raw frame does not tell its
 // own, so this is the only sign of a wrong width, height or format.
-std::vector<uint8_t> readFrame(const std::string &fileName, size_t size) {
+std::vector<uint8_t> readFrame(const std::string &fileName, uint64_t size) {
     std::error_code error;
     const auto found = std::filesystem::file_size(fileName, error);
     if (error)
@@ -60,49 +65,18 @@ std::vector<uint8_t> readFrame(const std::string &fileName, size_t size) {
     return frame;
 }
 
-// The conversion takes U for V and V for U.  So it is given them exchanged, and
-// then has the right colours, with red in the place of blue.
-void exchangeChroma(std::vector<uint8_t> &frame, uint32_t format, size_t pixels) {
-    if (format == RASTER_VIDEO_YV12) {
-        const auto v = frame.begin() + static_cast<std::ptrdiff_t>(pixels);
-        const auto u = v + static_cast<std::ptrdiff_t>(pixels / 4);
-        std::swap_ranges(v, u, u);
-        return;
-    }
-    const size_t first = format == RASTER_VIDEO_YUY2 ? 1 : 0; // Y U Y V, or U Y V Y
-    for (size_t i = first; i < frame.size(); i += 4)
-        std::swap(frame[i], frame[i + 2]);
-}
-
 void run(char **arguments) {
-    const uint32_t width = parseSide("the width", arguments[1]);
-    const uint32_t height = parseSide("the height", arguments[2]);
-    const uint32_t format = parseFormat(arguments[3]);
+    const quillon::Size size = {parseSide("the width", arguments[1]),
+                                parseSide("the height", arguments[2])};
+    const quillon::VideoFormat format = parseFormat(arguments[3]);
+    const std::vector<uint8_t> frame =
+        readFrame(arguments[0], quillon::VideoFrame::byteCount(format, size));
 
-    // Frames are stored with even sides, but for the height of the packed formats.
-    // All of what is stored is converted, and the picture cut from it: told an odd
-    // width, the conversion would leave out the last column of YV12, and take the
-    // padding of a packed row for the first pixel of the next one.
-    const uint32_t storedWidth = width + width % 2;
-    const uint32_t storedHeight = format == RASTER_VIDEO_YV12 ? height + height % 2 : height;
-    const size_t pixels = size_t{storedWidth} * storedHeight;
-    std::vector<uint8_t> frame =
-        readFrame(arguments[0], format == RASTER_VIDEO_YV12 ? pixels / 2 * 3 : pixels * 2);
-
-    exchangeChroma(frame, format, pixels);
-    std::vector<uint8_t> colors(pixels * 3);
-    Raster_YUVtoRGB(frame.data(), colors.data(), storedWidth, storedHeight, format, 24);
-    for (size_t i = 0; i < colors.size(); i += 3)
-        std::swap(colors[i], colors[i + 2]);
-
-    ImageInfo image = {}; // the pixels stay the vector's, so there is nothing to free
-    image.width = width;
-    image.height = height;
-    image.depth = 24;
-    image.bpp = 24;
-    image.bytesPerLine = storedWidth * 3; // skips what is only stored
-    image.data = colors.data();
-    if (!ImageUtil_WriteImage(&image, arguments[4], IMAGEUTIL_FORMAT_PNG))
+    std::optional<quillon::Image> picture = quillon::Image::create(size, quillon::Format::kBgr24);
+    if (!picture)
+        throw std::runtime_error("there is no memory for a picture of this size");
+    picture->copyVideo({0, 0}, quillon::VideoFrame(frame.data(), format, size));
+    if (!picture->writePng(arguments[4]))
         throw std::runtime_error(std::string(arguments[4]) + ": cannot be written");
 }
 
@@ -111,7 +85,9 @@ void run(char **arguments) {
 int main(int argc, char **argv) {
     try {
         if (argc != 6)
-            throw std::runtime_error("usage: IN.yuv WIDTH HEIGHT {YUY2|UYVY|YV12} OUT.png");
+            throw std::runtime_error("usage: IN.yuv WIDTH HEIGHT FORMAT OUT.png, where FORMAT "
+                                     "is " +
+                                     std::string(kFormatNames));
         run(argv + 1);
         return 0;
     } catch (const std::exception &problem) {

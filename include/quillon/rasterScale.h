@@ -23,7 +23,7 @@ QUILLON_BEGIN_DECLS
  *
  * The arithmetic is integer and gives the same result on every processor.  Weights have 8
  * bits and products are truncated, so an interpolated or averaged value can be some levels
- * low: white came out as 246 at the lowest that was seen.
+ * low: white can become 249.
  *
  * **Dark right edge.**  Where the width shrinks, the last source column enters no average,
  * so the last destination column is darker, alpha included, by the share that it should have
