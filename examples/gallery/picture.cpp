@@ -1,6 +1,8 @@
 #include "picture.h"
 #include "font.h"
 
+#include <quillon/quillon.hpp>
+
 #include <algorithm>
 #include <cstdlib>
 #include <stdexcept>
@@ -164,16 +166,13 @@ Picture partOf(const Picture &source, const Rect &part) {
 }
 
 Picture resized(const Picture &source, int32_t width, int32_t height) {
-    // An average takes 32 rows in at most, so larger reductions go in steps.
-    constexpr int32_t kStep = 16;
-    if (source.width() > width * kStep || source.height() > height * kStep)
-        return resized(resized(source, std::max(width, (source.width() - 1) / kStep + 1),
-                               std::max(height, (source.height() - 1) / kStep + 1)),
-                       width, height);
-    ImageInfo result = {};
-    if (!ImageUtil_CropAndScaleImage(&source.info(), 0, 0, -1, -1, 0, 0, width, height, &result))
+    Picture result = blank(width, height, 0);
+    const quillon::ConstSurface from(source.data(), source.step(),
+                                     {source.width(), source.height()}, quillon::Format::kBgra32);
+    quillon::Surface to(result.data(), result.step(), {width, height}, quillon::Format::kBgra32);
+    if (!to.copyScaled(to.bounds(), from))
         fail("a picture cannot be scaled");
-    return Picture(result);
+    return result;
 }
 
 Picture zoomed(const Picture &source, int32_t factor) {
@@ -194,13 +193,12 @@ Rect subject(const Picture &source, int32_t width, int32_t height) {
 }
 
 Picture covering(const Picture &source, int32_t width, int32_t height) {
+    constexpr int64_t kMost = 32766; // that can be scaled
     const int64_t wide = int64_t{source.height()} * width / height;
     const int64_t high = int64_t{source.width()} * height / width;
-    const Rect part = subject(source, static_cast<int32_t>(std::clamp<int64_t>(wide, 1, 32767)),
-                              static_cast<int32_t>(std::clamp<int64_t>(high, 1, 32767)));
-    // A reduction leaves the last column of its source out, and so darkens the last
-    // one of its result: one more is made, and cut off.
-    return partOf(resized(partOf(source, part), width + 1, height), area(0, 0, width, height));
+    const Rect part = subject(source, static_cast<int32_t>(std::clamp<int64_t>(wide, 1, kMost)),
+                              static_cast<int32_t>(std::clamp<int64_t>(high, 1, kMost)));
+    return resized(partOf(source, part), width, height);
 }
 
 } // namespace gallery

@@ -10,15 +10,27 @@ namespace {
 
 enum Filter : uint32_t { kNearest = 0, kFiltered = 1 };
 
-Picture scaled(const Picture &source, int32_t width, int32_t height, Filter filter) {
+// With its last column once more.
+Picture widened(const Picture &source) {
+    Picture wide = blank(source.width() + 1, source.height(), 0);
+    paste(wide, source, 1, 0);
+    paste(wide, source, 0, 0);
+    return wide;
+}
+
+Picture scaled(const Picture &picture, int32_t width, int32_t height, Filter filter) {
     Picture result = blank(width, height, 0);
     const Rect all = result.bounds();
     //! [scale]
+    // A reduction leaves the last column of its source out, so it gets one more, and the
+    // factors of the picture without that.
+    const bool isReduced = filter == kFiltered && width < picture.width();
+    const Picture source = isReduced ? widened(picture) : copyOf(picture);
     if (!Raster_Scale(result.data(), result.step(), result.info().width, result.info().height,
                       all.left, all.top, all.right, all.bottom, source.data(), source.step(),
                       source.info().width, source.info().height,
-                      static_cast<double>(width) / source.width(),
-                      static_cast<double>(height) / source.height(), filter))
+                      static_cast<double>(width) / picture.width(),
+                      static_cast<double>(height) / picture.height(), filter))
         fail("a picture cannot be scaled");
     //! [scale]
     return result;
@@ -88,9 +100,9 @@ void showScaling(Page &page, const Material &material) {
     addReductions(down, covering(material.photo, 896, 608), 224, 152);
     page.show(down.drawn(), "scale-down",
               "Reduced, and shown with each pixel as a square. Nearest samples invent patterns "
-              "where the spokes are finer than the pixels; averages turn them grey. The column at "
-              "the right edge is darker, as a reduction leaves the last one of the source out of "
-              "its averages.");
+              "where the spokes are finer than the pixels; averages turn them grey. Averages leave "
+              "the last column of their source out, which would darken the right edge: the source "
+              "has been handed over with that column twice.");
 }
 
 } // namespace gallery
