@@ -21,8 +21,6 @@ extern "C" int LLVMFuzzerTestOneInput(const uint8_t *data, size_t size) {
     Input input(data, size);
     chooseTarget(input.byte());
     const InputImage image(input);
-    if (isUnwieldy(uint64_t{image.info.width} * image.info.height * 3))
-        return 0;
     DynBuf file = {};
     try {
         if (ImageUtil_ConstructBMPBuffer(&image.info, &file)) {

@@ -3,30 +3,9 @@
 
 #include "imageInput.h"
 
-#include <algorithm>
 #include <memory>
 
 using namespace quillon::fuzz;
-
-namespace {
-
-// Of the box around all images, roughly.
-uint64_t canvasBytes(const std::vector<ImageInfo> &images,
-                     const std::vector<RectPoint> &positions) {
-    int64_t left = INT32_MAX, top = INT32_MAX, right = INT32_MIN, bottom = INT32_MIN;
-    for (size_t i = 0; i < images.size(); ++i) {
-        left = std::min<int64_t>(left, positions[i].x);
-        top = std::min<int64_t>(top, positions[i].y);
-        right = std::max(right, positions[i].x + int64_t{images[i].width});
-        bottom = std::max(bottom, positions[i].y + int64_t{images[i].height});
-    }
-    const auto extent = [](int64_t low, int64_t high) {
-        return static_cast<uint64_t>(std::clamp<int64_t>(high - low, 0, INT32_MAX));
-    };
-    return extent(left, right) * extent(top, bottom) * 4;
-}
-
-} // namespace
 
 extern "C" int LLVMFuzzerTestOneInput(const uint8_t *data, size_t size) {
     Input input(data, size);
@@ -49,8 +28,6 @@ extern "C" int LLVMFuzzerTestOneInput(const uint8_t *data, size_t size) {
         images.back().depth = images[0].depth;
         images.back().bpp = images[0].bpp;
     }
-    if (isUnwieldy(canvasBytes(images, positions)))
-        return 0;
     ImageInfo canvas = {};
     try {
         if (ImageUtil_Combine(images.data(), positions.data(), count, &canvas)) {

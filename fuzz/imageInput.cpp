@@ -86,8 +86,9 @@ void Panic(const char *format, ...) {
 
 void Warning(const char * /*format*/, ...) {}
 
+// A few bytes can ask for gigabytes of a canvas or a file.
 extern "C" const char *__asan_default_options() {
-    return "allocator_may_return_null=1";
+    return "allocator_may_return_null=1:max_allocation_size_mb=64";
 }
 
 extern "C" int LLVMFuzzerInitialize(int * /*argc*/, char *** /*argv*/) {

@@ -56,11 +56,6 @@ private:
 // Has the library use one of the processor's instruction sets.
 void chooseTarget(uint32_t number);
 
-// Whether a block is too large for a fuzzer, and not so large that it cannot be had.
-constexpr bool isUnwieldy(uint64_t bytes) {
-    return bytes > 16 * kMostBytes && bytes < uint64_t{1} << 41;
-}
-
 // Ends the program with a finding unless isTrue.
 void require(bool isTrue);
 

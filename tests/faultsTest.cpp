@@ -21,9 +21,11 @@
 
 using namespace quillon::test;
 
-namespace {
+// --- Files; not under a sanitizer, which has such functions of its own
 
-// --- Files
+#if !defined(QUILLON_SANITIZED)
+
+namespace {
 
 enum class Fault { kError, kInterrupted, kShort, kNothing };
 
@@ -87,8 +89,7 @@ bool isHard(Fault kind) {
 
 } // namespace
 
-// In the place of the system's; not under a sanitizer, which has its own.
-#if !defined(QUILLON_SANITIZED)
+// In the place of the system's.
 extern "C" {
 
 int open(const char *name, int flags, ...) {

@@ -229,7 +229,7 @@ TEST(ImageBroken, BrokenFilesAreReadAsByLibpngAlone) {
                 breakChunks(broken, random, chunks);
                 for (const uint32_t size :
                      {0u, 1u, 7u, 65536u, 400000u, 1000001u, 0x7FFFFFFFu, 0x80000000u, 0xFFFFFFFFu})
-                    for (const size_t field : {16, 20})
+                    for (const uint32_t field : {16u, 20u})
                         sizes.check(
                             kPngSignature +
                             withRightSum(
