@@ -31,8 +31,9 @@ void giveBack(png_structp, void *block) {
 }
 
 struct Reading {
+    Reading() { std::memset(&image, 0, sizeof image); } // its padding, too
     ~Reading() { png_destroy_read_struct(&png, &info, nullptr); }
-    ImageInfo image = {};
+    ImageInfo image;
     ImageUtilPngReadState state = {};
     png_structp png = png_create_read_struct_2(PNG_LIBPNG_VER_STRING, nullptr, nullptr, nullptr,
                                                nullptr, takeBlock, giveBack);
@@ -97,12 +98,12 @@ bool readByLibpng(Reading &reading, const Bytes &file, uint32_t flags) {
 // How many files there were, and what became of them.
 struct Tally {
     uint32_t files = 0, read = 0, refusedWithPixels = 0;
+    const FencedBuffer memory{kMega}; // the files' own
 
     void check(const Bytes &file) {
         const uint32_t flags = files++ % 8;
         Reading expected;
         const bool isExpected = readByLibpng(expected, file, flags);
-        static const FencedBuffer memory(kMega);
         uint8_t *const fenced = memory.end() - file.size();
         std::copy(file.begin(), file.end(), fenced);
         ImageInfo image;
