@@ -1,6 +1,7 @@
 #include "page.h"
 
 #include <fstream>
+#include <regex>
 
 namespace gallery {
 
@@ -27,6 +28,9 @@ nav a { padding: .15rem .75rem; border: 1px solid var(--line); border-radius: 1r
 nav a:hover { border-color: var(--blue) }
 figure { margin: 1rem 0; padding: 1.25rem; border: 1px solid var(--line); border-radius: .5rem;
          background: #fff; overflow-x: auto }
+.wide::before { display: none; position: sticky; left: 0; margin-bottom: .5rem; color: var(--soft);
+                font-size: .925rem; content: "Goes on to the right \2192" }
+@media (max-width: 46rem) { .wide::before { display: block } }
 figure a { display: block }
 img { display: block; max-width: 100%; height: auto }
 figcaption { position: sticky; left: 0; max-width: 46rem; margin-top: .9rem; color: var(--soft);
@@ -59,6 +63,14 @@ std::string markup(const std::string &text) {
     return html;
 }
 
+// The first sentence of a caption, for those who do not see the picture.
+std::string alternative(const std::string &caption) {
+    std::string text;
+    for (const char c : markup(caption.substr(0, caption.find(". "))))
+        text += c == '"' ? '\'' : c;
+    return std::regex_replace(text, std::regex("</?code>"), "");
+}
+
 } // namespace
 
 void Page::room(const std::string &title, const std::string &text) {
@@ -75,8 +87,10 @@ void Page::show(const Picture &picture, const std::string &name, const std::stri
     const std::string size = " width=\"" + std::to_string(picture.width()) + "\" height=\"" +
                              std::to_string(picture.height()) + "\" style=\"min-width: min(" +
                              std::to_string(picture.width()) + "px, 40rem)\"";
-    body += "<figure><a href=\"" + fileName + "\"><img src=\"" + fileName + "\" alt=\"" + name +
-            "\"" + size + "></a>\n<figcaption>" + markup(caption) + "</figcaption></figure>\n";
+    const char *const figure = picture.width() > 480 ? "<figure class=\"wide\">" : "<figure>";
+    body += std::string(figure) + "<a href=\"" + fileName + "\"><img src=\"" + fileName +
+            "\" alt=\"" + alternative(caption) + "\"" + size + "></a>\n<figcaption>" +
+            markup(caption) + "</figcaption></figure>\n";
 }
 
 void Page::link(const Picture &picture, const std::string &fileName) {

@@ -36,7 +36,7 @@ constexpr int32_t saturate(int64_t value) {
 
 /** A pixel position, or the offset between two. */
 struct Point : ::RectPoint {
-    constexpr Point() : ::RectPoint{0, 0} {}
+    constexpr Point() : ::RectPoint() {}
     constexpr Point(int32_t column, int32_t row) : ::RectPoint{column, row} {}
     constexpr Point(const ::RectPoint &point) : ::RectPoint(point) {}
 
@@ -71,7 +71,7 @@ struct Size {
  */
 struct Rect : ::Rect {
     /** The empty rectangle, all zero. */
-    constexpr Rect() : ::Rect{0, 0, 0, 0} {}
+    constexpr Rect() : ::Rect() {}
     /** A rectangle by its corner and size; a negative size counts as 0. */
     constexpr Rect(int32_t x, int32_t y, int32_t width, int32_t height)
         : ::Rect{x, y, detail::saturate(int64_t{x} + std::max(width, 0)),

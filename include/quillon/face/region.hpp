@@ -8,6 +8,7 @@
 #include <quillon/face/rect.hpp>
 #include <quillon/rasterRectList.h>
 
+#include <algorithm>
 #include <cstddef>
 #include <cstdint>
 #include <iterator>
@@ -86,10 +87,7 @@ public:
     }
     bool contains(Point point) const { return intersects({point, {1, 1}}); }
     bool intersects(const Rect &rect) const {
-        for (const Rect part : *this)
-            if (part.intersects(rect))
-                return true;
-        return false;
+        return std::any_of(begin(), end(), [&](const Rect &part) { return part.intersects(rect); });
     }
 
     /** Walks the rectangles. */

@@ -125,19 +125,18 @@ private:
     // on, U where V is expected.  What is beyond an odd side is repeated.
     void gatherPlanar(Samples &samples, int32_t x, int32_t y, int32_t width) const {
         const int32_t columns = std::min(width, size_.width - x), half = width / 2;
-        for (int32_t row = 0; row < 2; ++row) {
-            uint8_t *const luma = samples + row * width;
-            std::memcpy(luma, at(y_, x, std::min(y + row, size_.height - 1)),
-                        static_cast<size_t>(columns));
-            luma[width - 1] = luma[columns - 1];
+        uint8_t *to = samples;
+        for (const int32_t row : {y, std::min(y + 1, size_.height - 1)}) {
+            std::memcpy(to, at(y_, x, row), static_cast<size_t>(columns));
+            to[width - 1] = to[columns - 1];
+            to += width;
         }
-        const int32_t step = format_ == VideoFormat::kNv12 ? 2 : 1;
-        const uint8_t *const u = at(u_, x / 2 * step, y / 2), *const v =
-                                                                  at(v_, x / 2 * step, y / 2);
-        uint8_t *const chroma = samples + 2 * width;
-        for (int32_t i = 0; i < half; ++i) {
-            chroma[i] = u[i * step];
-            chroma[half + i] = v[i * step];
+        const std::ptrdiff_t step = format_ == VideoFormat::kNv12 ? 2 : 1;
+        const uint8_t *u = at(u_, 0, y / 2) + step * (x / 2);
+        const uint8_t *v = at(v_, 0, y / 2) + step * (x / 2);
+        for (int32_t i = 0; i < half; ++i, u += step, v += step) {
+            to[i] = *u;
+            to[half + i] = *v;
         }
     }
 
