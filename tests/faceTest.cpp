@@ -1,11 +1,9 @@
 // The drawing functions of the C++ face.  Rectangles from anywhere, and surfaces in fenced
 // memory: each call is held to a model that visits every pixel of the destination, and
 // to the call of the C interface that it stands for.
-#include <quillon/quillon.hpp>
-
 #include "reference/pixels.h"
+#include "support/anywhere.h"
 #include "support/fence.h"
-#include "support/random.h"
 
 #include <gtest/gtest.h>
 
@@ -15,12 +13,11 @@
 namespace {
 
 using namespace quillon;
+using test::anyPoint;
+using test::anyRect;
 using test::FencedBuffer;
 using test::Random;
 using QRect = quillon::Rect;
-
-constexpr int32_t kMin = std::numeric_limits<int32_t>::min();
-constexpr int32_t kMax = std::numeric_limits<int32_t>::max();
 
 const std::vector<Format> kAll = {Format::kBgra32, Format::kBgr24,  Format::kRgb16,
                                   Format::kRgb15,  Format::kSmall8, Format::kSmall6,
@@ -35,21 +32,6 @@ const Palette &palette() {
         return made;
     }();
     return colors;
-}
-
-// Near a surface, at the limits, or anywhere.
-int32_t coordinate(Random &random) {
-    const uint32_t kind = random.below(8);
-    return kind == 0   ? random.oneOf({kMin, kMin + 1, kMax, kMax - 1, 0})
-           : kind == 1 ? random.between(kMin, kMax)
-                       : random.between(-30, 50);
-}
-Point anyPoint(Random &random) {
-    return {coordinate(random), coordinate(random)};
-}
-QRect anyRect(Random &random) {
-    return QRect::fromEdges(coordinate(random), coordinate(random), coordinate(random),
-                            coordinate(random));
 }
 
 // Fenced pixels, or bits, and a window on them, which may be a part of the surface.
