@@ -1,19 +1,16 @@
 // Random calls of one family of operations/, drawn from the input, on an instruction
 // set that the input names.  Whatever differs from its plain statement is a finding,
-// as is a Panic.
+// as is a Panic that no call asked for.
 //
 // QUILLON_FAMILY is the family's name.
 
 #include "operations.h"
 #include "support/judge.h"
 #include "support/targets.h"
-#include <hearth/hearth.h>
 
-#include <cstdarg>
 #include <cstdio>
 #include <cstdlib>
 #include <cstring>
-#include <stdexcept>
 
 using namespace quillon::test;
 
@@ -32,16 +29,6 @@ void quillon::test::compare(const void *actual, const void *expected, size_t siz
     fprintf(stderr, "on %s: %s; %s\n", running.target,
             firstDifference(actual, expected, size).c_str(), description().c_str());
     std::abort();
-}
-
-// A call that has to end so catches it; from any other it ends the program.
-void Panic(const char *format, ...) {
-    char text[1024];
-    va_list arguments;
-    va_start(arguments, format);
-    vsnprintf(text, sizeof text, format, arguments);
-    va_end(arguments);
-    throw std::runtime_error(text);
 }
 
 // Only the driver asks for memory all the time.

@@ -2,17 +2,9 @@
 
 #include <hearth/hearth.h>
 
-#include <cstdarg>
-#include <cstdio>
 #include <dlfcn.h>
 
 using namespace quillon::test;
-
-static std::string formatted(const char *format, va_list arguments) {
-    char text[1024];
-    vsnprintf(text, sizeof(text), format, arguments);
-    return text;
-}
 
 void Panic(const char *format, ...) {
     va_list arguments;

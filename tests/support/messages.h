@@ -3,21 +3,16 @@
 // messages are kept.
 #pragma once
 
+#include "support/panic.h"
+
 #include <gtest/gtest.h>
 
 #include <csetjmp>
 #include <regex>
-#include <stdexcept>
 #include <string>
 #include <vector>
 
 namespace quillon::test {
-
-// What Panic throws; what() is the formatted message.
-class PanicError : public std::runtime_error {
-public:
-    using std::runtime_error::runtime_error;
-};
 
 enum class PanicWay { kThrow, kJump, kAbort };
 inline PanicWay panicWay = PanicWay::kThrow;

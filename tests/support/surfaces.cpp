@@ -300,6 +300,7 @@ void drawNothing(Random &random, Case &c) {
     const bool isIdle = !c.operation.parts[0].isTouched;
     const uint32_t none = isIdle ? random.oneOf({0u, 1u, 999u, kMost}) : 0;
     c.size = random.oneIn(2) ? Size{any, none} : Size{none, any};
+    c.home[0].refill(random); // no case depends on the one before it
     c.home[0].keep();
 }
 

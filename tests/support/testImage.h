@@ -7,6 +7,8 @@
 #include <gtest/gtest.h>
 #include <quillon/imageUtil.h>
 
+#include <gtest/gtest.h>
+
 namespace quillon::test {
 
 struct Format {
