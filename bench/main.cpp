@@ -1,4 +1,5 @@
 #include "comparison.h"
+#include "instructions.h"
 #include "operations/operations.h"
 #include "peers/peers.h"
 #include "report.h"
@@ -43,12 +44,14 @@ int main(int argc, char **argv) {
     pinToThisCore();
     benchmark::Initialize(&argc, argv);
     std::string folder;
-    bool isSweep = false, isGrowth = false;
+    bool isSweep = false, isGrowth = false, isMarked = false;
     for (const std::string argument : std::span(argv + 1, argv + argc)) {
         if (argument == "--sweep")
             isSweep = true;
         else if (argument == "--growth")
             isGrowth = true;
+        else if (argument == "--instructions")
+            isMarked = true;
         else if (argument.starts_with("--report="))
             folder = argument.substr(9);
         else if (!argument.starts_with("--target=") || !useTarget(argument.substr(9)))
@@ -60,6 +63,8 @@ int main(int argc, char **argv) {
         return publish(growthPage(), folder, "/growth.md") ? 0 : 1;
 
     const std::vector<Operation> operations = allOperations();
+    if (isMarked)
+        return markInstructions(operations), 0;
     std::vector<Result> results;
     registerComparisons(operations, results);
     benchmark::AddCustomContext("peers", peerText());

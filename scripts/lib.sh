@@ -22,6 +22,7 @@ arm64Packages=(g++-aarch64-linux-gnu qemu-user)
 docsPackages=(doxygen python3 python3-numpy)
 packagePackages=(build-essential debhelper fakeroot lintian)
 arm64Libraries=(libpng-dev libhwy-dev libgtest-dev) # for that processor
+arm64BenchLibraries=(libpng-dev libhwy-dev libbenchmark-dev libpixman-1-dev libyuv-dev)
 
 say() { printf '\n== %s\n' "$*"; }
 fail() {

@@ -220,9 +220,9 @@ private:
         if (axis.srcSize < kWindowPixels)
             return 0;
         const uint32_t end = (axis.srcSize - kWindowPixels + 1) << 16;
-        const uint32_t chunks =
-            (stepsBefore(axis.start, end, axis.step) + kVectorPixels - 1) / uint32_t{kVectorPixels};
-        return std::min(chunks, axis.dstSize / uint32_t{kVectorPixels}) * uint32_t{kVectorPixels};
+        constexpr uint32_t kPixels{kVectorPixels};
+        const uint32_t chunks = (stepsBefore(axis.start, end, axis.step) + kPixels - 1) / kPixels;
+        return std::min(chunks, axis.dstSize / kPixels) * kPixels;
     }
 
     uint32_t start_, step_, srcSize_, count_;
