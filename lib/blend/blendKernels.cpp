@@ -8,6 +8,7 @@
 #include "hwy/foreach_target.h"
 #include "hwy/highway.h"
 
+#include "simd/products-inl.h"
 #include "simd/rowLoop-inl.h"
 
 HWY_BEFORE_NAMESPACE();
@@ -15,6 +16,14 @@ namespace quillon::HWY_NAMESPACE {
 namespace {
 
 #if QUILLON_HAS_VECTORS
+
+constexpr size_t kChunkBytes = kHasInterleavedAccess ? 4 * kVectorBytes : kVectorBytes;
+
+// The colour of one vector of pixels with the alpha of the other.
+template <class D, class V>
+HWY_INLINE V colourOf(D d, V colour, V alpha) {
+    return hn::IfVecThenElse(hn::Set(d, 0x00FFFFFF), colour, alpha);
+}
 
 // blendOverPixel in vectors.
 //
@@ -39,7 +48,31 @@ HWY_INLINE V blendOver(D d, V src, V dst) {
     const auto isUncovered = hn::Eq(hn::BitCast(d, factor), hn::Zero(d));
     const auto kept = hn::IfThenElse(isUncovered, dst, hn::BitCast(d, under));
     const auto sum = hn::SaturatedAdd(hn::BitCast(d8, src), hn::BitCast(d8, kept));
-    return hn::IfVecThenElse(hn::Set(d, 0x00FFFFFF), hn::BitCast(d, sum), dst);
+    return colourOf(d, hn::BitCast(d, sum), dst);
+}
+
+// Much of what lies over a picture is clear or opaque, in long runs.  A look at the alpha
+// of one pixel is cheaper than one at a vector.
+HWY_INLINE bool isClearOrOpaque(const uint8_t *pixel) {
+    return static_cast<uint8_t>(pixel[3] + 1) <= 1;
+}
+
+// The same for as many pixels as there are bytes in a vector, by channels.
+HWY_INLINE void blendChannelsOver(const uint8_t *src, uint8_t *dst) {
+    const Widest<uint8_t> d;
+    using Bytes = hn::Vec<decltype(d)>;
+    Bytes srcBlue, srcGreen, srcRed, srcAlpha, blue, green, red, alpha;
+    hn::LoadInterleaved4(d, src, srcBlue, srcGreen, srcRed, srcAlpha);
+    const auto any = hn::Or(hn::Or(srcBlue, srcGreen), hn::Or(srcRed, srcAlpha));
+    if (isClearOrOpaque(src) && hn::AllTrue(d, hn::Eq(any, hn::Zero(d))))
+        return;
+    hn::LoadInterleaved4(d, dst, blue, green, red, alpha);
+    const auto factor = hn::Not(srcAlpha);
+    const auto over = [&](Bytes channel, Bytes under) HWY_ATTR {
+        return hn::SaturatedAdd(channel, multiplyDivideBy255(d, under, factor));
+    };
+    hn::StoreInterleaved4(over(srcBlue, blue), over(srcGreen, green), over(srcRed, red), alpha, d,
+                          dst);
 }
 
 template <bool kPrefetches>
@@ -50,37 +83,48 @@ struct BlendBody {
 
     template <class C, class Access>
     HWY_INLINE void operator()(C /*chunk*/, size_t i, Access access) const {
-        const hn::CappedTag<uint32_t, C::kUnits> d;
         uint8_t *pixels = dst + 4 * i;
         const uint8_t *from = src + 4 * i;
         if constexpr (kPrefetches) {
             hwy::Prefetch(advance(pixels, static_cast<uint64_t>(distance.dst)));
             hwy::Prefetch(advance(from, static_cast<uint64_t>(distance.src)));
         }
+        if constexpr (C::kUnits == kVectorBytes)
+            return blendChannelsOver(from, pixels);
+        const hn::CappedTag<uint32_t, C::kUnits> d;
         const auto over = access.load(d, from);
-        // Much of what lies over a picture is clear, in long runs, and changes
-        // nothing.  A look at one pixel is cheaper than one at a vector.
-        if (isClear(from) && hn::AllTrue(d, hn::Eq(over, hn::Zero(d))))
-            return;
+        if (isClearOrOpaque(from)) {
+            if (from[3] == 0) {
+                if (hn::AllTrue(d, hn::Eq(over, hn::Zero(d))))
+                    return;
+            } else if (hn::AllTrue(d, hn::Gt(over, hn::Set(d, 0xFEFFFFFF)))) {
+                return access.store(d, colourOf(d, over, access.load(d, pixels)), pixels);
+            }
+        }
         access.store(d, blendOver(d, over, access.load(d, pixels)), pixels);
     }
-
-private:
-    HWY_INLINE static bool isClear(const uint8_t *from) {
-        uint32_t pixel;
-        hwy::CopyBytes<4>(from, &pixel);
-        return pixel == 0;
-    }
 };
+
+template <class Body>
+HWY_INLINE void walkBlendRow(size_t width, const Body &body) {
+    if constexpr (kHasInterleavedAccess) {
+        constexpr RowPolicy kWhole = {.tail = Tail::kNone}, kRest = {.tail = Tail::kExact};
+        walkRow<kWhole>(Chunk<kVectorBytes>(), width, body);
+        const size_t rest = width % kVectorBytes;
+        walkFrom<kRest, Unaligned>(Chunk<kVectorBytes / 4>(), width - rest, width, body);
+    } else {
+        walkRowOnce<4>(width, body);
+    }
+}
 
 template <bool kPrefetches>
 void blendRowsBy(DstRows dst, SrcRows src, Extent extent, PrefetchDistance distance) {
     for (size_t y = 0; y < extent.height; ++y) {
         const BlendBody<kPrefetches> body = {dst.row(y), src.row(y), distance};
-        if (hasOverlapHazard(body.dst, body.src, kVectorBytes))
+        if (hasOverlapHazard(body.dst, body.src, kChunkBytes))
             blendOverRowPlain(body.dst, body.src, extent.width);
         else
-            walkRowOnce<4>(extent.width, body);
+            walkBlendRow(extent.width, body);
     }
 }
 
@@ -91,9 +135,9 @@ void blendKernel(DstRows dst, SrcRows src, Extent extent) {
     const ByteExtent bytes = inBytes(extent, 4);
     const ptrdiff_t ahead = isNonTemporal(bytes) ? kPrefetchBlendUncached : kPrefetchInCaches;
     if (extent.width >= kPrefetchLongRow)
-        blendRowsBy<true>(dst, src, extent, {ahead, ahead});
+        blendRowsBy<kPrefetchesAhead>(dst, src, extent, {ahead, ahead});
     else if (extent.width >= kPrefetchNextRow)
-        blendRowsBy<true>(dst, src, extent, {dst.stride, src.stride});
+        blendRowsBy<kPrefetchesAhead>(dst, src, extent, {dst.stride, src.stride});
     else
         blendRowsBy<false>(dst, src, extent, {});
 }

@@ -10,7 +10,7 @@
 #include "hwy/foreach_target.h"
 #include "hwy/highway.h"
 
-#include "convert/pixelFormats-inl.h"
+#include "convert/conversionBodies-inl.h"
 #include "simd/rowLoop-inl.h"
 
 HWY_BEFORE_NAMESPACE();
@@ -19,6 +19,9 @@ namespace {
 
 #if QUILLON_HAS_VECTORS
 
+// Where a chunk takes few instructions, those of the loop count.
+constexpr bool kIsUnrolled = kHasInterleavedAccess;
+
 // The functions by body are not inlined: several pairs of formats share a body, and
 // each loop has the registers for itself.
 
@@ -26,23 +29,33 @@ namespace {
 template <size_t kUnits, class Body>
 HWY_NOINLINE void convertShortRows(Chunk<kUnits> chunk, DstRows dst, SrcRows src, Extent extent,
                                    const Body &constants) {
-    constexpr RowPolicy kPolicy = {.tail = Tail::kOverlapInLoop,
+    constexpr RowPolicy kPolicy = {.tail = kIsUnrolled ? Tail::kOverlap : Tail::kOverlapInLoop,
+                                   .unroll = kIsUnrolled ? 4 : 1,
                                    .prefetches = kUnits >= kConvertPrefetchRow};
     const PrefetchDistance nextRow = {dst.stride, src.stride};
     // With rows that might be empty, compilers set up constants anew in each.
     if (extent.width < kUnits || extent.height == 0)
         __builtin_unreachable();
     Body body = constants;
-    for (size_t y = 0; y < extent.height; ++y) {
-        body.dst = dst.row(y);
-        body.src = src.row(y);
-        walkRow<kPolicy>(chunk, extent.width, body, nextRow);
-    }
+    const auto forEachRow = [&](const auto &walk) HWY_ATTR {
+        for (size_t y = 0; y < extent.height; ++y) {
+            body.dst = dst.row(y);
+            body.src = src.row(y);
+            walk();
+        }
+    };
+    if (kIsUnrolled && extent.width <= 2 * kUnits)
+        forEachRow([&]() HWY_ATTR {
+            body(chunk, 0, Unaligned());
+            body(chunk, extent.width - kUnits, Unaligned());
+        });
+    else
+        forEachRow([&]() HWY_ATTR { walkRow<kPolicy>(chunk, extent.width, body, nextRow); });
 }
 
 template <class Access, class Body>
 HWY_NOINLINE void convertLongRows(DstRows dst, SrcRows src, Extent extent, const Body &constants) {
-    constexpr RowPolicy kPolicy = {.prefetches = true};
+    constexpr RowPolicy kPolicy = {.unroll = kIsUnrolled ? 4 : 1, .prefetches = true};
     constexpr PrefetchDistance kDistance =
         std::is_same_v<Access, NonTemporal>
             ? PrefetchDistance{0, kPrefetchConvertUncached}
@@ -78,10 +91,13 @@ void convertRectangle(DstRows dst, SrcRows src, Extent extent, const uint32_t *p
     if constexpr (from.bytesPerPixel == 2 && to.bytesPerPixel <= 2) {
         convertRowsBy(dst, src, extent, ConvertFrom16Body<kFrom, kTo>{{dst.first, src.first}});
     } else {
+        using Through32 = ConvertThrough32Body<SourceOf<kFrom>, DestinationOf<kTo>>;
         constexpr NarrowingWeights weights = narrowingWeights(to);
-        const ConvertThrough32Body<SourceOf<kFrom>, DestinationOf<kTo>> body = {
-            {dst.first, src.first}, palette, weights};
-        convertRowsBy(dst, src, extent, body);
+        const Through32 body = {{dst.first, src.first}, palette, weights};
+        if constexpr (kHasInterleavedAccess && kFrom != PixelFormat::kIndex)
+            convertRowsBy(dst, src, extent, ConvertByChannelsBody<kFrom, kTo>{body});
+        else
+            convertRowsBy(dst, src, extent, body);
     }
 }
 

@@ -1,7 +1,5 @@
-// Conversions of a chunk of pixels.  Most pairs of formats go through 32-bit pixels,
-// which stay in registers: a source loads a chunk as vectors of them, a destination
-// stores such vectors.  As channelMoves says, this is exact.  Pairs whose pixels have
-// at most 16 bits go directly.
+// Sources and destinations of conversions: a source loads a chunk of pixels as vectors
+// of 32-bit pixels, a destination stores such vectors.
 //
 // Included once per instruction set; the usual guards do not apply.
 
@@ -18,6 +16,7 @@
 #include "convert/pixelFormats.h"
 #include "simd/access-inl.h"
 #include "simd/narrow-inl.h"
+#include "simd/products-inl.h"
 #include "simd/rgb24-inl.h"
 #include "simd/shuffle-inl.h"
 #include "simd/target-inl.h"
@@ -219,77 +218,6 @@ struct To32Bits : Storage<4, true> {
 template <PixelFormat kFormat>
 using DestinationOf = std::tuple_element_t<traitsOf(kFormat).bytesPerPixel - 1,
                                            std::tuple<To8Bits, To16Bits, To24Bits, To32Bits>>;
-
-// ---- Bodies ---------------------------------------------------------------
-
-template <size_t kSrcBytesIn, size_t kDstBytesIn>
-struct ConversionRow {
-    static constexpr size_t kSrcBytes = kSrcBytesIn;
-    static constexpr size_t kDstBytes = kDstBytesIn;
-    uint8_t *dst;
-    const uint8_t *src;
-
-    template <class C>
-    HWY_INLINE void prefetch(C /*chunk*/, size_t i, PrefetchDistance distance) const {
-        prefetchLines(src + i * kSrcBytes, C::kUnits * kSrcBytes, distance.src);
-        prefetchLines(dst + i * kDstBytes, C::kUnits * kDstBytes, distance.dst);
-    }
-};
-
-template <class Source, class Destination>
-struct ConvertThrough32Body : ConversionRow<Source::kBytes, Destination::kBytes> {
-    const uint32_t *palette;
-    NarrowingWeights weights;
-
-    template <class C, class Access>
-    HWY_INLINE void operator()(C /*chunk*/, size_t i, Access access) const {
-        const hn::CappedTag<uint32_t, C::kUnits> d;
-        constexpr bool kOpaque = Destination::kHasAlpha && !Source::kHasAlpha;
-        hn::Vec<decltype(d)> pixels[C::kUnits / kLanes<decltype(d)>];
-        Source::template load<kOpaque>(d, this->src + i * Source::kBytes, palette, pixels);
-        Destination::store(d, pixels, this->dst + i * Destination::kBytes, weights, access);
-    }
-};
-
-// convertPixel in vectors of 16-bit lanes.
-template <PixelFormat kFrom, PixelFormat kTo, size_t kMove = 0, class D16>
-HWY_INLINE hn::Vec<D16> convertLanes(D16 d, hn::Vec<D16> p) {
-    constexpr const ChannelMoves &all = kChannelMoves<kFrom, kTo>;
-    constexpr ChannelMove move = all.moves[kMove];
-    const auto moved = masked(d, shiftLanesRight<move.distance>(p), move.mask);
-    if constexpr (kMove + 1 == all.count)
-        return moved;
-    else
-        return hn::Or(moved, convertLanes<kFrom, kTo, kMove + 1>(d, p));
-}
-
-// From 16 bits to as many, or to a byte.
-template <PixelFormat kFrom, PixelFormat kTo>
-struct ConvertFrom16Body : ConversionRow<2, traitsOf(kTo).bytesPerPixel> {
-    static constexpr size_t kDstBytes = traitsOf(kTo).bytesPerPixel;
-
-    template <class C, class Access>
-    HWY_INLINE void operator()(C /*chunk*/, size_t i, Access access) const {
-        const hn::CappedTag<uint16_t, C::kUnits> d;
-        const hn::CappedTag<uint8_t, C::kUnits> d8;
-        constexpr size_t n = kLanes<decltype(d)>;
-        const uint8_t *from = this->src + 2 * i;
-        uint8_t *to = this->dst + kDstBytes * i;
-        if constexpr (kDstBytes == 2) {
-            for (size_t b = 0; b < 2 * C::kUnits; b += 2 * n)
-                access.store(d, convertLanes<kFrom, kTo>(d, loadBytes(d, from + b)), to + b);
-        } else if constexpr (n == C::kUnits) {
-            access.store(d8, narrowOne(d8, d, convertLanes<kFrom, kTo>(d, loadBytes(d, from))), to);
-        } else {
-            const auto first = inRegister(loadBytes(d, from));
-            const auto second = inRegister(loadBytes(d, from + 2 * n));
-            access.store(d8,
-                         narrowTo8(d8, convertLanes<kFrom, kTo>(d, first),
-                                   convertLanes<kFrom, kTo>(d, second)),
-                         to);
-        }
-    }
-};
 
 #endif
 } // namespace quillon::HWY_NAMESPACE

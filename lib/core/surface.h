@@ -98,4 +98,12 @@ constexpr int64_t strideInWholePixels(int64_t stride, int32_t bytesPerPixel) {
     return isWord ? stride & -int64_t{bytesPerPixel} : stride;
 }
 
+// Overlap hazard: whether a vector of the given size reads a byte that a walk
+// pixel by pixel would have written before.  That is so where the destination
+// lies ahead of the source by less than the vector.
+inline bool hasOverlapHazard(const uint8_t *dst, const uint8_t *src, size_t vectorBytes) {
+    const uintptr_t ahead = reinterpret_cast<uintptr_t>(dst) - reinterpret_cast<uintptr_t>(src);
+    return ahead != 0 && ahead < vectorBytes;
+}
+
 } // namespace quillon

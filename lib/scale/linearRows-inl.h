@@ -32,7 +32,6 @@ struct LinearBody {
     template <class C, class Access>
     HWY_INLINE void operator()(C /*chunk*/, size_t i, Access access) const {
         const PixelTag<C> d;
-        using Channels = ChannelPairs<PixelTag<C>>;
         const uint32_t first = start + static_cast<uint32_t>(i) * step;
         const auto x = positionsFrom(d, first, step);
         const uint32_t base = std::min(first >> 16, srcSize - 1 - uint32_t{C::kUnits});
@@ -41,13 +40,8 @@ struct LinearBody {
         const auto left = pickFromWindows<1>(d, window, index);
         const auto right = pickFromWindows<1>(d, window + 4, index);
 
-        const auto full = hn::Set(d, 0xFFu);
-        const auto rightWeight = hn::And(hn::ShiftRight<8>(x), full);
-        const auto leftWeight = hn::Sub(full, rightWeight);
-        access.store(d,
-                     Channels::blend(left, Channels::weights(leftWeight), right,
-                                     Channels::weights(rightWeight)),
-                     dst + 4 * i);
+        const auto rightWeight = hn::And(hn::ShiftRight<8>(x), hn::Set(d, 0xFFu));
+        access.store(d, blendPixels(d, left, right, rightWeight), dst + 4 * i);
     }
 };
 

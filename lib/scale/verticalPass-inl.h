@@ -41,12 +41,8 @@ struct BlendRowsBody {
     template <class C, class Access>
     HWY_INLINE void operator()(C /*chunk*/, size_t i, Access access) const {
         const PixelTag<C> d;
-        using Channels = ChannelPairs<PixelTag<C>>;
         const auto above = access.load(d, upper + 4 * i), below = access.load(d, lower + 4 * i);
-        access.store(d,
-                     Channels::blend(above, Channels::weight(255 - lowerWeight), below,
-                                     Channels::weight(lowerWeight)),
-                     dst + 4 * i);
+        access.store(d, blendPixels(d, above, below, hn::Set(d, lowerWeight)), dst + 4 * i);
     }
 };
 

@@ -170,7 +170,7 @@ struct PrefetchDistance {
 
 // Prefetches the cache lines of a range that lies so far ahead.
 HWY_INLINE void prefetchLines(const uint8_t *from, size_t bytes, ptrdiff_t distance) {
-    if (distance == 0)
+    if (!kPrefetchesAhead || distance == 0)
         return;
     const uint8_t *line = advance(from, static_cast<uint64_t>(distance));
     for (size_t i = 0; i < bytes; i += kLineBytes)

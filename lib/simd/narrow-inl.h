@@ -1,5 +1,5 @@
-// Vectors of wide lanes narrowed to one of narrow lanes, sums of products of
-// bytes, and the widening of 16-bit lanes in pairs.
+// Vectors of wide lanes narrowed to one of narrow lanes, and the widening of 16-bit
+// lanes in pairs.
 //
 // Included once per instruction set; the usual guards do not apply.
 
@@ -23,28 +23,13 @@ namespace quillon::HWY_NAMESPACE {
 
 namespace detail {
 
-// multiplyBytes: unsigned bytes of a by signed bytes of b, the products of each
-// 16-bit lane added with signed saturation.  addPairs: the products of signed
-// 16-bit lanes added in each 32-bit lane.  pack...: the lanes of a block of a, then
-// those of the same block of b, saturated.
+// pack...: the lanes of a block of a, then those of the same block of b, saturated.
 #if QUILLON_X86_SSSE3
-HWY_INLINE __m128i multiplyBytes(__m128i a, __m128i b) {
-    return _mm_maddubs_epi16(a, b);
-}
-HWY_INLINE __m128i addPairs(__m128i a, __m128i b) {
-    return _mm_madd_epi16(a, b);
-}
 HWY_INLINE __m128i packSigned16(__m128i a, __m128i b) {
     return _mm_packs_epi16(a, b);
 }
 #endif
 #if QUILLON_X86_AVX2
-HWY_INLINE __m256i multiplyBytes(__m256i a, __m256i b) {
-    return _mm256_maddubs_epi16(a, b);
-}
-HWY_INLINE __m256i addPairs(__m256i a, __m256i b) {
-    return _mm256_madd_epi16(a, b);
-}
 HWY_INLINE __m256i packSigned16(__m256i a, __m256i b) {
     return _mm256_packs_epi16(a, b);
 }
@@ -62,12 +47,6 @@ HWY_INLINE __m256i packUnsigned16(__m256i a, __m256i b) {
 }
 #endif
 #if QUILLON_X86_AVX512
-HWY_INLINE __m512i multiplyBytes(__m512i a, __m512i b) {
-    return _mm512_maddubs_epi16(a, b);
-}
-HWY_INLINE __m512i addPairs(__m512i a, __m512i b) {
-    return _mm512_madd_epi16(a, b);
-}
 HWY_INLINE __m512i packSigned16(__m512i a, __m512i b) {
     return _mm512_packs_epi16(a, b);
 }
@@ -80,41 +59,6 @@ HWY_INLINE __m512i packUnsigned16(__m512i a, __m512i b) {
 #endif
 
 } // namespace detail
-
-// ---- Sums of products -----------------------------------------------------
-
-// Of each 32-bit lane the sum of its lower three bytes, each by two factors: its
-// own byte in bytes, and the half of pairs that the sum of two bytes is multiplied
-// by.  Sums of two bytes stay below 32768.  The highest byte is zero.
-template <class D>
-HWY_INLINE hn::Vec<D> weightedByteSum(D d, hn::Vec<D> v, uint32_t bytes, uint32_t pairs) {
-#if QUILLON_X86_SSSE3
-    const auto sums = detail::multiplyBytes(v.raw, hn::Set(d, bytes).raw);
-    return hn::Vec<D>{detail::addPairs(sums, hn::Set(d, pairs).raw)};
-#else
-    const uint32_t lower = pairs & 0xFFFF, upper = pairs >> 16;
-    const auto byte = hn::Set(d, 0xFF);
-    const auto first = hn::Mul(hn::And(v, byte), hn::Set(d, (bytes & 0xFF) * lower));
-    const auto second =
-        hn::Mul(hn::And(hn::ShiftRight<8>(v), byte), hn::Set(d, (bytes >> 8 & 0xFF) * lower));
-    const auto third = hn::Mul(hn::ShiftRight<16>(v), hn::Set(d, (bytes >> 16) * upper));
-    return hn::Add(hn::Add(first, second), third);
-#endif
-}
-
-// Of each 16-bit lane the sum of its two signed bytes by an unsigned factor each,
-// which fits 16 bits.
-template <uint8_t kLower, uint8_t kUpper, class D16>
-HWY_INLINE hn::Vec<D16> weightedPairSum(D16 d, hn::Vec<D16> v) {
-#if QUILLON_X86_SSSE3
-    const auto factors = hn::Set(d, static_cast<int16_t>(kUpper << 8 | kLower));
-    return hn::Vec<D16>{detail::multiplyBytes(factors.raw, v.raw)};
-#else
-    const auto lower = hn::ShiftRight<8>(hn::ShiftLeft<8>(v));
-    return hn::Add(hn::Mul(lower, hn::Set(d, kLower)),
-                   hn::Mul(hn::ShiftRight<8>(v), hn::Set(d, kUpper)));
-#endif
-}
 
 // ---- Narrowing ------------------------------------------------------------
 
@@ -144,6 +88,19 @@ HWY_INLINE hn::Vec<D8> narrowSaturated([[maybe_unused]] D8 d8, hn::Vec<D16> firs
                       hn::TableLookupBytesOr0(saturated(second), hn::LoadDup128(d8, kToUpper)));
     }
 #endif
+}
+
+// The same of lanes shifted to the right.
+template <int kDistance, class D8, class D16 = hn::Repartition<int16_t, D8>>
+HWY_INLINE hn::Vec<D8> shiftAndNarrowSaturated(D8 d8, hn::Vec<D16> first, hn::Vec<D16> second) {
+#if QUILLON_NEON
+    if constexpr (kLanes<D8> == 16) {
+        const auto lower = vqshrn_n_s16(first.raw, kDistance);
+        const hn::Vec<hn::RebindToSigned<D8>> all{vqshrn_high_n_s16(lower, second.raw, kDistance)};
+        return hn::BitCast(d8, all);
+    }
+#endif
+    return narrowSaturated(d8, hn::ShiftRight<kDistance>(first), hn::ShiftRight<kDistance>(second));
 }
 
 #if QUILLON_X86_AVX2

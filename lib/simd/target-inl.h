@@ -41,6 +41,9 @@
 #define QUILLON_X86_AVX2 (QUILLON_X86_SSSE3 && HWY_CAP_GE256)
 #define QUILLON_X86_AVX512 (QUILLON_X86_AVX2 && HWY_CAP_GE512)
 
+#undef QUILLON_NEON
+#define QUILLON_NEON (HWY_ARCH_ARM && HWY_TARGET == HWY_NEON)
+
 HWY_BEFORE_NAMESPACE();
 namespace quillon::HWY_NAMESPACE {
 namespace hn = hwy::HWY_NAMESPACE;
@@ -66,6 +69,16 @@ inline constexpr bool kHasMaskedTails = QUILLON_X86_AVX512;
 template <size_t kLaneBytes>
 inline constexpr bool kHasMaskedStores = QUILLON_X86_AVX512 ||
                                          (QUILLON_X86_AVX2 && kLaneBytes == 4);
+
+// Loads and stores that split pixels into vectors of one byte of each, and put these
+// together again, in one instruction.
+inline constexpr bool kHasInterleavedAccess = QUILLON_NEON;
+
+// Products of bytes in lanes of twice the size, in one instruction for half a vector.
+inline constexpr bool kHasWideningProducts = QUILLON_NEON;
+
+// Whether to prefetch: what the processor does not do of itself is measured on x86.
+inline constexpr bool kPrefetchesAhead = HWY_ARCH_X86;
 
 // Whether a gather is faster than to load its lanes one by one.
 inline constexpr bool kHasFastGather = QUILLON_X86_AVX512;

@@ -12,6 +12,7 @@
 #include "hwy/highway.h"
 
 #include "simd/rowLoop-inl.h"
+#include "video/splitSamples-inl.h"
 #include "video/videoFormats.h"
 #include "video/yuv-inl.h"
 
@@ -41,6 +42,8 @@ struct PlanarBody {
 
     template <class C, class Access>
     HWY_INLINE void operator()(C /*chunk*/, size_t i, Access access) const {
+        if constexpr (C::kUnits == 2 * kVectorBytes)
+            return convertSplit(i);
         const hn::CappedTag<uint8_t, C::kUnits> d;
         const hn::Repartition<int16_t, decltype(d)> d16;
         const auto ab =
@@ -67,6 +70,17 @@ struct PlanarBody {
     const uint8_t *lumaRow(size_t row) const { return row == 0 ? luma : luma + lumaStride; }
 
 private:
+    HWY_INLINE void convertSplit(size_t i) const {
+        const Widest<uint8_t> d;
+        const auto chroma =
+            chromaTermsOf(d, hn::LoadU(d, chromaLow + i / 2), hn::LoadU(d, chromaHigh + i / 2));
+        for (size_t row = 0; row < kRows; ++row) {
+            hn::Vec<decltype(d)> even, odd;
+            hn::LoadInterleaved2(d, lumaRow(row) + i, even, odd);
+            storeSplitPixels<kLayout>(d, even, odd, chroma, dstRow(row) + kDstBytes * i);
+        }
+    }
+
     // a in the lower bytes, b in the upper ones.
     template <class D16, class Access>
     HWY_INLINE hn::Vec<D16> chroma(D16 d16, size_t i, Access access) const {
@@ -110,7 +124,7 @@ template <RasterVideoPixelLayout kLayout>
 void convertRowsNonTemporal(const PlanarBody<kLayout, 2> &rows, size_t width,
                             PrefetchDistance distance) {
     using Body = PlanarBody<kLayout, 2>;
-    const Chunk<kVectorBytes> chunk;
+    const Chunk<kMostPixels> chunk;
     if (headOf<Body>(rows.dst) == headOf<Body>(rows.dstRow(1)))
         return walkAlignedRow<NonTemporal, kPrefetchingPolicy>(chunk, width, rows, distance);
     for (size_t row = 0; row < 2; ++row)

@@ -13,6 +13,7 @@
 
 #include "simd/rowLoop-inl.h"
 #include "video/planarRows-inl.h"
+#include "video/splitSamples-inl.h"
 #include "video/yuv-inl.h"
 
 #include <cstring>
@@ -41,6 +42,8 @@ struct InterleavedBody {
     HWY_INLINE void operator()(C /*chunk*/, size_t i, Access access) const {
         const hn::CappedTag<uint8_t, C::kUnits> d;
         const uint8_t *samples = src + 2 * i;
+        if constexpr (C::kUnits == 2 * kVectorBytes)
+            return convertSplitGroups<kGroup, kLayout>(samples, dst + kDstBytes * i);
         const auto first = sumsOfGroups<kGroup>(d, access.load(d, samples));
         const auto second = sumsOfGroups<kGroup>(d, access.load(d, samples + C::kUnits));
         storePixels<kLayout, QuadOrder::kNarrowed>(d, first, second, dst + kDstBytes * i, access);
@@ -68,7 +71,7 @@ struct InterleavedFrame {
             return convertFewInterleaved<kGroup, kLayout>(dst, src, pixels);
         const InterleavedBody<kGroup, kLayout> body = {dst, src};
         if (isNonTemporal({kLayout.bytesPerPixel * pixels, 1})) {
-            walkAlignedRow<NonTemporal, kPrefetchingPolicy>(Chunk<kVectorBytes>(), pixels, body,
+            walkAlignedRow<NonTemporal, kPrefetchingPolicy>(Chunk<kMostPixels>(), pixels, body,
                                                             {0, kPrefetchInterleavedVideo});
             hwy::FlushStream();
         } else {

@@ -15,6 +15,7 @@
 
 #include "simd/interleave-inl.h"
 #include "simd/narrow-inl.h"
+#include "simd/products-inl.h"
 #include "simd/rowLoop-inl.h"
 #include "simd/target-inl.h"
 #include "video/videoFormats.h"
@@ -28,10 +29,13 @@ namespace quillon::HWY_NAMESPACE {
 // The least number of pixels in a chunk: their luma samples fill a block.
 inline constexpr size_t kLeastPixels = 16;
 
+// The most: a vector of luma samples or, where samples are split, two.
+inline constexpr size_t kMostPixels = (kHasInterleavedAccess ? 2 : 1) * kVectorBytes;
+
 // Calls use with the widest chunk for rows of at least kLeastPixels.
 template <class Use>
 HWY_INLINE void withVideoChunk(size_t width, const Use &use) {
-    withWidestChunk<kVectorBytes, 64, 32, kLeastPixels>(width, use);
+    withWidestChunk<kMostPixels, 64, 32, kLeastPixels>(width, use);
 }
 
 inline constexpr RowPolicy kPrefetchingPolicy = {.prefetches = true};
@@ -166,8 +170,7 @@ HWY_INLINE hn::Vec<D> pixels16(D16 /*d16*/, const FieldSums<hn::Vec<D16>> &sums)
 // The bytes of one field, from its sums in two vectors.
 template <class D, class V>
 HWY_INLINE hn::Vec<D> fieldBytes(D d, V first, V second) {
-    return hn::Xor(narrowSaturated(d, hn::ShiftRight<7>(first), hn::ShiftRight<7>(second)),
-                   hn::Set(d, 0x80));
+    return hn::Xor(shiftAndNarrowSaturated<7>(d, first, second), hn::Set(d, 0x80));
 }
 
 // As many pixels as d has bytes, from their sums in two vectors, whose quads come
