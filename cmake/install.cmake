@@ -38,7 +38,7 @@ file(RELATIVE_PATH libDirInPrefix ${CMAKE_INSTALL_PREFIX} ${CMAKE_INSTALL_FULL_L
 file(RELATIVE_PATH includeDirInPrefix ${CMAKE_INSTALL_PREFIX} ${CMAKE_INSTALL_FULL_INCLUDEDIR})
 # A static library brings what it is built of along, in this order.
 if(NOT BUILD_SHARED_LIBS)
-    set(requiredIfStatic "libpng libhwy ")
+    set(requiredIfStatic "libpng zlib libhwy ")
     set(linkedIfStatic " -lstdc++ -lm")
 endif()
 foreach(library IN ITEMS hearth quillon)
