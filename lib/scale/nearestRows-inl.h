@@ -229,62 +229,6 @@ private:
     uint32_t inner_;
 };
 
-// ---- Steps of 2, 4 and 8 pixels -------------------------------------------
-
-// Of 2^kLog2Step pixels the first.
-template <uint32_t kLog2Step>
-struct FirstOfEachBody {
-    static constexpr size_t kDstBytes = 4;
-    uint8_t *dst;
-    const uint8_t *src;
-
-    template <class C, class Access>
-    HWY_INLINE void operator()(C /*chunk*/, size_t i, Access access) const {
-        const PixelTag<C> d;
-        access.store(d, firstOfEach<kLog2Step>(d, src + 4 * (i << kLog2Step)), dst + 4 * i);
-    }
-
-private:
-    template <uint32_t k, class D>
-    static HWY_INLINE hn::Vec<D> firstOfEach(D d, const uint8_t *from) {
-        if constexpr (k == 0) {
-            return loadBytes(d, from);
-        } else {
-            const auto low = firstOfEach<k - 1>(d, from);
-            const auto high = firstOfEach<k - 1>(d, from + (kBytesOf<D> << (k - 1)));
-            return Neighbours<D>::of(d, low, high).left;
-        }
-    }
-};
-
-template <uint32_t kLog2Step, class Access>
-struct NearestFirstOfEach : RasterScaleRowNearest {
-    explicit NearestFirstOfEach(const ScaleAxis &axis)
-        : RasterScaleRowNearest(axis), first_(axis.start >> 16),
-          whole_(std::min((axis.srcSize - std::min(first_, axis.srcSize)) >> kLog2Step,
-                          axis.dstSize)) {}
-
-    HWY_INLINE void operator()(uint8_t *dst, const uint8_t *src) const {
-        walkPixelsBy<Access>(whole_, FirstOfEachBody<kLog2Step>{dst, src + size_t{4} * first_});
-        if (whole_ != count_) {
-            const size_t index = size_t{first_} + (size_t{whole_} << kLog2Step);
-            writeEnd(dst + size_t{4} * whole_, src, index, inner_ - whole_, srcSize_ - 1,
-                     count_ - inner_);
-        }
-    }
-
-private:
-    // The pixel whose step reaches behind the row, and copies of the last one.
-    static HWY_NOINLINE void writeEnd(uint8_t *dst, const uint8_t *src, size_t index, size_t count,
-                                      size_t last, size_t lastCount) {
-        fillPixels(dst, src, index, count);
-        fillPixels(dst + 4 * count, src, last, lastCount);
-    }
-
-    uint32_t first_;
-    uint32_t whole_; // pixels whose steps lie in the row
-};
-
 #endif
 } // namespace
 } // namespace quillon::HWY_NAMESPACE

@@ -11,6 +11,7 @@
 #include "scale/boxRows-inl.h"
 #include "scale/linearRows-inl.h"
 #include "scale/nearestRows-inl.h"
+#include "scale/nearestSteps-inl.h"
 #include "scale/quarterRows-inl.h"
 #include "scale/verticalPass-inl.h"
 

@@ -118,6 +118,16 @@ HWY_INLINE Halves<hn::Vec<D16>> multiplyWide(D8 /*d*/, hn::Vec<D8> v, int factor
             hn::Mul(hn::PromoteTo(d16, hn::UpperHalf(half, v)), factors)};
 }
 
+// (a + b) / 2 of bytes, truncated.
+template <class D8>
+HWY_INLINE hn::Vec<D8> averageDown(D8 /*d*/, hn::Vec<D8> a, hn::Vec<D8> b) {
+#if QUILLON_NEON
+    if constexpr (kLanes<D8> == 16)
+        return hn::Vec<D8>{vhaddq_u8(a.raw, b.raw)};
+#endif
+    return hn::Not(hn::AverageRound(hn::Not(a), hn::Not(b)));
+}
+
 // (a * (255 - weight) + b * weight) / 256 of bytes, truncated.
 template <class D8>
 HWY_INLINE hn::Vec<D8> blendBytes([[maybe_unused]] D8 d, hn::Vec<D8> a, hn::Vec<D8> b,
