@@ -26,10 +26,12 @@ struct RasterRectBand {
 
     // Replaces the spans first to last - 1, which may be none, by one.
     void replace(int first, int last, int32_t left, int32_t right) {
-        if (first == last)
-            std::copy_backward(spans + last, spans + count, spans + count + 1);
-        else
+        if (first == last) {
+            for (int i = count; i > first; --i)
+                spans[i] = spans[i - 1];
+        } else {
             std::copy(spans + last, spans + count, spans + first + 1);
+        }
         count -= last - first - 1;
         spans[first] = {.left = left, .right = right, .matched = false};
     }
