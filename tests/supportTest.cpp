@@ -43,8 +43,6 @@ TEST(Targets, areThoseOfTheLibrary) {
     const auto indexOfKernel = [] {
         uint8_t pixel = 0;
         Raster_RectFill(&pixel, 1, 1, 7, 0, 0, 1, 1);
-        // A single target is not chosen.
-        EXPECT_EQ(hwy::GetChosenTarget().IsInitialized(), kTargets.size() > 1);
         return hwy::GetChosenTarget().GetIndex();
     };
     std::set<size_t> indices;
@@ -55,7 +53,9 @@ TEST(Targets, areThoseOfTheLibrary) {
     });
     std::cout << std::endl;
     EXPECT_EQ(indices.size(), kTargets.size());
-    EXPECT_EQ(*indices.begin(), indexOfKernel());
+    // A single target is called without being chosen.
+    if (kTargets.size() > 1)
+        EXPECT_EQ(*indices.begin(), indexOfKernel());
 #ifdef HWY_WANT_AVX3_DL
     EXPECT_EQ(kTargets.front() == HWY_AVX3_DL, (hwy::SupportedTargets() & HWY_AVX3_DL) != 0);
 #endif
