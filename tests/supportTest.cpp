@@ -54,8 +54,9 @@ TEST(Targets, areThoseOfTheLibrary) {
     std::cout << std::endl;
     EXPECT_EQ(indices.size(), kTargets.size());
     // A single target is called without being chosen.
-    if (kTargets.size() > 1)
+    if (kTargets.size() > 1) {
         EXPECT_EQ(*indices.begin(), indexOfKernel());
+    }
 #ifdef HWY_WANT_AVX3_DL
     EXPECT_EQ(kTargets.front() == HWY_AVX3_DL, (hwy::SupportedTargets() & HWY_AVX3_DL) != 0);
 #endif
