@@ -3,6 +3,8 @@
 #include "arena.h"
 #include "memoryLimits.h"
 
+#include <hwy/targets.h>
+
 #include <algorithm>
 #include <chrono>
 
@@ -53,7 +55,9 @@ double speed(const Runner &ours, const Runner &theirs) {
     return median(ratios);
 }
 
-void compare(benchmark::State &state, const Operation &operation, std::vector<Result> &results) {
+void compare(benchmark::State &state, const Operation &operation, int64_t target,
+             std::vector<Result> &results) {
+    hwy::SetSupportedTargetsForTest(target);
     const std::vector<Job> jobs = makeJobs(operation);
     std::vector<Runner> runners = makeRunners(operation, jobs);
     const Runner &ours = runners[0];
@@ -66,7 +70,7 @@ void compare(benchmark::State &state, const Operation &operation, std::vector<Re
         ++first;
         state.SetIterationTime(ours.seconds.back());
     }
-    Result result = {&operation, 1e9 * median(ours.seconds), {}, {}, false};
+    Result result = {&operation, target, 1e9 * median(ours.seconds), {}, {}, false};
     state.counters["ns"] = result.nanoseconds;
     for (size_t i = 1; i < runners.size(); ++i) {
         const auto &[name, prepare, kind] = runners[i].contender;
@@ -104,10 +108,15 @@ double median(std::vector<double> values) {
     return *middle;
 }
 
-void registerComparisons(const std::vector<Operation> &operations, std::vector<Result> &results) {
+void registerComparisons(const std::vector<Operation> &operations, int64_t target,
+                         std::vector<Result> &results) {
     for (const Operation &operation : operations) {
-        const auto run = [&](benchmark::State &state) { compare(state, operation, results); };
-        benchmark::RegisterBenchmark(text(operation.name, "/", operation.area.name).c_str(), run)
+        const auto run = [&operation, target, &results](benchmark::State &state) {
+            compare(state, operation, target, results);
+        };
+        benchmark::RegisterBenchmark(
+            text(hwy::TargetName(target), "/", operation.name, "/", operation.area.name).c_str(),
+            run)
             ->UseManualTime()
             ->Iterations(kRounds);
     }

@@ -17,6 +17,7 @@ struct Standing {
 
 struct Result {
     const Operation *operation;
+    int64_t target;     // the instruction set of ours and of the limits
     double nanoseconds; // a call of ours
     Standing limit, peer;
     bool bytesDiffer; // from those of a peer whose bytes equal ours
@@ -29,6 +30,7 @@ double median(std::vector<double> values);
 
 // Registers the operations with Google Benchmark, an iteration being a round and a
 // counter the speed beside a contender.  Results are appended as they come.
-void registerComparisons(const std::vector<Operation> &operations, std::vector<Result> &results);
+void registerComparisons(const std::vector<Operation> &operations, int64_t target,
+                         std::vector<Result> &results);
 
 } // namespace quillon::bench

@@ -23,12 +23,21 @@ void pinToThisCore() {
     sched_setaffinity(0, sizeof(one), &one);
 }
 
-// Limits all kernels to an instruction set; false where there is none of that name.
-bool useTarget(const std::string &name) {
-    for (const int64_t target : hwy::SupportedAndGeneratedTargets())
-        if (name == hwy::TargetName(target))
-            return hwy::SetSupportedTargetsForTest(target), true;
-    return false;
+// The instruction sets of this processor that have the name; all of them for "".
+std::vector<int64_t> targetsNamed(const std::string &name) {
+    std::vector<int64_t> targets = hwy::SupportedAndGeneratedTargets();
+    std::erase_if(targets,
+                  [&](int64_t target) { return !name.empty() && name != hwy::TargetName(target); });
+    return targets;
+}
+
+// The best one, and AVX2, which most desktops have for their best.
+std::vector<int64_t> targetsByDefault() {
+    std::vector<int64_t> targets = {targetsNamed("")[0]};
+    for (const int64_t avx2 : targetsNamed("AVX2"))
+        if (avx2 != targets[0])
+            targets.push_back(avx2);
+    return targets;
 }
 
 // Writes to the folder, or to the console where there is none; false if it cannot.
@@ -44,6 +53,7 @@ int main(int argc, char **argv) {
     pinToThisCore();
     benchmark::Initialize(&argc, argv);
     std::string folder;
+    std::vector<int64_t> targets = targetsByDefault();
     bool isSweep = false, isGrowth = false, isMarked = false;
     for (const std::string argument : std::span(argv + 1, argv + argc)) {
         if (argument == "--sweep")
@@ -54,25 +64,32 @@ int main(int argc, char **argv) {
             isMarked = true;
         else if (argument.starts_with("--report="))
             folder = argument.substr(9);
-        else if (!argument.starts_with("--target=") || !useTarget(argument.substr(9)))
+        else if (argument.starts_with("--target="))
+            targets = targetsNamed(argument.substr(9));
+        else
             return benchmark::ReportUnrecognizedArguments(argc, argv), 1;
     }
+    if (targets.empty())
+        return std::fputs("This processor has no such instruction set\n", stderr), 1;
+    hwy::SetSupportedTargetsForTest(targets[0]);
     if (isSweep)
         return sweep() == 0 ? 0 : 1;
     if (isGrowth)
         return publish(growthPage(), folder, "/growth.md") ? 0 : 1;
 
-    const std::vector<Operation> operations = allOperations();
+    std::vector<Operation> operations = allOperations();
+    const std::string peers = addPeers(operations);
     if (isMarked)
         return markInstructions(operations), 0;
     std::vector<Result> results;
-    registerComparisons(operations, results);
-    benchmark::AddCustomContext("peers", peerText());
+    for (const int64_t target : targets)
+        registerComparisons(operations, target, results);
+    benchmark::AddCustomContext("peers", peers);
     benchmark::RunSpecifiedBenchmarks();
     benchmark::Shutdown();
     bool isGood = std::ranges::none_of(results, &Result::bytesDiffer);
     std::printf("\n%s", summaryText(results).c_str());
     if (!folder.empty())
-        isGood &= publish(performancePage(results), folder, "/performance.md");
+        isGood &= publish(performancePage(results, peers), folder, "/performance.md");
     return isGood ? 0 : 1;
 }

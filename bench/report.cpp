@@ -26,7 +26,10 @@ constexpr const char *kIntroduction =
     "are compared.\n\n"
     "- 32x32: a rectangle in a surface 1920 pixels wide; the cost of a call\n"
     "- 256x128: in cache; once with contiguous rows, once in a surface 1920 pixels wide\n"
-    "- 1920x1080: each call on memory that has left every cache\n\n";
+    "- 1920x1080: each call on memory that has left every cache\n\n"
+    "AVX3 is AVX-512. Where it is not the best instruction set, AVX2 is forced upon this library "
+    "and the limits, while the peers keep theirs. Means are geometric. For arm64, "
+    "[arm64.md](arm64.md) counts instructions.\n\n";
 
 constexpr const char *kHeadOfTable =
     "| Operation | A call, ns | / limit | / best peer |\n|---|--:|--:|--:|\n";
@@ -35,21 +38,59 @@ std::string standingText(const Standing &standing) {
     return standing.speed == 0 ? "" : text(fixed(standing.speed, 2), " (", standing.name, ")");
 }
 
-// The geometric mean of the speeds that there are of a family and an area ("": all),
-// followed by their count.
-std::string meanText(const std::vector<Result> &results, Standing Result::*standing,
-                     const std::string &family = "", const std::string &area = "") {
-    double sum = 0;
-    int count = 0;
+using Results = std::vector<Result>;
+using Key = std::string (*)(const Result &);
+
+std::string targetOf(const Result &result) {
+    return hwy::TargetName(result.target);
+}
+std::string familyOf(const Result &result) {
+    return result.operation->family;
+}
+std::string areaOf(const Result &result) {
+    return result.operation->area.name;
+}
+
+// The results by their keys, in the order in which these come first.
+std::vector<std::pair<std::string, Results>> groups(const Results &results, Key key) {
+    std::vector<std::pair<std::string, Results>> groups;
     for (const Result &result : results) {
-        const double speed = (result.*standing).speed;
-        if (speed > 0 && (family.empty() || result.operation->family == family) &&
-            (area.empty() || result.operation->area.name == area)) {
-            sum += std::log(speed);
-            ++count;
-        }
+        const std::string name = key(result);
+        auto group = std::ranges::find(groups, name, &std::pair<std::string, Results>::first);
+        if (group == groups.end())
+            group = groups.insert(group, {name, {}});
+        group->second.push_back(result);
     }
-    return count == 0 ? "" : text(fixed(std::exp(sum / count), 2), " (", count, ")");
+    return groups;
+}
+
+std::vector<double> speeds(const Results &results, Standing Result::*standing) {
+    std::vector<double> speeds;
+    for (const Result &result : results)
+        if ((result.*standing).speed > 0)
+            speeds.push_back((result.*standing).speed);
+    return speeds;
+}
+
+double geometricMean(const std::vector<double> &speeds) {
+    double sum = 0;
+    for (const double speed : speeds)
+        sum += std::log(speed);
+    return std::exp(sum / static_cast<double>(speeds.size()));
+}
+
+// Mean, median and count.
+std::string averageText(const Results &results, Standing Result::*standing) {
+    const std::vector<double> all = speeds(results, standing);
+    return all.empty() ? "| | |"
+                       : text("| ", fixed(geometricMean(all), 2), " | ", fixed(median(all), 2),
+                              " | ", all.size(), " ");
+}
+
+bool isBelowFloor(const Result &result) {
+    return (result.peer.speed > 0 && result.peer.speed < kPeerFloor) ||
+           (result.operation->area.isUncached && result.limit.speed > 0 &&
+            result.limit.speed < kLimitFloor);
 }
 
 std::string processorName() {
@@ -60,57 +101,46 @@ std::string processorName() {
     return "an unnamed processor";
 }
 
-void addOnce(std::vector<std::string> &values, const std::string &value) {
-    if (std::ranges::find(values, value) == values.end())
-        values.push_back(value);
-}
-
 } // namespace
 
-std::string summaryText(const std::vector<Result> &results) {
-    std::string lines =
-        text("Geometric means (of so many measurements): ", meanText(results, &Result::limit),
-             " of the limit, ", meanText(results, &Result::peer), " times the best peer. Below ",
-             kPeerFloor, " of the best peer or, uncached, ", kLimitFloor, " of the limit:\n\n");
-    for (const auto &[operation, nanoseconds, limit, peer, bytesDiffer] : results) {
-        const bool isLimit =
-            operation->area.isUncached && limit.speed > 0 && limit.speed < kLimitFloor;
-        if (isLimit || (peer.speed > 0 && peer.speed < kPeerFloor))
-            lines += text("- ", operation->name, ", ", operation->area.name, ": ",
-                          standingText(isLimit ? limit : peer), "\n");
+std::string summaryText(const Results &results) {
+    std::string averages, slow;
+    for (const auto &[target, ofTarget] : groups(results, targetOf)) {
+        averages += text("| ", target, " | all ", averageText(ofTarget, &Result::limit),
+                         averageText(ofTarget, &Result::peer), "|\n");
+        for (const auto &[family, ofFamily] : groups(ofTarget, familyOf))
+            averages +=
+                text("| ", target, " | ", family, " ", averageText(ofFamily, &Result::limit),
+                     averageText(ofFamily, &Result::peer), "|\n");
+        for (const Result &result : ofTarget)
+            if (isBelowFloor(result))
+                slow +=
+                    text("| ", target, " | ", result.operation->name, ", ", areaOf(result), " | ",
+                         standingText(result.limit), " | ", standingText(result.peer), " |\n");
     }
-    return lines;
+    return text("| Instruction set | Family | / limit: mean | median | rows | / best peer: mean | "
+                "median | rows |\n|---|---|--:|--:|--:|--:|--:|--:|\n",
+                averages, "\nBelow ", kPeerFloor, " of the best peer or, uncached, ", kLimitFloor,
+                " of the limit:\n\n| Instruction set | Operation | / limit | / best peer |\n"
+                "|---|---|--:|--:|\n",
+                slow);
 }
 
-std::string performancePage(const std::vector<Result> &results) {
-    std::vector<std::string> families, areas;
-    for (const Result &result : results) {
-        addOnce(families, result.operation->family);
-        addOnce(areas, result.operation->area.name);
-    }
-    std::string head = "| Family |", line = "\n|---|", rows, tables;
-    for (const std::string &family : families) {
-        rows += text("\n| ", family, " |");
-        for (const std::string &area : areas)
-            rows += text(" ", meanText(results, &Result::peer, family, area), " |");
-    }
-    for (const std::string &area : areas) {
-        head += text(" ", area, " |");
-        line += "--:|";
-        tables += text("\n## ", area, "\n\n", kHeadOfTable);
-        for (const auto &[operation, nanoseconds, limit, peer, bytesDiffer] : results)
-            if (operation->area.name == area)
-                tables += text("| ", operation->name, " | ",
-                               fixed(nanoseconds, nanoseconds < 100 ? 1 : 0), " | ",
-                               standingText(limit), " | ", standingText(peer), " |\n");
-    }
+std::string performancePage(const Results &results, const std::string &peers) {
+    std::string tables;
+    for (const auto &[target, ofTarget] : groups(results, targetOf))
+        for (const auto &[area, ofArea] : groups(ofTarget, areaOf)) {
+            tables += text("\n## ", target, ", ", area, "\n\n", kHeadOfTable);
+            for (const Result &result : ofArea)
+                tables +=
+                    text("| ", result.operation->name, " | ",
+                         fixed(result.nanoseconds, result.nanoseconds < 100 ? 1 : 0), " | ",
+                         standingText(result.limit), " | ", standingText(result.peer), " |\n");
+        }
     return text("# Performance\n\nWritten by `scripts/bench --report=docs`; do not edit.\n\n"
                 "Measured on one core of ",
-                processorName(), " (", hwy::TargetName(hwy::SupportedAndGeneratedTargets()[0]),
-                "). Peers: ", peerText(), ".\n\n", kIntroduction, summaryText(results),
-                "\n## Beside the best peer\n\nGeometric means, and the counts of operations that "
-                "peers have.\n\n",
-                head, line, rows, "\n", tables);
+                processorName(), ". Peers: ", peers, ".\n\n", kIntroduction, summaryText(results),
+                tables);
 }
 
 } // namespace quillon::bench

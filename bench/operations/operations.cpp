@@ -1,7 +1,5 @@
 #include "operations.h"
 
-#include "../peers/peers.h"
-
 #include <algorithm>
 
 namespace quillon::bench {
@@ -26,7 +24,6 @@ std::vector<Operation> allOperations() {
     addImages(plan);
     plan.area = {"calls of the C++ face", 8, 8, 640};
     addFace(plan);
-    addPeers(plan.operations);
     return plan.operations;
 }
 

@@ -55,7 +55,7 @@ void addFace(Plan &plan); // in small rectangles
 // Those that have an area.
 std::vector<Operation> pixelOperations(const Area &area);
 
-// All, with their peers.
+// All, without their peers.
 std::vector<Operation> allOperations();
 
 } // namespace quillon::bench

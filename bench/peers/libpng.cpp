@@ -8,7 +8,7 @@
 
 namespace quillon::bench {
 
-void offerLibpng(const Peer &peer) {
+std::string offerLibpng(const Peer &peer) {
     peer.offer("PNG read", [file = pngFile()] {
         png_image image = {};
         image.version = PNG_IMAGE_VERSION;
@@ -30,6 +30,7 @@ void offerLibpng(const Peer &peer) {
                                   static_cast<png_int_32>(from.bytesPerLine), nullptr);
         benchmark::DoNotOptimize(file.get());
     });
+    return png_get_libpng_ver(nullptr);
 }
 
 } // namespace quillon::bench

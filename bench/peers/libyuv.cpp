@@ -34,7 +34,7 @@ auto scale(libyuv::FilterMode filter) {
 
 } // namespace
 
-void offerLibyuv(const Peer &peer) {
+std::string offerLibyuv(const Peer &peer) {
     const auto setPlane = [](const Buffer &dst) {
         libyuv::SetPlane(dst.data, dst.stride, dst.w(), dst.h(), kPixel & 0xFF);
     };
@@ -65,6 +65,7 @@ void offerLibyuv(const Peer &peer) {
     peer.offer("linear *", scale(libyuv::kFilterBilinear));
     // By other factors its box filter interpolates.
     peer.offer("box by 0.5", scale(libyuv::kFilterBox));
+    return std::to_string(LIBYUV_VERSION);
 }
 
 } // namespace quillon::bench

@@ -51,7 +51,7 @@ Work applyKey(const Job &job) {
 
 } // namespace
 
-void offerOpenCv(const Peer &peer) {
+std::string offerOpenCv(const Peer &peer) {
     cv::setNumThreads(1);
     using Mat = cv::Mat;
     const auto exact = [&](const char *names, const auto &call) {
@@ -86,6 +86,7 @@ void offerOpenCv(const Peer &peer) {
     peer.offer("nearest *", resize(cv::INTER_NEAREST));
     peer.offer("linear *", resize(cv::INTER_LINEAR));
     peer.offer("box *", resize(cv::INTER_AREA));
+    return CV_VERSION;
 }
 
 } // namespace quillon::bench

@@ -12,18 +12,12 @@ constexpr struct {
 
 } // namespace
 
-std::string peerText() {
+std::string addPeers(std::vector<Operation> &operations) {
     std::string names;
     for (const auto &[name, offer] : kPeers)
-        names += text(names.empty() ? "" : ", ", name,
-                      offer == nullptr ? " (not installed, left out)" : "");
+        names += text(names.empty() ? "" : ", ", name, " ",
+                      offer == nullptr ? "(not installed, left out)" : offer({name, operations}));
     return names;
-}
-
-void addPeers(std::vector<Operation> &operations) {
-    for (const auto &[name, offer] : kPeers)
-        if (offer != nullptr)
-            offer({name, operations});
 }
 
 } // namespace quillon::bench

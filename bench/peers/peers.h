@@ -23,14 +23,13 @@ struct Peer {
 };
 
 // Each in a file of its own, which is left out of the program where its library
-// is not installed; the address is null then.
-using Offer = void(const Peer &peer);
+// is not installed; the address is null then.  Returns the version of the library.
+using Offer = std::string(const Peer &peer);
 [[gnu::weak]] Offer offerPixman, offerLibyuv, offerOpenCv, offerSwscale, offerSdl, offerSpng,
     offerLibpng;
 
-// The names of the libraries, and which of them are missing.
-std::string peerText();
-
-void addPeers(std::vector<Operation> &operations);
+// Adds the libraries to the operations that they have.  Returns their names and
+// versions, and which of them are missing.
+std::string addPeers(std::vector<Operation> &operations);
 
 } // namespace quillon::bench

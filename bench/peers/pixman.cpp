@@ -99,7 +99,7 @@ void runSteps(const std::vector<RegionStep> &steps) {
 
 } // namespace
 
-void offerPixman(const Peer &peer) {
+std::string offerPixman(const Peer &peer) {
     for (const int bits : {8, 16, 32}) {
         const auto fill = [=](const Buffer &dst) {
             pixman_fill(reinterpret_cast<uint32_t *>(dst.data), dst.stride / 4, bits, 0, 0, dst.w(),
@@ -127,6 +127,7 @@ void offerPixman(const Peer &peer) {
     peer.offer("box *", scale(PIXMAN_FILTER_SEPARABLE_CONVOLUTION));
     for (const auto &[name, steps] : regionSequences())
         peer.offer(text("rectangles ", name), [&steps = steps] { runSteps(steps); });
+    return pixman_version_string();
 }
 
 } // namespace quillon::bench

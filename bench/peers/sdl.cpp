@@ -48,7 +48,7 @@ auto convertFrame(uint32_t from, uint32_t to) {
 
 } // namespace
 
-void offerSdl(const Peer &peer) {
+std::string offerSdl(const Peer &peer) {
     constexpr struct {
         int32_t depth;
         uint32_t format;
@@ -68,6 +68,9 @@ void offerSdl(const Peer &peer) {
     }
     peer.offer("blend *",
                blit(SDL_PIXELFORMAT_ARGB8888, SDL_PIXELFORMAT_RGB888, SDL_BLENDMODE_BLEND));
+    SDL_version version;
+    SDL_GetVersion(&version);
+    return text(int{version.major}, ".", int{version.minor}, ".", int{version.patch});
 }
 
 } // namespace quillon::bench

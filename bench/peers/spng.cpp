@@ -9,7 +9,7 @@
 
 namespace quillon::bench {
 
-void offerSpng(const Peer &peer) {
+std::string offerSpng(const Peer &peer) {
     peer.offer("PNG read", [file = pngFile()] {
         const std::unique_ptr<spng_ctx, decltype(&spng_ctx_free)> context(spng_ctx_new(0),
                                                                           spng_ctx_free);
@@ -21,6 +21,7 @@ void offerSpng(const Peer &peer) {
             throw std::runtime_error("libspng cannot read the picture");
         benchmark::DoNotOptimize(pixels.get());
     });
+    return spng_version_string();
 }
 
 } // namespace quillon::bench

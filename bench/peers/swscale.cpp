@@ -36,7 +36,7 @@ auto convert(AVPixelFormat from, AVPixelFormat to, int flags = SWS_POINT) {
 
 } // namespace
 
-void offerSwscale(const Peer &peer) {
+std::string offerSwscale(const Peer &peer) {
     av_log_set_level(AV_LOG_ERROR);
     constexpr struct {
         int32_t depth;
@@ -54,6 +54,7 @@ void offerSwscale(const Peer &peer) {
     peer.offer("nearest *", convert(AV_PIX_FMT_BGRA, AV_PIX_FMT_BGRA, SWS_POINT));
     peer.offer("linear *", convert(AV_PIX_FMT_BGRA, AV_PIX_FMT_BGRA, SWS_BILINEAR));
     peer.offer("box *", convert(AV_PIX_FMT_BGRA, AV_PIX_FMT_BGRA, SWS_AREA));
+    return text(AV_VERSION_MAJOR(swscale_version()), ".", AV_VERSION_MINOR(swscale_version()));
 }
 
 } // namespace quillon::bench
