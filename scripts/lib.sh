@@ -14,6 +14,7 @@ cd "$(dirname "${BASH_SOURCE[0]}")/.."
 buildPackages=(cmake g++ ninja-build pkg-config libpng-dev libhwy-dev libgtest-dev)
 benchPackages=(libbenchmark-dev)
 peerPackages=(libpixman-1-dev libyuv-dev libopencv-imgproc-dev libswscale-dev libsdl2-dev libspng-dev)
+desktopPackages=(libsdl2-dev libvncserver-dev)
 formatPackages=(clang-format)
 clangPackages=(clang libclang-rt-dev)
 lintPackages=(clang clang-tidy)
