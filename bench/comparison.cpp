@@ -39,9 +39,11 @@ std::vector<Runner> makeRunners(const Operation &operation, const std::vector<Jo
 }
 
 // What the runner makes of the initial content.
-std::vector<uint8_t> output(const Runner &runner, const Plane &plane, const Buffer &dst) {
+std::vector<uint8_t> output(const Runner &runner, const Plane &plane, const Job &job) {
+    const Buffer &dst = job.dst();
     plane.content(dst.data, dst.bytes());
-    runner.works[0]();
+    const Prepare &prepareCheck = runner.contender.prepareCheck;
+    prepareCheck ? prepareCheck(job)() : runner.works[0]();
     std::vector<uint8_t> bytes;
     for (size_t y = 0; y < dst.height; ++y)
         bytes.insert(bytes.end(), dst.row(y), dst.row(y) + dst.rowBytes);
@@ -73,13 +75,13 @@ void compare(benchmark::State &state, const Operation &operation, int64_t target
     Result result = {&operation, target, 1e9 * median(ours.seconds), {}, {}, false};
     state.counters["ns"] = result.nanoseconds;
     for (size_t i = 1; i < runners.size(); ++i) {
-        const auto &[name, prepare, kind] = runners[i].contender;
+        const auto &[name, prepare, kind, prepareCheck] = runners[i].contender;
         Standing &best = kind == Kind::Limit ? result.limit : result.peer;
         const double beside = state.counters[name] = speed(ours, runners[i]);
         if (best.speed == 0 || beside < best.speed)
             best = {beside, name};
-        if (kind == Kind::Exact && output(runners[i], operation.planes[0], jobs[0].dst()) !=
-                                       output(ours, operation.planes[0], jobs[0].dst())) {
+        if (kind == Kind::Exact && output(runners[i], operation.planes[0], jobs[0]) !=
+                                       output(ours, operation.planes[0], jobs[0])) {
             result.bytesDiffer = true;
             state.SetLabel(text("the bytes of ", name, " differ"));
         }

@@ -92,6 +92,9 @@ struct Contender {
     std::string name;
     Prepare prepare;
     Kind kind = Kind::Exact;
+    // Does the same and leaves in the destination what is compared; for work that
+    // leaves no bytes there.
+    Prepare prepareCheck = {};
 };
 
 // The memory traffic that bounds an operation.

@@ -13,7 +13,7 @@ cd "$(dirname "${BASH_SOURCE[0]}")/.."
 # Debian packages, by what they are needed for.
 buildPackages=(cmake g++ ninja-build pkg-config libpng-dev libhwy-dev libgtest-dev)
 benchPackages=(libbenchmark-dev)
-peerPackages=(libpixman-1-dev libyuv-dev libopencv-imgproc-dev libswscale-dev libsdl2-dev libspng-dev)
+peerPackages=(libpixman-1-dev libyuv-dev libopencv-imgproc-dev libswscale-dev libsdl2-dev libspng-dev qtbase5-dev)
 desktopPackages=(libsdl2-dev libvncserver-dev)
 formatPackages=(clang-format)
 clangPackages=(clang libclang-rt-dev)

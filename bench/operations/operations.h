@@ -7,7 +7,6 @@
 #include <quillon/imageUtil.h>
 #include <quillon/raster.h>
 
-#include <map>
 #include <span>
 
 namespace quillon::bench {
@@ -22,15 +21,6 @@ inline constexpr int32_t kIndex = 0; // a depth: palette indices
 inline std::string conversionName(int32_t srcDepth, int32_t dstDepth) {
     return text(srcDepth == kIndex ? "index" : text("convert ", srcDepth), " to ", dstDepth);
 }
-
-// A rectangle that is added to a region or cut out of it.
-struct RegionStep {
-    bool isCut;
-    int32_t x, y, width, height;
-};
-// By name; none is of more than 15 rectangles at any time.
-using RegionSequences = std::map<std::string, std::vector<RegionStep>>;
-const RegionSequences &regionSequences();
 
 // The picture of the image operations, 32 bits a pixel, and its PNG file at zlib's
 // default level, 6.

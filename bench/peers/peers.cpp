@@ -8,7 +8,7 @@ constexpr struct {
     Offer *offer;
 } kPeers[] = {{"pixman", offerPixman},   {"libyuv", offerLibyuv}, {"OpenCV", offerOpenCv},
               {"swscale", offerSwscale}, {"SDL", offerSdl},       {"libspng", offerSpng},
-              {"libpng", offerLibpng}};
+              {"libpng", offerLibpng},   {"Qt", offerQt}};
 
 } // namespace
 

@@ -2,7 +2,7 @@
 // built.
 #pragma once
 
-#include "../operation.h"
+#include "../regions.h"
 
 #include <fnmatch.h>
 
@@ -15,10 +15,19 @@ struct Peer {
 
     // The names of the operations are a pattern of fnmatch.
     template <class Call>
-    void offer(const std::string &names, const Call &call, Kind kind = Kind::Approximate) const {
+    void offer(const std::string &names, const Call &call, Kind kind = Kind::Approximate,
+               const Prepare &prepareCheck = {}) const {
         for (Operation &operation : operations)
             if (fnmatch(names.c_str(), operation.name.c_str(), 0) == 0)
-                operation.contenders.push_back({library, prepare(call), kind});
+                operation.contenders.push_back({library, prepare(call), kind, prepareCheck});
+    }
+
+    // A region of the library, as regions.h wants it.
+    template <class Region>
+    void offerRegions() const {
+        for (const auto &[name, steps] : regionSequences())
+            offer(text("rectangles ", name), regionWork<Region>(steps), Kind::Exact,
+                  regionCheck<Region>(steps));
     }
 };
 
@@ -26,7 +35,7 @@ struct Peer {
 // is not installed; the address is null then.  Returns the version of the library.
 using Offer = std::string(const Peer &peer);
 [[gnu::weak]] Offer offerPixman, offerLibyuv, offerOpenCv, offerSwscale, offerSdl, offerSpng,
-    offerLibpng;
+    offerLibpng, offerQt;
 
 // Adds the libraries to the operations that they have.  Returns their names and
 // versions, and which of them are missing.

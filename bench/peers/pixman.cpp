@@ -81,21 +81,35 @@ auto scale(pixman_filter_t filter) {
     };
 }
 
-void runSteps(const std::vector<RegionStep> &steps) {
-    pixman_region32_t region, hole;
-    pixman_region32_init(&region);
-    for (const auto &[isCut, x, y, width, height] : steps) {
-        const auto w = static_cast<unsigned>(width), h = static_cast<unsigned>(height);
-        if (isCut) {
-            pixman_region32_init_rect(&hole, x, y, w, h);
-            pixman_region32_subtract(&region, &region, &hole);
-        } else {
-            pixman_region32_union_rect(&region, &region, x, y, w, h);
-        }
+class PixmanRegion {
+public:
+    PixmanRegion() { pixman_region32_init(&region); }
+    ~PixmanRegion() { pixman_region32_fini(&region); }
+    PixmanRegion(const PixmanRegion &) = delete;
+    PixmanRegion &operator=(const PixmanRegion &) = delete;
+
+    void add(const RegionStep &step) {
+        pixman_region32_union_rect(&region, &region, step.x, step.y, unsigned(step.width),
+                                   unsigned(step.height));
     }
-    benchmark::DoNotOptimize(region);
-    pixman_region32_fini(&region);
-}
+    void cut(const RegionStep &step) {
+        pixman_region32_t hole;
+        pixman_region32_init_rect(&hole, step.x, step.y, unsigned(step.width),
+                                  unsigned(step.height));
+        pixman_region32_subtract(&region, &region, &hole);
+    }
+    uint32_t area() {
+        int count = 0;
+        const pixman_box32_t *boxes = pixman_region32_rectangles(&region, &count);
+        uint32_t sum = 0;
+        for (const pixman_box32_t &box : std::span(boxes, size_t(count)))
+            sum += uint32_t(box.x2 - box.x1) * uint32_t(box.y2 - box.y1);
+        return sum;
+    }
+
+private:
+    pixman_region32_t region;
+};
 
 } // namespace
 
@@ -125,8 +139,7 @@ std::string offerPixman(const Peer &peer) {
     peer.offer("nearest *", scale(PIXMAN_FILTER_NEAREST));
     peer.offer("linear *", scale(PIXMAN_FILTER_BILINEAR));
     peer.offer("box *", scale(PIXMAN_FILTER_SEPARABLE_CONVOLUTION));
-    for (const auto &[name, steps] : regionSequences())
-        peer.offer(text("rectangles ", name), [&steps = steps] { runSteps(steps); });
+    peer.offerRegions<PixmanRegion>();
     return pixman_version_string();
 }
 
