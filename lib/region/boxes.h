@@ -10,6 +10,7 @@
 #include "core/coordinates.h"
 
 #include <cstdint>
+#include <cstring>
 
 namespace quillon {
 
@@ -32,6 +33,10 @@ inline RasterRectListEntry entryOf(const Rect &box) {
             .y = box.top,
             .width = wrappingSubtract(box.right, box.left),
             .height = wrappingSubtract(box.bottom, box.top)};
+}
+
+inline int32_t bottomOf(const RasterRectListEntry &entry) {
+    return wrappingAdd(entry.y, entry.height);
 }
 
 inline uint32_t areaOf(const RasterRectListEntry &entry) {
@@ -78,6 +83,10 @@ inline bool isBefore(const Rect &a, const Rect &b) {
     return a.top != b.top ? a.top < b.top : a.left < b.left;
 }
 
+inline bool isBefore(const RasterRectListEntry &entry, const Rect &box) {
+    return entry.y != box.top ? entry.y < box.top : entry.x < box.left;
+}
+
 template <int kCapacity>
 struct Boxes {
     int count = 0;
@@ -98,16 +107,23 @@ inline bool isEmptyList(const RasterRectList &list) {
 
 // Whether the slots from the given one on are all zero.
 inline bool isZeroFrom(const RasterRectList &list, int slot) {
-    // Fields are combined separately: the compiler then uses one vector instruction
-    // per entry.
-    RasterRectListEntry bits = {};
-    for (; slot < kSlots; ++slot) {
-        bits.x |= list.entries[slot].x;
-        bits.y |= list.entries[slot].y;
-        bits.width |= list.entries[slot].width;
-        bits.height |= list.entries[slot].height;
+    // One vector instruction a slot, and a branch for every four: this is a quarter of
+    // the time of a short call.
+    using Bits = uint64_t __attribute__((vector_size(16)));
+    static_assert(sizeof(Bits) == sizeof(RasterRectListEntry));
+    Bits bits = {};
+    const auto combine = [&](int i) {
+        Bits entry;
+        std::memcpy(&entry, &list.entries[i], sizeof(entry));
+        bits |= entry;
+    };
+    for (; slot % 4 != 0; ++slot)
+        combine(slot);
+    for (; slot < kSlots; slot += 4) {
+        for (int i = 0; i < 4; ++i)
+            combine(slot + i);
     }
-    return (bits.x | bits.y | bits.width | bits.height) == 0;
+    return (bits[0] | bits[1]) == 0;
 }
 
 // Clears entry by entry: compilers clear a record of this size as a whole by a

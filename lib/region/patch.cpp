@@ -1,11 +1,34 @@
 #include "region/patch.h"
 
-#include "region/survey.h"
-
 #include <algorithm>
 
 namespace quillon {
 namespace {
+
+// The boxes of the entries near a rectangle, with their indices, ascending.
+struct NearBoxes {
+    int count = 0;
+    int indices[kSlots];
+    Rect boxes[kSlots];
+
+    const Rect *begin() const { return boxes; }
+    const Rect *end() const { return boxes + count; }
+};
+
+// Those of the boxes that overlap or touch the rectangle, corners included, for which
+// the predicate holds.
+template <class Predicate>
+void findNear(const RasterRectList &list, int count, const Rect &rect, Predicate isWanted,
+              NearBoxes &near) {
+    for (int i = 0; i < count && list.entries[i].y <= rect.bottom; ++i) {
+        const Rect box = boxOf(list.entries[i]);
+        if (box.bottom < rect.top || box.right < rect.left || rect.right < box.left ||
+            !isWanted(box))
+            continue;
+        near.indices[near.count] = i;
+        near.boxes[near.count++] = box;
+    }
+}
 
 // ---- The boxes that replace the near ones -----------------------------------
 
@@ -33,11 +56,10 @@ inline Rect *pieceAbove(Pieces &pieces, const Rect &box) {
 
 // Appends the pieces in the rows of an added rectangle, in each of which it is one
 // span with all the near ones.  Gives the piece of the last rows.
-Rect *appendJoinedRows(const Survey &survey, const Rect &rect, Pieces &pieces) {
+Rect *appendJoinedRows(const NearBoxes &near, const Rect &rect, Pieces &pieces) {
     // The boxes that extend the rectangle to the left or right, by ascending top.
     Boxes<kSlots> wide;
-    for (int i = 0; i < survey.nearCount; ++i) {
-        const Rect &box = survey.nearBox(i);
+    for (const Rect &box : near) {
         if (shareRows(box, rect) && (box.left < rect.left || box.right > rect.right))
             wide.append(box);
     }
@@ -74,15 +96,13 @@ Rect *appendJoinedRows(const Survey &survey, const Rect &rect, Pieces &pieces) {
     return piece;
 }
 
-void makeAddedPieces(const Survey &survey, const Rect &rect, Pieces &pieces) {
-    for (int i = 0; i < survey.nearCount; ++i) {
-        const Rect &box = survey.nearBox(i);
+void makeAddedPieces(const NearBoxes &near, const Rect &rect, Pieces &pieces) {
+    for (const Rect &box : near) {
         if (box.top < rect.top)
             pieces.append({box.left, box.top, box.right, std::min(box.bottom, rect.top)});
     }
-    Rect *const last = appendJoinedRows(survey, rect, pieces);
-    for (int i = 0; i < survey.nearCount; ++i) {
-        const Rect &box = survey.nearBox(i);
+    Rect *const last = appendJoinedRows(near, rect, pieces);
+    for (const Rect &box : near) {
         if (box.bottom <= rect.bottom)
             continue;
         if (haveSameColumns(*last, box))
@@ -103,9 +123,8 @@ inline void insertBesideCut(Pieces &pieces, const Rect &box) {
         insertInOrder(pieces, box);
 }
 
-void makeCutPieces(const Survey &survey, const Rect &cut, Pieces &pieces) {
-    for (int i = 0; i < survey.nearCount; ++i) {
-        const Rect &box = survey.nearBox(i);
+void makeCutPieces(const NearBoxes &near, const Rect &cut, Pieces &pieces) {
+    for (const Rect &box : near) {
         if (!overlap(box, cut)) {
             insertBesideCut(pieces, box);
             continue;
@@ -123,81 +142,93 @@ void makeCutPieces(const Survey &survey, const Rect &cut, Pieces &pieces) {
 
 // ---- Their way into the list ------------------------------------------------
 
-bool fits(const Survey &survey, const Pieces &pieces) {
-    return survey.list.count - survey.nearCount + pieces.count <= kMaxEntries &&
-           std::all_of(pieces.begin(), pieces.end(), isStorable);
+// No piece is empty, but one may be too large.
+bool areStorable(const Pieces &pieces) {
+    int32_t signs = 0;
+    for (const Rect &piece : pieces)
+        signs |=
+            wrappingSubtract(piece.right, piece.left) | wrappingSubtract(piece.bottom, piece.top);
+    return signs >= 0;
 }
 
-// Merges the pieces with the entries that stay, and gives the area of all.  From
-// the last entry on, so that entries before the first change are not visited.
-uint32_t replaceNear(RasterRectList &list, const Survey &survey, const Pieces &pieces) {
-    const int oldCount = survey.list.count;
-    uint32_t area = survey.area;
-    int from = oldCount - 1;
-    int nearLeft = survey.nearCount;
-    int piecesLeft = pieces.count;
-    int to = oldCount - nearLeft + piecesLeft;
-    // The last slot of a list in normal form is all zero.
-    for (int i = to; i < oldCount; ++i)
-        list.entries[i] = list.entries[kSlots - 1];
-    while (nearLeft > 0 || piecesLeft > 0) {
-        if (nearLeft > 0 && survey.near[nearLeft - 1] == from) {
-            --nearLeft;
-            area -= areaOf(survey.list.boxes[from--]);
-        } else if (piecesLeft > 0 &&
-                   (from < 0 || isBefore(survey.list.boxes[from], pieces.boxes[piecesLeft - 1]))) {
-            area += areaOf(pieces.boxes[--piecesLeft]);
-            list.entries[--to] = entryOf(pieces.boxes[piecesLeft]);
-        } else {
-            list.entries[--to] = entryOf(survey.list.boxes[from--]);
-        }
+// Gives the area of what is removed.
+uint32_t removeNear(RasterRectList &list, int count, const NearBoxes &near) {
+    uint32_t area = 0;
+    for (const Rect &box : near)
+        area += areaOf(box);
+    int next = 0;
+    int to = near.count > 0 ? near.indices[0] : count;
+    for (int from = to; from < count; ++from) {
+        if (next < near.count && near.indices[next] == from)
+            ++next;
+        else
+            list.entries[to++] = list.entries[from];
     }
     return area;
 }
 
-PatchResult replaceIfFits(RasterRectList &list, const Survey &survey, const Pieces &pieces) {
-    if (!fits(survey, pieces))
-        return {PatchOutcome::kDoesNotFit, 0};
-    return {PatchOutcome::kDone, replaceNear(list, survey, pieces)};
+// Gives the area of what is inserted.  From the last entry on, so that entries before
+// the first piece are not visited.
+uint32_t insertPieces(RasterRectList &list, int count, const Pieces &pieces) {
+    uint32_t area = 0;
+    RasterRectListEntry *last = list.entries + count - 1;
+    for (int i = pieces.count - 1; i >= 0; --i) {
+        const Rect &piece = pieces.boxes[i];
+        for (; last >= list.entries && !isBefore(*last, piece); --last)
+            last[i + 1] = *last;
+        last[i + 1] = entryOf(piece);
+        area += areaOf(piece);
+    }
+    return area;
+}
+
+PatchResult replaceIfFits(RasterRectList &list, int count, uint32_t area, const NearBoxes &near,
+                          const Pieces &pieces) {
+    const int kept = count - near.count;
+    const int newCount = kept + pieces.count;
+    if (newCount > kMaxEntries || !areStorable(pieces))
+        return {false, 0};
+    area -= removeNear(list, count, near);
+    area += insertPieces(list, kept, pieces);
+    for (int i = newCount; i < count; ++i)
+        list.entries[i] = {};
+    return {true, area};
 }
 
 } // namespace
 
-PatchResult addByPatch(RasterRectList &list, int32_t x, int32_t y, int32_t width, int32_t height) {
-    const Rect rect = boxOf(x, y, width, height);
-    Survey survey;
-    surveyList(list, rect, survey);
-    if (!survey.isNormal || isEmpty(rect))
-        return {PatchOutcome::kNeedsSweep, 0};
-    for (int i = 0; i < survey.nearCount; ++i) {
-        if (covers(survey.nearBox(i), rect))
-            return {PatchOutcome::kDone, survey.area};
-    }
+PatchResult addByPatch(RasterRectList &list, int count, uint32_t area, const Rect &rect) {
+    NearBoxes near;
     // An entry right above or below can continue only in rows that the rectangle
     // extends to the entry's own columns.
-    survey.keepNear([&](const Rect &box) {
-        return shareRows(box, rect) || (box.left <= rect.left && rect.right <= box.right);
-    });
+    findNear(
+        list, count, rect,
+        [&](const Rect &box) {
+            return shareRows(box, rect) || (box.left <= rect.left && rect.right <= box.right);
+        },
+        near);
+    if (std::any_of(near.begin(), near.end(), [&](const Rect &box) { return covers(box, rect); }))
+        return {true, area};
     Pieces pieces;
-    makeAddedPieces(survey, rect, pieces);
-    return replaceIfFits(list, survey, pieces);
+    makeAddedPieces(near, rect, pieces);
+    return replaceIfFits(list, count, area, near, pieces);
 }
 
-PatchResult cutByPatch(RasterRectList &list, const Rect &cut) {
-    Survey survey;
-    surveyList(list, cut, survey);
-    if (!survey.isNormal)
-        return {PatchOutcome::kNeedsSweep, 0};
-    if (survey.nearCount == 0 || isEmpty(cut))
-        return {PatchOutcome::kDone, survey.area};
+PatchResult cutByPatch(RasterRectList &list, int count, uint32_t area, const Rect &cut) {
+    NearBoxes near;
     // An entry right above or below can continue only in what is left beside the
     // cut.
-    survey.keepNear([&](const Rect &box) {
-        return shareRows(box, cut) || box.right == cut.left || box.left == cut.right;
-    });
+    findNear(
+        list, count, cut,
+        [&](const Rect &box) {
+            return shareRows(box, cut) || box.right == cut.left || box.left == cut.right;
+        },
+        near);
+    if (std::none_of(near.begin(), near.end(), [&](const Rect &box) { return overlap(box, cut); }))
+        return {true, area};
     Pieces pieces;
-    makeCutPieces(survey, cut, pieces);
-    return replaceIfFits(list, survey, pieces);
+    makeCutPieces(near, cut, pieces);
+    return replaceIfFits(list, count, area, near, pieces);
 }
 
 } // namespace quillon

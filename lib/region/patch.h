@@ -8,23 +8,18 @@
 // touches the rectangle, too.
 #pragma once
 
-#include "region/boxes.h"
+#include "region/survey.h"
 
 namespace quillon {
 
-enum class PatchOutcome : uint32_t {
-    kDone,
-    kDoesNotFit, // the result has more entries than a list, or one that is too large
-    kNeedsSweep, // the list is not in normal form, or the rectangle wraps
-};
-
 struct PatchResult {
-    PatchOutcome outcome;
-    uint32_t area; // of the changed list, when done
+    bool isDone;   // otherwise the result has too many entries, or one that is too large
+    uint32_t area; // of the changed list
 };
 
-// These change the list only when done.
-PatchResult addByPatch(RasterRectList &list, int32_t x, int32_t y, int32_t width, int32_t height);
-PatchResult cutByPatch(RasterRectList &list, const Rect &cut);
+// These change a list in normal form of so many entries and pixels, or leave it as it is when they
+// cannot.  The added rectangle is not empty.
+PatchResult addByPatch(RasterRectList &list, int count, uint32_t area, const Rect &rect);
+PatchResult cutByPatch(RasterRectList &list, int count, uint32_t area, const Rect &cut);
 
 } // namespace quillon

@@ -6,11 +6,14 @@
 #include <quillon/raster.h>
 
 #include "core/failure.h"
+#include "region/append.h"
 #include "region/boxes.h"
 #include "region/patch.h"
+#include "region/survey.h"
 #include "region/sweep.h"
 
 #include <algorithm>
+#include <optional>
 
 namespace quillon {
 namespace {
@@ -19,9 +22,55 @@ static_assert(sizeof(RasterRectList) == 256);
 
 constexpr int kBugNegativeSize = 15740;
 
-// Whether a list that is not empty has one entry and is in normal form.
-bool isSingle(const RasterRectList &list) {
-    return list.entries[1].width == 0 && isZeroFrom(list, 1) && !isEmpty(boxOf(list.entries[0]));
+// ---- Short paths --------------------------------------------------------------
+
+bool coversAll(const Rect &rect, const RasterRectList &list) {
+    for (int i = 0; i < kSlots && list.entries[i].width >= 1; ++i) {
+        if (!covers(rect, boxOf(list.entries[i])))
+            return false;
+    }
+    return true;
+}
+
+// Whether a coordinate is one of those from start on, of which there are so many.
+inline bool holds(int32_t start, int32_t extent, int32_t coordinate) {
+    return static_cast<uint32_t>(wrappingSubtract(coordinate, start)) <
+           static_cast<uint32_t>(extent);
+}
+
+// Whether an entry of a list in normal form covers the rectangle.
+inline bool isInside(const Rect &rect, const RasterRectList &list) {
+    // The slot behind the last entry is zero.
+    for (const RasterRectListEntry *entry = list.entries; entry->width >= 1; ++entry) {
+        if (entry->y > rect.top)
+            return false;
+        // Few entries share a column with the left edge.
+        if (holds(entry->x, entry->width, rect.left) && covers(boxOf(*entry), rect))
+            return true;
+    }
+    return false;
+}
+
+// ---- Long paths ---------------------------------------------------------------
+
+// Those of an addition take what the entry takes, which is still in its registers.
+// None is inlined: the entry then needs no stack for the short paths.
+
+[[gnu::noinline]] uint32_t storeFirst(RasterRectList &list, int32_t x, int32_t y, int32_t width,
+                                      int32_t height) {
+    list.entries[0] = {.x = x, .y = y, .width = width, .height = height};
+    return areaOf(list.entries[0]);
+}
+
+// Adds a rectangle that covers the first entry.  True where it covers all; these are
+// replaced then.
+[[gnu::noinline]] bool addOverAll(RasterRectList &list, int32_t x, int32_t y, int32_t width,
+                                  int32_t height) {
+    if (!coversAll(boxOf(x, y, width, height), list))
+        return false;
+    clear(list);
+    storeFirst(list, x, y, width, height);
+    return true;
 }
 
 ListBoxes boxesOf(const RasterRectList &list) {
@@ -53,26 +102,32 @@ uint32_t storeBoundingBox(RasterRectList &list, const ListBoxes &boxes) {
     return storeAll(list, single);
 }
 
-// What a patch cannot do.  Kept out of the entries, whose short paths then need no
-// stack.
-[[gnu::noinline]] uint32_t addWithoutPatch(RasterRectList &list, const Rect &rect,
-                                           PatchOutcome outcome) {
+// A list that is not in normal form, or a rectangle that wraps.
+[[gnu::noinline]] uint32_t addBySweep(RasterRectList &list, int32_t x, int32_t y, int32_t width,
+                                      int32_t height) {
     ListBoxes boxes = boxesOf(list);
-    boxes.append(rect);
+    boxes.append(boxOf(x, y, width, height));
     ListBoxes result;
-    if (outcome == PatchOutcome::kNeedsSweep && sweepBoxes(boxes, nullptr, result))
-        return storeAll(list, result);
-    return storeBoundingBox(list, boxes);
+    return sweepBoxes(boxes, nullptr, result) ? storeAll(list, result)
+                                              : storeBoundingBox(list, boxes);
 }
 
 // A result that does not fit leaves the list as it is.
-[[gnu::noinline]] uint32_t cutWithoutPatch(RasterRectList &list, const Rect &cut,
-                                           PatchOutcome outcome) {
+[[gnu::noinline]] uint32_t cutBySweep(RasterRectList &list, const Rect &cut) {
     ListBoxes result;
-    if (outcome == PatchOutcome::kNeedsSweep &&
-        sweepBoxes(boxesOf(list), isEmpty(cut) ? nullptr : &cut, result))
-        return storeAll(list, result);
-    return 0;
+    return sweepBoxes(boxesOf(list), isEmpty(cut) ? nullptr : &cut, result) ? storeAll(list, result)
+                                                                            : 0;
+}
+
+[[gnu::noinline]] uint32_t addAnywhere(RasterRectList &list, int32_t x, int32_t y, int32_t width,
+                                       int32_t height, int count, uint32_t area) {
+    const Rect rect = boxOf(x, y, width, height);
+    const PatchResult patched = addByPatch(list, count, area, rect);
+    if (patched.isDone)
+        return patched.area;
+    ListBoxes boxes = boxesOf(list);
+    boxes.append(rect);
+    return storeBoundingBox(list, boxes);
 }
 
 } // namespace
@@ -91,17 +146,22 @@ uint32_t Raster_AddRect(RasterRectList *list, int32_t x, int32_t y, int32_t widt
         panicVerifyBug(kUnitRasterRect, kBugNegativeSize);
         return 0;
     }
-    if (isEmptyList(*list)) {
-        list->entries[0] = {.x = x, .y = y, .width = width, .height = height};
-        return areaOf(list->entries[0]);
-    }
+    if (isEmptyList(*list))
+        return storeFirst(*list, x, y, width, height);
 
     const Rect rect = boxOf(x, y, width, height);
-    if (covers(boxOf(list->entries[0]), rect) && isSingle(*list))
-        return areaOf(list->entries[0]);
-    const PatchResult patched = addByPatch(*list, x, y, width, height);
-    return patched.outcome == PatchOutcome::kDone ? patched.area
-                                                  : addWithoutPatch(*list, rect, patched.outcome);
+    if (isEmpty(rect))
+        return addBySweep(*list, x, y, width, height);
+    if (covers(rect, boxOf(list->entries[0])) && addOverAll(*list, x, y, width, height))
+        return areaOf(rect);
+    const Survey survey = surveyList(*list);
+    if (survey.count == 0)
+        return addBySweep(*list, x, y, width, height);
+    if (const std::optional<uint32_t> area = append(*list, survey, rect))
+        return *area;
+    if (isInside(rect, *list))
+        return survey.area;
+    return addAnywhere(*list, x, y, width, height, survey.count, survey.area);
 }
 
 uint32_t Raster_SubRect(RasterRectList *list, int32_t x, int32_t y, int32_t width, int32_t height) {
@@ -109,9 +169,12 @@ uint32_t Raster_SubRect(RasterRectList *list, int32_t x, int32_t y, int32_t widt
         return 0;
 
     const Rect cut = boxOf(x, y, std::max(width, 0), std::max(height, 0));
-    if (!overlap(boxOf(list->entries[0]), cut) && isSingle(*list))
-        return areaOf(list->entries[0]);
-    const PatchResult patched = cutByPatch(*list, cut);
-    return patched.outcome == PatchOutcome::kDone ? patched.area
-                                                  : cutWithoutPatch(*list, cut, patched.outcome);
+    if (coversAll(cut, *list)) {
+        clear(*list);
+        return 0;
+    }
+    const Survey survey = surveyList(*list);
+    if (survey.count == 0)
+        return cutBySweep(*list, cut);
+    return isEmpty(cut) ? survey.area : cutByPatch(*list, survey.count, survey.area, cut).area;
 }

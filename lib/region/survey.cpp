@@ -1,53 +1,71 @@
 #include "region/survey.h"
 
+#include <algorithm>
+
 namespace quillon {
 namespace {
 
-// Finds the boxes near the rectangle.  Gives false when the list is not in normal
-// form, in which every box stands behind those before it in order, overlaps none of
-// them, touches none in a row, and continues none downward.
-bool findNear(Survey &survey, const Rect &rect) {
-    const ListBoxes &list = survey.list;
-    int row = 0;   // the first box with the top of the current one
-    int alive = 0; // the boxes before this one end above that top
-    for (int i = 0; i < list.count; ++i) {
-        const Rect box = list.boxes[i];
-        if (isEmpty(box))
-            return false;
-        if (i > 0 && box.top == list.boxes[i - 1].top) {
-            if (box.left <= list.boxes[i - 1].right)
-                return false;
-        } else if (i > 0) {
-            if (box.top < list.boxes[i - 1].top)
-                return false;
-            row = i;
-            while (alive < row && list.boxes[alive].bottom < box.top)
-                ++alive;
-        }
-        for (int k = alive; k < row; ++k) {
-            const Rect &above = list.boxes[k];
-            if (above.bottom < box.top || above.right < box.left || box.right < above.left)
-                continue;
-            if (above.bottom > box.top || haveSameColumns(above, box))
-                return false;
-        }
-        if (box.top <= rect.bottom && rect.top <= box.bottom && box.left <= rect.right &&
-            rect.left <= box.right)
-            survey.near[survey.nearCount++] = i;
+using Entry = RasterRectListEntry;
+
+// Whether one of the entries, which begin above the box, overlaps it, touches it in a
+// row, or is continued by it.
+inline bool isDisturbed(const Rect &box, const Entry *first, const Entry *end) {
+    for (const Entry *entry = first; entry != end; ++entry) {
+        const int32_t bottom = bottomOf(*entry);
+        if (bottom < box.top)
+            continue;
+        const Rect above = boxOf(*entry);
+        if (bottom == box.top ? haveSameColumns(above, box)
+                              : above.left <= box.right && box.left <= above.right)
+            return true;
     }
-    return true;
+    return false;
 }
 
 } // namespace
 
-void surveyList(const RasterRectList &list, const Rect &rect, Survey &survey) {
-    int count = 0;
-    for (; count < kSlots && list.entries[count].width >= 1; ++count) {
-        survey.list.boxes[count] = boxOf(list.entries[count]);
-        survey.area += areaOf(list.entries[count]);
+Survey surveyList(const RasterRectList &list) {
+    constexpr Survey kNotNormal = {};
+    const Entry *entry = list.entries;
+    const Entry *row = entry;   // the first entry of the current row
+    const Entry *alive = entry; // those before it end above that row
+    Rect box = boxOf(*entry);
+    uint32_t area = areaOf(*entry);
+    int32_t bottom = box.bottom;
+    int32_t bottomAbove = kCoordinateMin;
+    // A list with all slots in use is not in normal form; any other one has an end.
+    if (isEmpty(box) || list.entries[kSlots - 1].width >= 1)
+        return kNotNormal;
+    while ((++entry)->width >= 1) {
+        const int32_t right = box.right;
+        box = boxOf(*entry);
+        area += areaOf(*entry);
+        if (isEmpty(box))
+            return kNotNormal;
+        if (box.top == row->y) {
+            if (box.left <= right)
+                return kNotNormal;
+        } else {
+            if (box.top < row->y)
+                return kNotNormal;
+            bottomAbove = bottom;
+            row = entry;
+            if (box.top > bottom) {
+                alive = entry;
+            } else {
+                // One of them reaches down to the row.
+                while (bottomOf(*alive) < box.top)
+                    ++alive;
+            }
+        }
+        if (alive != row && isDisturbed(box, alive, row))
+            return kNotNormal;
+        bottom = std::max(bottom, box.bottom);
     }
-    survey.list.count = count;
-    survey.isNormal = count < kSlots && findNear(survey, rect) && isZeroFrom(list, count);
+    const int count = static_cast<int>(entry - list.entries);
+    if (!isZeroFrom(list, count))
+        return kNotNormal;
+    return {.count = count, .area = area, .bottom = bottom, .bottomAbove = bottomAbove};
 }
 
 } // namespace quillon

@@ -1,32 +1,22 @@
-// A list as a patch finds it.
+// What holds for a list as a whole, before it is changed.
 #pragma once
 
 #include "region/boxes.h"
 
 namespace quillon {
 
+// A row of entries is a run of entries with the same top.  This is small enough to be
+// handed around in registers.
 struct Survey {
-    ListBoxes list;
-    uint32_t area = 0;
-    bool isNormal = true; // the list is in normal form
-    int nearCount = 0;
-    int near[kSlots]; // the indices of the entries near the rectangle, ascending
-
-    const Rect &nearBox(int i) const { return list.boxes[near[i]]; }
-
-    template <class Predicate>
-    void keepNear(Predicate isWanted) {
-        int kept = 0;
-        for (int i = 0; i < nearCount; ++i) {
-            if (isWanted(nearBox(i)))
-                near[kept++] = near[i];
-        }
-        nearCount = kept;
-    }
+    int count;           // of the entries; 0: the list is not in normal form
+    uint32_t area;       // of all
+    int32_t bottom;      // of the lowest entry
+    int32_t bottomAbove; // of the lowest entry above the last row of entries
 };
 
-// Fills in a new survey: the boxes of the list, and those that overlap or touch the
-// rectangle, corners included.  The latter are complete in lists in normal form.
-void surveyList(const RasterRectList &list, const Rect &rect, Survey &survey);
+// Surveys a list that is not empty.  In normal form every entry stands behind those
+// before it in order, overlaps none of them, touches none in a row, and continues none
+// downward; the slots behind the last entry are zero.
+Survey surveyList(const RasterRectList &list);
 
 } // namespace quillon
