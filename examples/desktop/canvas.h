@@ -19,10 +19,10 @@ public:
         for (const Rect &edge : edges(rect, thickness))
             fill(edge, color);
     }
-    // The same in the opposite of the colours there; twice leaves them as they were.
+    // The same in other colours than those there; done again, those come back.
     void invertFrame(const Rect &rect, int32_t thickness) {
         for (const Rect &edge : edges(rect, thickness))
-            part_.combine(onPart(edge), 0x00FFFFFF, quillon::Rop::kXor);
+            part_.combine(onPart(edge), kInversion, quillon::Rop::kXor);
     }
     void copy(Point to, const ConstSurface &source) { part_.copy(onPart(to), source); }
     void blend(Point to, const ConstSurface &source) { part_.blend(onPart(to), source); }

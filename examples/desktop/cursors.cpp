@@ -32,13 +32,12 @@ Polygon turned(const Polygon &polygon, double degrees) {
     return result;
 }
 
-// Masks that turn the colours of the screen to their opposites, as all bits but the alpha
-// of the XOR mask are set.
-Cursor inverting(const std::vector<Rect> &strokes, Size size, Point hotSpot) {
+// Masks that keep the screen, but for strokes where they turn bits of its colours over.
+Cursor inverting(const std::vector<Rect> &strokes, uint32_t bits, Size size, Point hotSpot) {
     Image keep = created(size), invert = created(size);
     keep.fill(0xFFFFFFFF);
     for (const Rect &stroke : strokes)
-        invert.fill(stroke, 0x00FFFFFF);
+        invert.fill(stroke, bits);
     return taken(Cursor::withMasks(keep, invert, hotSpot));
 }
 
@@ -64,9 +63,9 @@ Cursors::Cursors() {
         shapes_.push_back(shaped(turned(kDouble, degrees), kSize, kMiddle));
     shapes_.push_back(
         inverting({{1, 0, 3, 2}, {6, 0, 3, 2}, {4, 1, 2, 16}, {1, 16, 3, 2}, {6, 16, 3, 2}},
-                  {10, 18}, {5, 9}));
+                  0x00FFFFFF, {10, 18}, {5, 9}));
     shapes_.push_back(inverting({{11, 0, 2, 9}, {11, 15, 2, 9}, {0, 11, 9, 2}, {15, 11, 9, 2}},
-                                {24, 24}, kMiddle));
+                                kInversion, {24, 24}, kMiddle));
 }
 
 void Cursors::nextSize() {

@@ -15,26 +15,28 @@ constexpr Size kSmallestWindow = {140, 90};
 } // namespace
 
 Desktop::Desktop(Settings settings) : settings_(std::move(settings)) {
-    int32_t x = 170;
+    int32_t next = 170;
     const auto launcher = [&](std::string_view label, Launch launch) {
-        launchers_.push_back({label, launch, {x, 3, textWidth(label) + 20, kBarHeight - 6}});
-        x = launchers_.back().rect.right + 6;
+        launchers_.push_back({label, launch, {next, 3, textWidth(label) + 20, kBarHeight - 6}});
+        next = launchers_.back().rect.right + 6;
     };
     launcher("Terminal", &Desktop::openTerminal);
     launcher("Picture", &Desktop::openViewer);
     launcher("Video", &Desktop::openVideo);
     resize(settings_.size);
     pointer_ = {screen_.width() / 2, screen_.height() / 2};
-    openVideo();
     openViewer();
+    openVideo();
     openTerminal();
     // Side by side, as far as there is room.
-    const int32_t width = screen_.width(), height = screen_.height();
-    const int32_t middle = width * 53 / 100, rows = height - kBarHeight;
-    const std::array<Rect, 3> places = {
-        Rect(middle - width / 12, kBarHeight + rows * 52 / 100, width * 42 / 100, rows * 42 / 100),
-        Rect(middle, kBarHeight + rows * 6 / 100, width * 43 / 100, rows * 50 / 100),
-        Rect(width * 4 / 100, kBarHeight + rows * 10 / 100, width * 45 / 100, rows * 62 / 100)};
+    const Rect room = Rect::fromEdges(0, kBarHeight, screen_.width(), screen_.height());
+    const auto place = [&](int32_t x, int32_t y, int32_t width, int32_t height) {
+        return Rect(room.width() * x / 100, room.top + room.height() * y / 100,
+                    room.width() * width / 100, room.height() * height / 100);
+    };
+    Rect film = place(57, 51, 0, 43);
+    film.right = film.left + (film.height() - kTitleHeight) * 16 / 9; // its proportions
+    const std::array<Rect, 3> places = {place(53, 6, 41, 50), film, place(3, 10, 47, 64)};
     for (size_t i = 0; i < places.size(); ++i)
         placeWindow(*windows_[i], places[i]);
     updateShape();

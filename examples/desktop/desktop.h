@@ -94,6 +94,7 @@ private:
 
     // Layers, from the lowest on.
     void drawWallpaper();
+    void damageContent(size_t index);
     void paintAll(Canvas canvas, bool isAnew) const;
     size_t lowestVisible(const Rect &rect) const;
     void paintBar(Canvas &canvas) const;

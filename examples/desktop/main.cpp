@@ -108,7 +108,7 @@ void drawScene(Desktop &desktop) {
     constexpr int kFrames = 240;
     for (int i = 0; i < kFrames; ++i)
         desktop.advance(0.04);
-    for (const char c : std::string_view("seq 3\necho hello"))
+    for (const char c : std::string_view("help\necho exact to the bit"))
         desktop.typed(c);
     const Image &screen = desktop.screen();
     desktop.movePointer({screen.width() * 42 / 100, screen.height() * 84 / 100});

@@ -1,26 +1,45 @@
 // How the desktop is painted.
 #include "desktop.h"
 
+#include <cmath>
+
 namespace desktop {
 
 namespace {
 
-// A few colours, doubled until they are as large as the screen: smoother than one
-// enlargement.
+// Spots of colour that run into each other, drawn small and enlarged.
 Image gradient(Size size) {
-    constexpr int32_t kColumns = 5, kRows = 4;
-    constexpr Color kColors[kRows][kColumns] = {
-        {0xFF1B2A4F, 0xFF2C3568, 0xFF4A3B78, 0xFF6B4480, 0xFF8A4F80},
-        {0xFF1F4568, 0xFF3A4A80, 0xFF6E5090, 0xFFB0618C, 0xFFDE8180},
-        {0xFF1E6E7E, 0xFF3F6A92, 0xFF7C689E, 0xFFD07C8C, 0xFFF2A97C},
-        {0xFF2C8C86, 0xFF3C7F98, 0xFF6674A2, 0xFFB07F98, 0xFFEDB48A}};
-    Image colors = created({kColumns, kRows});
-    for (int32_t row = 0; row < kRows; ++row)
-        for (int32_t column = 0; column < kColumns; ++column)
-            colors.fill({column, row, 1, 1}, kColors[row][column]);
-    while (2 * colors.width() < size.width && 2 * colors.height() < size.height)
-        colors = resized(colors, {2 * colors.width(), 2 * colors.height()});
-    return resized(colors, size);
+    struct Spot {
+        double x, y; // in a square of side 1
+        double red, green, blue;
+    };
+    constexpr std::array<Spot, 7> kSpots = {{{0.05, 0.10, 26, 42, 88},
+                                             {0.50, 0.00, 70, 58, 130},
+                                             {0.95, 0.15, 150, 84, 140},
+                                             {0.10, 0.95, 32, 128, 132},
+                                             {0.45, 0.60, 84, 92, 160},
+                                             {0.72, 0.92, 214, 128, 134},
+                                             {1.00, 0.75, 246, 172, 122}}};
+    constexpr int32_t kReduction = 8;
+    constexpr double kSharpness = 9;
+    Image small = created({size.width / kReduction + 1, size.height / kReduction + 1});
+    for (int32_t y = 0; y < small.height(); ++y)
+        for (int32_t x = 0; x < small.width(); ++x) {
+            double weights = 0, red = 0, green = 0, blue = 0;
+            for (const Spot &spot : kSpots) {
+                const double dx = (x + 0.5) / small.width() - spot.x;
+                const double dy = (y + 0.5) / small.height() - spot.y;
+                const double weight = std::exp(-kSharpness * (dx * dx + dy * dy));
+                weights += weight;
+                red += weight * spot.red;
+                green += weight * spot.green;
+                blue += weight * spot.blue;
+            }
+            small.fill({x, y, 1, 1},
+                       {static_cast<uint8_t>(red / weights), static_cast<uint8_t>(green / weights),
+                        static_cast<uint8_t>(blue / weights)});
+        }
+    return resized(small, size);
 }
 
 // The smallest rectangle of the proportions of a picture that covers the screen.
@@ -44,11 +63,8 @@ void Desktop::drawWallpaper() {
 }
 
 Region Desktop::paint() {
-    for (const auto &window : windows_) {
-        const Rect content = window->contentRect();
-        for (const Rect part : window->takeDamage())
-            damage(part.translated(content.corner()));
-    }
+    for (size_t i = 0; i < windows_.size(); ++i)
+        damageContent(i);
     Region painted = damage_;
     // Marks are painted over what has changed, and stay until something else does.
     if (!showsDamage_ || !damage_.isEmpty()) {
@@ -59,6 +75,19 @@ Region Desktop::paint() {
         paintAll(Canvas(screen_, part), false);
     damage_.clear();
     return painted;
+}
+
+// What has changed of a window's content, but for what the windows above it hide.
+void Desktop::damageContent(size_t index) {
+    const Point corner = windows_[index]->contentRect().corner();
+    Region visible;
+    for (const Rect part : windows_[index]->takeDamage())
+        visible.add(part.translated(corner));
+    for (size_t i = index + 1; i < windows_.size(); ++i)
+        if (!visible.subtract(windows_[i]->opaqueRect()))
+            break; // too many pieces: some more is painted than need be
+    for (const Rect part : visible)
+        damage(part);
 }
 
 Image Desktop::redrawn() const {

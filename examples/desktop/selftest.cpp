@@ -12,7 +12,9 @@ namespace {
 
 class RandomUser {
 public:
-    RandomUser(Desktop &desktop, uint32_t seed) : desktop_(desktop), random_(seed) {}
+    RandomUser(Desktop &desktop, uint32_t seed)
+        : desktop_(desktop), random_(seed), largest_{desktop.screen().width() * 3 / 2,
+                                                     desktop.screen().height() * 3 / 2} {}
 
     // Does something, and returns its name.
     const char *act() {
@@ -75,7 +77,7 @@ private:
     }
     void resizeScreen() {
         if (below(8) == 0)
-            desktop_.resize({between(64, 480), between(64, 400)});
+            desktop_.resize({between(64, largest_.width), between(64, largest_.height)});
     }
 
     static constexpr std::array<Action, 13> kActions = {{
@@ -96,6 +98,7 @@ private:
 
     Desktop &desktop_;
     std::mt19937 random_;
+    Size largest_;
     Point at_;
 };
 

@@ -17,6 +17,7 @@ class SystemWindow : public Output {
 public:
     explicit SystemWindow(Size size) {
         SDL_SetMainReady();
+        SDL_SetHint(SDL_HINT_FRAMEBUFFER_ACCELERATION, "0"); // plain memory is all it takes
         if (SDL_Init(SDL_INIT_VIDEO) != 0)
             fail("there is no display");
         window_ =

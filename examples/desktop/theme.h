@@ -33,6 +33,9 @@ inline constexpr Color kBackground = 0xFF14171E; // of what windows show
 inline constexpr Color kRed = 0xFFFF6B68, kGreen = 0xFF7FD88F, kYellow = 0xFFF5CF72;
 inline constexpr Color kViolet = 0xFFC79BFF;
 
+// What XOR takes to change a colour: half the range, as the opposite of grey is grey.
+inline constexpr uint32_t kInversion = 0x00808080;
+
 inline const quillon::Font kFont = {gallery::kFont,
                                     {kGlyphWidth, kGlyphHeight},
                                     gallery::kFirstGlyph,
