@@ -86,7 +86,7 @@ private:
     Rect cursorRect() const { return cursors_[shape_].bounds(pointer_); }
     void updateShape();
     void startDrag(Button button, const Hit &hit);
-    void continueDrag(Point to);
+    void continueDrag(Point from);
     void finishDrag();
     Rect draggedFrame() const;
     void setBand(const Rect &band);

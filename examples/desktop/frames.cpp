@@ -3,8 +3,8 @@
 #include <array>
 #include <cerrno>
 #include <cmath>
-#include <cstring>
 #include <stdexcept>
+#include <system_error>
 
 #include <fcntl.h>
 #include <poll.h>
@@ -34,6 +34,7 @@ public:
 
 private:
     static constexpr int32_t kWidth = 480, kHeight = 270, kLayers = 4;
+    static constexpr std::ptrdiff_t kPixels = std::ptrdiff_t{kWidth} * kHeight;
     static constexpr size_t index(int32_t number) { return static_cast<size_t>(number); }
     struct Yuv {
         double y, u, v;
@@ -41,7 +42,7 @@ private:
 
     bool next(std::vector<uint8_t> &frame) override {
         placeHills(static_cast<double>(number()));
-        uint8_t *y = frame.data(), *u = y + kWidth * kHeight, *v = u + kWidth * kHeight / 4;
+        uint8_t *y = frame.data(), *u = y + kPixels, *v = u + kPixels / 4;
         for (int32_t row = 0; row < kHeight; ++row)
             for (int32_t column = 0; column < kWidth; ++column) {
                 const Yuv pixel = at(column, row);
@@ -140,7 +141,7 @@ std::unique_ptr<FrameSource> openRawFrames(const std::string &fileName, Size siz
                                            double framesPerSecond) {
     const int file = fileName == "-" ? STDIN_FILENO : open(fileName.c_str(), O_RDONLY | O_CLOEXEC);
     if (file < 0)
-        throw std::runtime_error(fileName + ": " + std::strerror(errno));
+        throw std::runtime_error(fileName + ": " + std::generic_category().message(errno));
     return std::make_unique<RawFrames>(file, size, framesPerSecond);
 }
 

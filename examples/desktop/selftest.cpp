@@ -106,7 +106,8 @@ private:
 std::optional<Point> firstDifference(const Image &a, const Image &b) {
     for (int32_t y = 0; y < a.height(); ++y)
         for (int32_t x = 0; x < a.width(); ++x)
-            if (std::memcmp(a.row(y) + 4 * x, b.row(y) + 4 * x, 4) != 0)
+            if (std::memcmp(a.row(y) + std::ptrdiff_t{4} * x, b.row(y) + std::ptrdiff_t{4} * x,
+                            4) != 0)
                 return Point(x, y);
     return std::nullopt;
 }

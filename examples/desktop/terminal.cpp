@@ -58,12 +58,10 @@ void Terminal::execute(const std::string &command) {
         print({{"  video", kViolet}, {"    YUV, scaled, through a colour key"}});
         print({{"  damage", kViolet}, {"   lists of rectangles (F2 shows them)"}});
     } else if (name == "colors") {
-        print({{"#### ", kRed},
-               {"#### ", kYellow},
-               {"#### ", kGreen},
-               {"#### ", kAccent},
-               {"#### ", kViolet},
-               {"####", kFadedInk}});
+        Line line;
+        for (const Color color : {kRed, kYellow, kGreen, kAccent, kViolet, kFadedInk})
+            line.push_back({"     ", kInk, color});
+        print(std::move(line));
     } else if (name == "echo") {
         print({{argument}});
     } else if (name == "seq") {
@@ -129,7 +127,7 @@ void Terminal::drawRow(Surface &content, int32_t row) const {
     const bool isInput = index == lineCount() - 1;
     Point at(0, (kLineHeight - kGlyphHeight) / 2 + 1);
     for (const Span &span : isInput ? inputLine() : lines_[static_cast<size_t>(index)]) {
-        part.text(at, kFont, span.text, span.color, kBackground);
+        part.text(at, kFont, span.text, span.color, span.background);
         at.x += textWidth(span.text);
     }
     if (isInput)

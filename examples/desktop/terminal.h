@@ -22,10 +22,11 @@ protected:
     void drawAll(Layers &layers) const override;
 
 private:
-    // A piece of a line in one colour.
+    // A piece of a line.
     struct Span {
         std::string text;
         Color color = kInk;
+        Color background = kBackground;
     };
     using Line = std::vector<Span>;
 
