@@ -9,11 +9,11 @@
 
 namespace quillon {
 
-// The first of so many entries that the box would continue downward, or null.
-inline RasterRectListEntry *entryAbove(RasterRectListEntry *entry, int count, const Rect &box) {
+// The first of so many entries that the given one would continue downward, or null.
+inline RasterRectListEntry *entryAbove(RasterRectListEntry *entry, int count,
+                                       const RasterRectListEntry &below) {
     for (; count > 0; --count, ++entry) {
-        if (entry->x == box.left && wrappingAdd(entry->x, entry->width) == box.right &&
-            bottomOf(*entry) == box.top)
+        if (entry->x == below.x && entry->width == below.width && bottomOf(*entry) == below.y)
             return entry;
     }
     return nullptr;
@@ -24,38 +24,39 @@ inline RasterRectListEntry *entryAbove(RasterRectListEntry *entry, int count, co
 // the last one, or continues another one downward.  Gives the area of the list, or
 // nothing, with the list unchanged: for any other rectangle, and where there is no slot.
 [[gnu::always_inline]] inline std::optional<uint32_t>
-append(RasterRectList &list, const Survey &survey, const Rect &rect) {
+append(RasterRectList &list, const Survey &survey, RasterRectListEntry added) {
     int slot = survey.count;
     int32_t reach = survey.bottom; // of the entries above
-    Rect box = rect;
-    if (rect.top < survey.bottom) {
-        const Rect last = boxOf(list.entries[slot - 1]);
-        if (rect.top != last.top || rect.left < last.left || rect.top < survey.bottomAbove)
+    if (added.y < reach) {
+        const RasterRectListEntry &last = list.entries[slot - 1];
+        if (added.y != last.y || added.x < last.x || added.y < survey.bottomAbove)
             return {};
         reach = survey.bottomAbove;
-        if (rect.left <= last.right) {
-            if (rect.bottom != last.bottom)
+        const int32_t lastRight = wrappingAdd(last.x, last.width);
+        if (added.x <= lastRight) {
+            const int32_t right = std::max(lastRight, wrappingAdd(added.x, added.width));
+            added.x = last.x;
+            added.width = wrappingSubtract(right, last.x);
+            if (added.height != last.height || added.width < 1)
                 return {};
             --slot;
-            box.left = last.left;
-            box.right = std::max(rect.right, last.right);
         }
     }
-    if (slot == kMaxEntries || !isStorable(box))
-        return {};
-    // The slot behind the entries is zero.
-    const uint32_t area = survey.area - areaOf(list.entries[slot]) + areaOf(box);
-    if (box.top == reach) {
-        if (RasterRectListEntry *const above = entryAbove(list.entries, slot, box)) {
-            box.top = above->y;
-            if (!isStorable(box))
+    // The slot behind the last entry is zero.
+    const uint32_t area = survey.area - areaOf(list.entries[slot]) + areaOf(added);
+    if (added.y == reach) {
+        if (RasterRectListEntry *const above = entryAbove(list.entries, slot, added)) {
+            const int32_t height = wrappingAdd(above->height, added.height);
+            if (height < 1)
                 return {};
+            above->height = height;
             list.entries[slot] = {};
-            *above = entryOf(box);
             return area;
         }
     }
-    list.entries[slot] = entryOf(box);
+    if (slot == kMaxEntries)
+        return {};
+    list.entries[slot] = added;
     return area;
 }
 

@@ -117,12 +117,14 @@ inline bool isZeroFrom(const RasterRectList &list, int slot) {
         std::memcpy(&entry, &list.entries[i], sizeof(entry));
         bits |= entry;
     };
-    for (; slot % 4 != 0; ++slot)
-        combine(slot);
-    for (; slot < kSlots; slot += 4) {
+    int group = kSlots - 4;
+#pragma GCC unroll 4
+    for (; group >= slot; group -= 4) {
         for (int i = 0; i < 4; ++i)
-            combine(slot + i);
+            combine(group + i);
     }
+    for (; slot < group + 4; ++slot)
+        combine(slot);
     return (bits[0] | bits[1]) == 0;
 }
 

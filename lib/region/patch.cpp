@@ -20,10 +20,14 @@ struct NearBoxes {
 template <class Predicate>
 void findNear(const RasterRectList &list, int count, const Rect &rect, Predicate isWanted,
               NearBoxes &near) {
-    for (int i = 0; i < count && list.entries[i].y <= rect.bottom; ++i) {
-        const Rect box = boxOf(list.entries[i]);
-        if (box.bottom < rect.top || box.right < rect.left || rect.right < box.left ||
-            !isWanted(box))
+    for (int i = 0; i < count; ++i) {
+        const RasterRectListEntry &entry = list.entries[i];
+        if (entry.y > rect.bottom)
+            return;
+        if (entry.x > rect.right || wrappingAdd(entry.x, entry.width) < rect.left)
+            continue;
+        const Rect box = boxOf(entry);
+        if (box.bottom < rect.top || !isWanted(box))
             continue;
         near.indices[near.count] = i;
         near.boxes[near.count++] = box;
@@ -142,6 +146,17 @@ void makeCutPieces(const NearBoxes &near, const Rect &cut, Pieces &pieces) {
 
 // ---- Their way into the list ------------------------------------------------
 
+// Inserts a rectangle that is near none of the entries.
+PatchResult insert(RasterRectList &list, int count, uint32_t area, const Rect &rect) {
+    if (count == kMaxEntries)
+        return {false, 0};
+    RasterRectListEntry *place = list.entries + count;
+    for (; place != list.entries && !isBefore(place[-1], rect); --place)
+        *place = place[-1];
+    *place = entryOf(rect);
+    return {true, area + areaOf(rect)};
+}
+
 // No piece is empty, but one may be too large.
 bool areStorable(const Pieces &pieces) {
     int32_t signs = 0;
@@ -151,47 +166,56 @@ bool areStorable(const Pieces &pieces) {
     return signs >= 0;
 }
 
-// Gives the area of what is removed.
-uint32_t removeNear(RasterRectList &list, int count, const NearBoxes &near) {
-    uint32_t area = 0;
-    for (const Rect &box : near)
-        area += areaOf(box);
-    int next = 0;
-    int to = near.count > 0 ? near.indices[0] : count;
-    for (int from = to; from < count; ++from) {
-        if (next < near.count && near.indices[next] == from)
-            ++next;
-        else
-            list.entries[to++] = list.entries[from];
+// The first entry that changes: the first near one, unless a piece stands before it.
+int firstChange(const RasterRectList &list, int count, const NearBoxes &near,
+                const Pieces &pieces) {
+    int first = near.count > 0 ? near.indices[0] : count;
+    if (pieces.count > 0) {
+        while (first > 0 && !isBefore(list.entries[first - 1], pieces.boxes[0]))
+            --first;
     }
-    return area;
+    return first;
 }
 
-// Gives the area of what is inserted.  From the last entry on, so that entries before
-// the first piece are not visited.
-uint32_t insertPieces(RasterRectList &list, int count, const Pieces &pieces) {
-    uint32_t area = 0;
-    RasterRectListEntry *last = list.entries + count - 1;
-    for (int i = pieces.count - 1; i >= 0; --i) {
-        const Rect &piece = pieces.boxes[i];
-        for (; last >= list.entries && !isBefore(*last, piece); --last)
-            last[i + 1] = *last;
-        last[i + 1] = entryOf(piece);
-        area += areaOf(piece);
+// Moves the entries from one slot on to another one.
+void moveTail(RasterRectList &list, int count, int from, int to) {
+    RasterRectListEntry *const entries = list.entries;
+    if (to > from) {
+        for (int i = count - 1; i >= from; --i)
+            entries[i + to - from] = entries[i];
+    } else if (to < from) {
+        while (from < count)
+            entries[to++] = entries[from++];
+        while (to < count)
+            entries[to++] = {};
     }
-    return area;
 }
 
 PatchResult replaceIfFits(RasterRectList &list, int count, uint32_t area, const NearBoxes &near,
                           const Pieces &pieces) {
-    const int kept = count - near.count;
-    const int newCount = kept + pieces.count;
-    if (newCount > kMaxEntries || !areStorable(pieces))
+    if (count - near.count + pieces.count > kMaxEntries || !areStorable(pieces))
         return {false, 0};
-    area -= removeNear(list, count, near);
-    area += insertPieces(list, kept, pieces);
-    for (int i = newCount; i < count; ++i)
-        list.entries[i] = {};
+    // The pieces, and the entries that stay between them, in order.
+    RasterRectListEntry changed[kMaxEntries];
+    int changedCount = 0;
+    const int first = firstChange(list, count, near, pieces);
+    int from = first;
+    int piece = 0;
+    for (int next = 0; next < near.count || piece < pieces.count;) {
+        if (next < near.count && near.indices[next] == from) {
+            area -= areaOf(list.entries[from++]);
+            ++next;
+        } else if (piece < pieces.count &&
+                   (from == count || !isBefore(list.entries[from], pieces.boxes[piece]))) {
+            area += areaOf(pieces.boxes[piece]);
+            changed[changedCount++] = entryOf(pieces.boxes[piece++]);
+        } else {
+            changed[changedCount++] = list.entries[from++];
+        }
+    }
+    moveTail(list, count, from, first + changedCount);
+    for (int i = 0; i < changedCount; ++i)
+        list.entries[first + i] = changed[i];
     return {true, area};
 }
 
@@ -207,8 +231,8 @@ PatchResult addByPatch(RasterRectList &list, int count, uint32_t area, const Rec
             return shareRows(box, rect) || (box.left <= rect.left && rect.right <= box.right);
         },
         near);
-    if (std::any_of(near.begin(), near.end(), [&](const Rect &box) { return covers(box, rect); }))
-        return {true, area};
+    if (near.count == 0)
+        return insert(list, count, area, rect);
     Pieces pieces;
     makeAddedPieces(near, rect, pieces);
     return replaceIfFits(list, count, area, near, pieces);

@@ -17,8 +17,8 @@ struct PatchResult {
     uint32_t area; // of the changed list
 };
 
-// These change a list in normal form of so many entries and pixels, or leave it as it is when they
-// cannot.  The added rectangle is not empty.
+// These change a list in normal form, of so many entries and pixels, or leave it as it
+// is when they cannot.  The added rectangle is not empty, and lies inside no entry.
 PatchResult addByPatch(RasterRectList &list, int count, uint32_t area, const Rect &rect);
 PatchResult cutByPatch(RasterRectList &list, int count, uint32_t area, const Rect &cut);
 

@@ -2,7 +2,8 @@
 //
 // A list in normal form, as every list that comes from here, is changed by a patch,
 // which replaces the entries near the rectangle.  Any other list, filled by hand,
-// is brought to normal form by a sweep.
+// is brought to normal form by a sweep.  The additions that hosts make most are done
+// without either: behind all entries, inside one, or over all of them.
 #include <quillon/raster.h>
 
 #include "core/failure.h"
@@ -53,8 +54,8 @@ inline bool isInside(const Rect &rect, const RasterRectList &list) {
 
 // ---- Long paths ---------------------------------------------------------------
 
-// Those of an addition take what the entry takes, which is still in its registers.
-// None is inlined: the entry then needs no stack for the short paths.
+// Those of an addition take the arguments of the exported function, which are still in
+// its registers, and are not inlined: its short paths then need no stack.
 
 [[gnu::noinline]] uint32_t storeFirst(RasterRectList &list, int32_t x, int32_t y, int32_t width,
                                       int32_t height) {
@@ -152,12 +153,14 @@ uint32_t Raster_AddRect(RasterRectList *list, int32_t x, int32_t y, int32_t widt
     const Rect rect = boxOf(x, y, width, height);
     if (isEmpty(rect))
         return addBySweep(*list, x, y, width, height);
-    if (covers(rect, boxOf(list->entries[0])) && addOverAll(*list, x, y, width, height))
+    if (y <= list->entries[0].y && width >= list->entries[0].width &&
+        addOverAll(*list, x, y, width, height))
         return areaOf(rect);
     const Survey survey = surveyList(*list);
     if (survey.count == 0)
         return addBySweep(*list, x, y, width, height);
-    if (const std::optional<uint32_t> area = append(*list, survey, rect))
+    if (const std::optional<uint32_t> area =
+            append(*list, survey, {.x = x, .y = y, .width = width, .height = height}))
         return *area;
     if (isInside(rect, *list))
         return survey.area;

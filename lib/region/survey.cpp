@@ -7,16 +7,25 @@ namespace {
 
 using Entry = RasterRectListEntry;
 
-// Whether one of the entries, which begin above the box, overlaps it, touches it in a
-// row, or is continued by it.
-inline bool isDisturbed(const Rect &box, const Entry *first, const Entry *end) {
-    for (const Entry *entry = first; entry != end; ++entry) {
-        const int32_t bottom = bottomOf(*entry);
-        if (bottom < box.top)
-            continue;
-        const Rect above = boxOf(*entry);
-        if (bottom == box.top ? haveSameColumns(above, box)
-                              : above.left <= box.right && box.left <= above.right)
+// Whether one of the entries, which end right above the box or higher, is continued by
+// it.
+inline bool continuesOne(const Entry &entry, const Entry *first, const Entry *end) {
+    for (const Entry *above = first; above != end; ++above) {
+        if (above->x == entry.x && above->width == entry.width && bottomOf(*above) == entry.y)
+            return true;
+    }
+    return false;
+}
+
+// Whether one of the entries, which begin above this one, overlaps it, touches it in a
+// row, or is continued by it.  Not inlined: the loop of a survey needs all registers.
+[[gnu::noinline]] bool isDisturbed(const Entry &entry, const Entry *first, const Entry *end) {
+    const Rect box = boxOf(entry);
+    for (const Entry *other = first; other != end; ++other) {
+        const Rect above = boxOf(*other);
+        if (above.bottom == box.top
+                ? haveSameColumns(above, box)
+                : above.bottom > box.top && above.left <= box.right && box.left <= above.right)
             return true;
     }
     return false;
@@ -42,23 +51,31 @@ Survey surveyList(const RasterRectList &list) {
         area += areaOf(*entry);
         if (isEmpty(box))
             return kNotNormal;
+        if (box.top > bottom) {
+            row = entry;
+            alive = entry;
+            bottomAbove = bottom;
+            bottom = box.bottom;
+            continue;
+        }
         if (box.top == row->y) {
             if (box.left <= right)
                 return kNotNormal;
         } else {
             if (box.top < row->y)
                 return kNotNormal;
-            bottomAbove = bottom;
-            row = entry;
-            if (box.top > bottom) {
-                alive = entry;
+            if (bottomAbove <= row->y) {
+                alive = row;
             } else {
                 // One of them reaches down to the row.
                 while (bottomOf(*alive) < box.top)
                     ++alive;
             }
+            bottomAbove = bottom;
+            row = entry;
         }
-        if (alive != row && isDisturbed(box, alive, row))
+        if (alive != row && (bottomAbove <= box.top ? continuesOne(*entry, alive, row)
+                                                    : isDisturbed(*entry, alive, row)))
             return kNotNormal;
         bottom = std::max(bottom, box.bottom);
     }
