@@ -44,6 +44,8 @@ TEST(RectList, refusesWhatHasNoSize) {
                   uint32_t(INT32_MAX));
         EXPECT_EQ(apply(Raster_SubRect, list, turned({INT32_MAX - 5, 0, 10, 10})),
                   uint32_t(INT32_MAX));
+        RasterRectList wrapped = {{turned({INT32_MAX - 5, 0, 10, 10})}};
+        EXPECT_EQ(apply(Raster_AddRect, wrapped, {0, 0, 5, 5}), 25u);
         for (const Entry &e : {Entry{0, 0, -1, 5}, Entry{0, 0, 5, INT32_MIN}, Entry{0, 0, -1, -1}})
             expectPanic(
                 "VERIFY lib/raster/rasterRect", [&] { apply(Raster_AddRect, list, turned(e)); },
@@ -54,11 +56,31 @@ TEST(RectList, refusesWhatHasNoSize) {
     }
 }
 
+// Whatever stands behind the end is cleared, in any slot.
+TEST(RectList, clearsWhatIsBehindTheEnd) {
+    RasterRectList normal = {};
+    for (int count = 0; count < 15; ++count) {
+        apply(Raster_AddRect, normal, {20 * count, 20 * count, 10, 10});
+        for (int slot = count + 1; slot < 16; ++slot) {
+            for (const auto field : {&Entry::x, &Entry::y, &Entry::height}) {
+                RasterRectList list = normal;
+                list.entries[slot].*field = 1;
+                apply(Raster_SubRect, list, {0, 0, -1, -1});
+                EXPECT_EQ(list, normal);
+            }
+        }
+    }
+}
+
 TEST(RectList, sixteenSpansInARow) {
     RasterRectList columns;
     for (int i = 0; i < 16; ++i)
         columns.entries[i] = {10 * i, 0, 5, 20};
-    RasterRectList list = columns;
+    struct {
+        RasterRectList list;
+        Entry end = {}; // of whoever reads on behind the list
+    } memory = {columns};
+    RasterRectList &list = memory.list;
     // From the first row on, the split finds no free span.
     expectPanic("VERIFY lib/raster/rasterRect", [&] {
         apply(Raster_SubRect, list, {1, -5, 2, 10});
