@@ -61,29 +61,23 @@ inline Rect *pieceAbove(Pieces &pieces, const Rect &box) {
 // Appends the pieces in the rows of an added rectangle, in each of which it is one
 // span with all the near ones.  Gives the piece of the last rows.
 Rect *appendJoinedRows(const NearBoxes &near, const Rect &rect, Pieces &pieces) {
-    // The boxes that extend the rectangle to the left or right, by ascending top.
-    Boxes<kSlots> wide;
-    for (const Rect &box : near) {
-        if (shareRows(box, rect) && (box.left < rect.left || box.right > rect.right))
-            wide.append(box);
-    }
-    const Rect *alive = wide.begin();
+    const Rect *alive = near.begin();
     Rect *piece = nullptr;
     for (int32_t y = rect.top; y < rect.bottom;) {
-        while (alive != wide.end() && alive->bottom <= y)
+        while (alive != near.end() && alive->bottom <= y)
             ++alive;
         // Edges as separate variables: a box written field by field and then read
         // as a whole waits until the stores have reached the cache.
         int32_t left = rect.left, right = rect.right, bottom = rect.bottom;
         const Rect *box = alive;
-        for (; box != wide.end() && box->top <= y; ++box) {
+        for (; box != near.end() && box->top <= y; ++box) {
             if (box->bottom <= y)
                 continue;
             bottom = std::min(bottom, box->bottom);
             left = std::min(left, box->left);
             right = std::max(right, box->right);
         }
-        if (box != wide.end())
+        if (box != near.end())
             bottom = std::min(bottom, box->top);
         const Rect band = {.left = left, .top = y, .right = right, .bottom = bottom};
         // The first band can continue any piece above, the others only the band
