@@ -160,56 +160,47 @@ bool areStorable(const Pieces &pieces) {
     return signs >= 0;
 }
 
-// The first entry that changes: the first near one, unless a piece stands before it.
-int firstChange(const RasterRectList &list, int count, const NearBoxes &near,
-                const Pieces &pieces) {
-    int first = near.count > 0 ? near.indices[0] : count;
-    if (pieces.count > 0) {
-        while (first > 0 && !isBefore(list.entries[first - 1], pieces.boxes[0]))
-            --first;
+// Gives the area of what is removed.
+uint32_t removeNear(RasterRectList &list, int count, const NearBoxes &near) {
+    uint32_t area = 0;
+    for (const Rect &box : near)
+        area += areaOf(box);
+    int to = near.indices[0];
+    for (int from = to, next = 0; from < count; ++from) {
+        if (next < near.count && near.indices[next] == from)
+            ++next;
+        else
+            list.entries[to++] = list.entries[from];
     }
-    return first;
+    return area;
 }
 
-// Moves the entries from one slot on to another one.
-void moveTail(RasterRectList &list, int count, int from, int to) {
-    RasterRectListEntry *const entries = list.entries;
-    if (to > from) {
-        for (int i = count - 1; i >= from; --i)
-            entries[i + to - from] = entries[i];
-    } else if (to < from) {
-        while (from < count)
-            entries[to++] = entries[from++];
-        while (to < count)
-            entries[to++] = {};
+// Gives the area of what is inserted.  From the last piece on, so that every entry is
+// moved once, and those before the first piece not at all.
+uint32_t insertPieces(RasterRectList &list, int count, const Pieces &pieces) {
+    uint32_t area = 0;
+    int from = count - 1;
+    for (int i = pieces.count - 1; i >= 0; --i) {
+        const Rect &piece = pieces.boxes[i];
+        for (; from >= 0 && !isBefore(list.entries[from], piece); --from)
+            list.entries[from + i + 1] = list.entries[from];
+        list.entries[from + i + 1] = entryOf(piece);
+        area += areaOf(piece);
     }
+    return area;
 }
 
+// There is at least one near box.
 PatchResult replaceIfFits(RasterRectList &list, int count, uint32_t area, const NearBoxes &near,
                           const Pieces &pieces) {
-    if (count - near.count + pieces.count > kMaxEntries || !areStorable(pieces))
+    const int kept = count - near.count;
+    const int newCount = kept + pieces.count;
+    if (newCount > kMaxEntries || !areStorable(pieces))
         return {false, 0};
-    // The pieces, and the entries that stay between them, in order.
-    RasterRectListEntry changed[kMaxEntries];
-    int changedCount = 0;
-    const int first = firstChange(list, count, near, pieces);
-    int from = first;
-    int piece = 0;
-    for (int next = 0; next < near.count || piece < pieces.count;) {
-        if (next < near.count && near.indices[next] == from) {
-            area -= areaOf(list.entries[from++]);
-            ++next;
-        } else if (piece < pieces.count &&
-                   (from == count || !isBefore(list.entries[from], pieces.boxes[piece]))) {
-            area += areaOf(pieces.boxes[piece]);
-            changed[changedCount++] = entryOf(pieces.boxes[piece++]);
-        } else {
-            changed[changedCount++] = list.entries[from++];
-        }
-    }
-    moveTail(list, count, from, first + changedCount);
-    for (int i = 0; i < changedCount; ++i)
-        list.entries[first + i] = changed[i];
+    area -= removeNear(list, count, near);
+    area += insertPieces(list, kept, pieces);
+    for (int i = newCount; i < count; ++i)
+        list.entries[i] = {};
     return {true, area};
 }
 
