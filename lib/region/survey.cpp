@@ -33,7 +33,7 @@ inline bool continuesOne(const Entry &entry, const Entry *first, const Entry *en
 
 } // namespace
 
-Survey surveyList(const RasterRectList &list) {
+Survey surveyEntries(const RasterRectList &list) {
     constexpr Survey kNotNormal = {};
     const Entry *entry = list.entries;
     const Entry *row = entry;   // the first entry of the current row

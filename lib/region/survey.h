@@ -17,6 +17,16 @@ struct Survey {
 // Surveys a list that is not empty.  In normal form every entry stands behind those
 // before it in order, overlaps none of them, touches none in a row, and continues none
 // downward; the slots behind the last entry are zero.
-Survey surveyList(const RasterRectList &list);
+Survey surveyEntries(const RasterRectList &list);
+
+// The same, and faster for a list of one entry.
+inline Survey surveyList(const RasterRectList &list) {
+    if (list.entries[1].width >= 1)
+        return surveyEntries(list);
+    const Rect box = boxOf(list.entries[0]);
+    if (isEmpty(box) || !isZeroFrom(list, 1))
+        return {};
+    return {.count = 1, .area = areaOf(box), .bottom = box.bottom, .bottomAbove = kCoordinateMin};
+}
 
 } // namespace quillon
