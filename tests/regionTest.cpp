@@ -44,8 +44,11 @@ TEST(RectList, refusesWhatHasNoSize) {
                   uint32_t(INT32_MAX));
         EXPECT_EQ(apply(Raster_SubRect, list, turned({INT32_MAX - 5, 0, 10, 10})),
                   uint32_t(INT32_MAX));
-        RasterRectList wrapped = {{turned({INT32_MAX - 5, 0, 10, 10})}};
-        EXPECT_EQ(apply(Raster_AddRect, wrapped, {0, 0, 5, 5}), 25u);
+        for (const Entry &next : {Entry{}, Entry{20, 20, 5, 5}}) {
+            RasterRectList wrapped = {{turned({INT32_MAX - 5, 0, 10, 10}), next}};
+            EXPECT_EQ(apply(Raster_AddRect, wrapped, {0, 0, 5, 5}),
+                      25u + uint32_t(next.width * next.height));
+        }
         for (const Entry &e : {Entry{0, 0, -1, 5}, Entry{0, 0, 5, INT32_MIN}, Entry{0, 0, -1, -1}})
             expectPanic(
                 "VERIFY lib/raster/rasterRect", [&] { apply(Raster_AddRect, list, turned(e)); },

@@ -51,6 +51,12 @@ Survey surveyEntries(const RasterRectList &list) {
         area += areaOf(*entry);
         if (isEmpty(box))
             return kNotNormal;
+        // Beside the entry before, in a row to which nothing from above reaches.
+        if (box.top == row->y && box.left > right && alive == row) {
+            bottom = std::max(bottom, box.bottom);
+            continue;
+        }
+        // Below all entries before.
         if (box.top > bottom) {
             row = entry;
             alive = entry;
@@ -74,8 +80,9 @@ Survey surveyEntries(const RasterRectList &list) {
             bottomAbove = bottom;
             row = entry;
         }
-        if (alive != row && (bottomAbove <= box.top ? continuesOne(*entry, alive, row)
-                                                    : isDisturbed(*entry, alive, row)))
+        // From alive on there are entries that reach down to the row.
+        if (bottomAbove <= box.top ? continuesOne(*entry, alive, row)
+                                   : isDisturbed(*entry, alive, row))
             return kNotNormal;
         bottom = std::max(bottom, box.bottom);
     }
