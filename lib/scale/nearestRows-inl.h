@@ -79,9 +79,13 @@ struct NearestGatherBody {
         } else {
             // Read before they are written: the compiler cannot know that the rows do
             // not overlap.
+            // The index in the upper half of 64 bits: one instruction less for each.
             uint32_t pixels[C::kUnits];
-            for (size_t k = 0; k < C::kUnits; ++k)
-                pixels[k] = pixelAt(src, (first + static_cast<uint32_t>(k) * step) >> 16);
+            uint64_t position = uint64_t{first} << 16;
+            for (uint32_t &pixel : pixels) {
+                pixel = pixelAt(src, position >> 32);
+                position += uint64_t{step} << 16;
+            }
             for (size_t k = 0; k < C::kUnits; ++k)
                 putPixel(dst, i + k, pixels[k]);
         }
@@ -97,7 +101,7 @@ struct NearestGathered : RasterScaleRowNearest {
         if constexpr (kHasFastGather)
             walkPixelsBy<Access>(inner_, body);
         else
-            walkPixels<4>(inner_, body);
+            walkPixels<8>(inner_, body);
         fillBehindInner(dst, src);
     }
 };

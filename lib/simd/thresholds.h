@@ -80,12 +80,6 @@ inline constexpr size_t kConvertLongRow = 512;
 // next row: it is one or two lines.
 inline constexpr size_t kConvertPrefetchRow = 32;
 
-// Nearest pixels of every eighth: destination rows from here on read the source in
-// whole vectors, shorter ones pick pixel by pixel: of rows of 32 pixels in a wide
-// surface AVX-512 takes 1.4 times as long by vectors, and with AVX2 both are even at
-// 112.
-inline constexpr uint32_t kScaleLongRowBy8 = 128;
-
 // ---- Source pixels ----------------------------------------------------------
 
 // Nearest pixels: steps of up to so many source pixels read the source in whole
