@@ -119,6 +119,7 @@ struct NearestCopied : RasterScaleRowNearest {
 
 // Each pixel twice.  The units are source pixels.
 struct DoubleBody {
+    static constexpr size_t kDstBytes = 8;
     uint8_t *dst;
     const uint8_t *src;
 
@@ -140,6 +141,7 @@ struct DoubleBody {
 };
 
 // Steps of half a pixel, from a whole one on.
+template <class Access>
 class NearestDoubled {
 public:
     explicit NearestDoubled(const ScaleAxis &axis)
@@ -147,7 +149,8 @@ public:
           count_(axis.dstSize), pairs_(std::min(axis.srcSize - first_, axis.dstSize / 2)) {}
 
     HWY_INLINE void operator()(uint8_t *dst, const uint8_t *src) const {
-        walkPixels<kVectorPixels / 2>(pairs_, DoubleBody{dst, src + size_t{4} * first_});
+        const DoubleBody body = {dst, src + size_t{4} * first_};
+        walkPixelsBy<Access, kVectorPixels / 2>(pairs_, body);
         // The first pixel of an incomplete pair, or copies of the last one.
         fillPixels(dst + size_t{8} * pairs_, src, std::min(first_ + pairs_, last_),
                    count_ - 2 * pairs_);

@@ -59,15 +59,16 @@ HWY_INLINE void walkPixels(size_t count, const Body &body, size_t limit = kMost)
                                            WalkWithChunk<Body>{count, body});
 }
 
-// The same, whose stores are through the caches (Unaligned) or around them
-// (NonTemporal).
-template <class Access, class Body>
+// The same, whose stores are as they come (Unaligned), or begin with a cache line and
+// go through the caches (Aligned) or around them (NonTemporal).  The access is chosen
+// once for all rows: a row that decides by itself costs short ones a fifth.
+template <class Access, size_t kMost = kVectorPixels, class Body>
 HWY_INLINE void walkPixelsBy(size_t count, const Body &body) {
-    if constexpr (std::is_same_v<Access, NonTemporal>) {
-        if (count >= kVectorPixels)
-            return walkAlignedRow<NonTemporal>(Chunk<kVectorPixels>(), count, body);
+    if constexpr (!std::is_same_v<Access, Unaligned>) {
+        if (count >= kMost)
+            return walkAlignedRow<Access>(Chunk<kMost>(), count, body);
     }
-    walkPixels(count, body);
+    walkPixels<kMost>(count, body);
 }
 
 struct FillPixelsBody {

@@ -21,6 +21,11 @@ namespace {
 
 #if QUILLON_HAS_VECTORS
 
+// Rows whose vectors are better aligned than as they come.
+bool isLongRow(const ScaleAxis &axis) {
+    return axis.dstSize >= kLineBytes + kVectorPixels;
+}
+
 // Rows of nearest pixels on both axes.  Around the caches a row that comes again is
 // scaled again: the destination row before is far away by now.
 template <template <class Access> class Row>
@@ -29,6 +34,21 @@ void walkNearestRows(const ScaleJob &job) {
         walkDirect<false>(job, Row<NonTemporal>(job.x));
     else
         walkDirect<true>(job, Row<Unaligned>(job.x));
+}
+
+template <template <class Access> class Row>
+void walkAlignedNearestRows(const ScaleJob &job) {
+    if (isLongRow(job.x) && !isNonTemporal(job.dstExtent()))
+        walkDirect<true>(job, Row<Aligned>(job.x));
+    else
+        walkNearestRows<Row>(job);
+}
+
+void walkDoubledRows(const ScaleJob &job) {
+    if (isLongRow(job.x))
+        walkDirect<false>(job, NearestDoubled<Aligned>(job.x));
+    else
+        walkDirect<false>(job, NearestDoubled<Unaligned>(job.x));
 }
 
 template <class Access>
@@ -71,13 +91,13 @@ void scaleNearest(const ScaleJob &job, void *cache) {
         walkRows(job, NearestCopied(job.x), cache);
     else if (step == kScaleOne / 2 && job.x.start % kScaleOne == 0 &&
              !isNonTemporal(job.dstExtent()))
-        walkDirect<false>(job, NearestDoubled(job.x));
+        walkDoubledRows(job);
     else if (step < kScaleOne)
         walkNearestRows<NearestPickedFrom1>(job);
     else if (step == 2 * kScaleOne)
-        walkNearestRows<NearestEveryOf2>(job);
+        walkAlignedNearestRows<NearestEveryOf2>(job);
     else if (step == 4 * kScaleOne)
-        walkNearestRows<NearestEveryOf4>(job);
+        walkAlignedNearestRows<NearestEveryOf4>(job);
     else if (step == 8 * kScaleOne && picksEighthsFromVectors(job))
         walkNearestRows<NearestEveryOf8>(job);
     else if (canPick(2))
@@ -87,7 +107,7 @@ void scaleNearest(const ScaleJob &job, void *cache) {
     else if (canPick(4))
         walkNearestRows<NearestPickedFrom4>(job);
     else
-        walkNearestRows<NearestGathered>(job);
+        walkAlignedNearestRows<NearestGathered>(job);
 }
 
 void scaleQuarter(const ScaleJob &job) {
