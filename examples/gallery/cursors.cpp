@@ -84,6 +84,7 @@ void draw(Picture &screen, const RasterCursor &cursor, int32_t x, int32_t y) {
 }
 
 void drawScaled(Picture &screen, const RasterCursor &cursor, int32_t x, int32_t y, double scale) {
+    //! [cursorScale]
     const std::unique_ptr<RasterCursor, void (*)(RasterCursor *)> large(
         Raster_ScaleCursor(&cursor, scale, scale), [](RasterCursor *scaled) {
             if (!scaled)
@@ -99,6 +100,7 @@ void drawScaled(Picture &screen, const RasterCursor &cursor, int32_t x, int32_t 
     if (!large)
         fail("no memory");
     draw(screen, *large, x, y);
+    //! [cursorScale]
 }
 
 } // namespace
@@ -131,27 +133,38 @@ void showCursors(Page &page, const Material &material) {
                             "cut at the edges of the screen"};
     for (size_t i = 0; i < screens.size(); ++i)
         sheet.add(zoomed(screens[i], 4), labels[i]);
-    page.show(sheet.drawn(), "cursors",
-              "`Raster_ExpandPlanarCursorData` makes masks of planes of one bit a pixel, "
-              "`Raster_ComputeCursorBox` cuts a cursor to the screen, `Raster_DrawCursor` draws "
-              "it. Pixels are shown four times their size.");
+    page.show(sheet,
+              {"cursors",
+               "Three arrows on a landscape; text cursors that invert what is under them; two "
+               "marbles with soft shadows; marbles cut off at all edges of a screen.",
+               "`Raster_ExpandPlanarCursorData` makes masks of planes of one bit a pixel, "
+               "`Raster_ComputeCursorBox` cuts a cursor to the screen, `Raster_DrawCursor` draws "
+               "it. Pixels are shown four times their size.",
+               {"cursorPlanes", "cursorDraw"}});
 
-    Sheet scaled(1);
-    for (const bool alpha : {false, true}) {
-        Picture wide = covering(material.photo, 704, 170);
-        int32_t x = 40;
-        for (const double scale : {0.5, 1.0, 2.0, 3.0, 4.5}) {
+    Sheet scaled(2);
+    const auto addScaled = [&](bool alpha, std::initializer_list<double> scales,
+                               const std::string &label) {
+        Picture wide = covering(material.photo, 344, 170);
+        int32_t x = 28;
+        for (const double scale : scales) {
             const int32_t half = static_cast<int32_t>(16 * scale);
-            drawScaled(wide, alpha ? ball : arrow.record, x + (alpha ? half : 0), alpha ? 84 : 60,
+            drawScaled(wide, alpha ? ball : arrow.record, x + (alpha ? half : 0), alpha ? 84 : 48,
                        scale);
-            x += half * 2 + 50;
+            x += half * 2 + 32;
         }
-        scaled.add(std::move(wide), alpha ? "alpha: 0.5, 1, 2, 3 and 4.5 times, filtered"
-                                          : "masks: 0.5, 1, 2, 3 and 4.5 times, nearest");
-    }
-    page.show(scaled.drawn(), "cursors-scaled",
-              "`Raster_ScaleCursor`: a mask knows no half tones and shows its pixels, an image "
-              "with alpha stays smooth.");
+        scaled.add(std::move(wide), label);
+    };
+    addScaled(false, {0.5, 1, 2, 3}, "masks: 0.5, 1, 2 and 3 times, nearest");
+    addScaled(false, {6}, "masks: 6 times");
+    addScaled(true, {0.5, 1, 2, 3}, "alpha: 0.5, 1, 2 and 3 times, filtered");
+    addScaled(true, {5}, "alpha: 5 times");
+    page.show(scaled,
+              {"cursors-scaled",
+               "Arrows of several sizes, whose pixels can be seen, and marbles, which are smooth.",
+               "`Raster_ScaleCursor`: a mask knows no half tones and shows its pixels, an image "
+               "with alpha stays smooth.",
+               {"cursorScale"}});
 }
 
 } // namespace gallery

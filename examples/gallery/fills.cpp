@@ -61,12 +61,20 @@ std::string labelOf(uint32_t rop) {
 
 constexpr int32_t kTileWidth = 168, kTileHeight = 112;
 
-Picture againstConstant(const Picture &photo, uint32_t rop) {
+Picture againstConstant(uint32_t rop) {
+    constexpr std::array<uint32_t, 4> kStripes = {0xFF000000, kBlue, 0xFFBEE9C8, kWhite};
+    constexpr int32_t kStripe = kTileWidth / 4, kBarTop = 28, kBar = kTileHeight - 2 * kBarTop;
+    Picture picture = blank(kTileWidth, kTileHeight, 0);
+    int32_t x = 0;
+    for (const uint32_t colour : kStripes) {
+        fill(picture, area(x, 0, kStripe, kTileHeight), colour);
+        x += kStripe;
+    }
     //! [ropFill]
-    Picture picture = covering(photo, kTileWidth, kTileHeight);
-    Raster_RectROPfill(picture.data(), picture.step(), 4, kOrange, rop, 28, 20, kTileWidth - 56,
-                       kTileHeight - 40);
+    Raster_RectROPfill(picture.data(), picture.step(), 4, kOrange, rop, 0, kBarTop, kTileWidth,
+                       kBar);
     //! [ropFill]
+    outline(picture, picture.bounds(), kPale); // or white ends in the page
     return picture;
 }
 
@@ -111,9 +119,12 @@ void showFills(Page &page, const Material &material) {
         fills.add(filledRings(depth),
                   std::to_string(bytes) + (bytes == 1 ? " byte a pixel" : " bytes a pixel"));
     }
-    page.show(fills.drawn(), "fill",
-              "`Raster_RectFill`: eight squares, each filled over the last, in pixels of each "
-              "size. They look the same, but for shades that 16 bits cannot hold.");
+    page.show(fills,
+              {"fill",
+               "Eight squares within each other, from blue to red, four times.",
+               "`Raster_RectFill`: eight squares, each filled over the last, in pixels of each "
+               "size. They look the same, but for shades that 16 bits cannot hold.",
+               {"fill"}});
 
     constexpr int32_t kWidth = 344, kHeight = 228;
     const Rect from = area(150, 66, 150, 110), to = area(90, 30, 150, 110);
@@ -128,27 +139,39 @@ void showFills(Page &page, const Material &material) {
     Sheet copies(2);
     copies.add(std::move(before), "what is copied");
     copies.add(std::move(after), "where it went");
-    page.show(copies.drawn(), "copy",
-              "`Raster_RectCopy` within one surface. The two places overlap, and the copy is whole "
-              "all the same: nothing of it repeats.");
+    page.show(copies,
+              {"copy",
+               "The middle of a landscape in a frame, and the same part copied further up and to "
+               "the left, over its old place.",
+               "`Raster_RectCopy` within one surface. The two places overlap, and the copy is "
+               "whole all the same: nothing of it repeats.",
+               {"copy"}});
 }
 
-void showRasterOperations(Page &page, const Material &material) {
+void showRasterOperations(Page &page) {
     page.room("Raster operations",
               "The sixteen ways to combine a source S with what the destination D holds, bit by "
               "bit. The number of each is its truth table.");
     Sheet constants(4);
     Sheet discs(4);
     for (uint32_t rop = 0; rop < kOperations.size(); ++rop) {
-        constants.add(againstConstant(material.photo, rop), labelOf(rop));
+        constants.add(againstConstant(rop), labelOf(rop));
         discs.add(betweenDiscs(rop), labelOf(rop));
     }
-    page.show(discs.drawn(), "rop-surfaces",
-              "`Raster_RectROPcopy` between two surfaces of one byte a pixel: S is the left disc, "
-              "D the right one. Dark is 1, so each tile is the diagram of its formula.");
-    page.show(constants.drawn(), "rop-constant",
-              "`Raster_RectROPfill`: S is an orange, D the picture; the middle of each tile is "
-              "combined, the rim left as it was.");
+    page.show(discs,
+              {"rop-surfaces",
+               "Sixteen diagrams of two overlapping discs, each with other parts of them dark.",
+               "`Raster_RectROPcopy` between two surfaces of one byte a pixel: S is the left disc, "
+               "D the right one. Dark is 1, so each tile is the diagram of its formula.",
+               {"ropCopy"}});
+    page.show(constants,
+              {"rop-constant",
+               "Sixteen times stripes of black, blue, pale green and white, with a bar across "
+               "them whose colours are what the operation makes of each stripe.",
+               "`Raster_RectROPfill`: S is an orange, D four stripes, of which black has no bit "
+               "set and white every one. The bar across them is combined, the rest left as it "
+               "was.",
+               {"ropFill"}});
 }
 
 } // namespace gallery

@@ -129,10 +129,13 @@ void showImages(Page &page, const Material &material) {
     Sheet combined(2);
     addCombined(combined, photo, 0, "no gap");
     addCombined(combined, photo, 16, "a gap");
-    page.show(combined.drawn(), "combine",
-              "`ImageUtil_Combine`: four quarters of 24 bits a pixel. Side by side they are "
-              "whole again, without a seam. Where a gap is left the result gains alpha, and is "
-              "clear there (shown over cheques).");
+    page.show(combined,
+              {"combine",
+               "A landscape put together of four quarters: whole, and with gaps that show cheques.",
+               "`ImageUtil_Combine`: four quarters of 24 bits a pixel. Side by side they are "
+               "whole again, without a seam. Where a gap is left the result gains alpha, and is "
+               "clear there (shown over cheques).",
+               {"combine"}});
 
     const Rect part = subject(photo, 132, 108);
     Picture marked = copyOf(photo);
@@ -142,8 +145,12 @@ void showImages(Page &page, const Material &material) {
     cuts.add(cutAndScaled(photo, part, -1, 216), "216 high, its width by proportion");
     cuts.add(cutAndScaled(photo, part, 328, 80), "328 by 80");
     cuts.add(cutAndScaled(photo, part, -1, -1), "its own size");
-    page.show(cuts.drawn(), "crop-and-scale",
-              "`ImageUtil_CropAndScaleImage`: one part of the picture in several sizes.");
+    page.show(cuts,
+              {"crop-and-scale",
+               "A landscape with a part framed, and that part enlarged, stretched, and in its own "
+               "size.",
+               "`ImageUtil_CropAndScaleImage`: one part of the picture in several sizes.",
+               {"cropAndScale"}});
 }
 
 void showFiles(Page &page, const Material &material) {
@@ -175,7 +182,12 @@ void showFiles(Page &page, const Material &material) {
     sheet.newRow();
     sheet.add(nearest);
     sheet.add(filtered);
-    page.show(sheet.drawn(), "sheet", "The sheet, from `ImageUtil_Combine`.");
+    page.show(sheet.drawn(),
+              {"sheet",
+               "Thumbnails of four sizes, a crop, and a detail enlarged as squares and smooth, on "
+               "dark grey.",
+               "The sheet, from `ImageUtil_Combine`; and what wrote the files.",
+               {"write"}});
 }
 
 } // namespace gallery

@@ -109,11 +109,15 @@ void showLayouts(Page &page, const Material &material) {
                                                        layout.fields + "\norange is " +
                                                        hexOf(orange, layout.bytes));
     }
-    page.show(sheet.drawn(), "layouts",
-              "`Raster_ConvertPixelsFrom32`, then `Raster_ConvertPixelsTo32`; the ramps under the "
-              "picture count the levels of each channel. There is no way back from one byte a "
-              "pixel as such: those bytes serve as indices into a palette of what they mean. The "
-              "orange is one pixel, from `Raster_ConvertOnePixel`.");
+    page.show(sheet,
+              {"layouts",
+               "A landscape above ramps of red, green, blue and grey, eight times, with ever fewer "
+               "colours.",
+               "`Raster_ConvertPixelsFrom32`, then `Raster_ConvertPixelsTo32`; the ramps under the "
+               "picture count the levels of each channel. There is no way back from one byte a "
+               "pixel as such: those bytes serve as indices into a palette of what they mean. The "
+               "orange is one pixel, from `Raster_ConvertOnePixel`.",
+               {"convert"}});
 }
 
 } // namespace gallery

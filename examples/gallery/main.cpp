@@ -22,7 +22,7 @@ Material materialFrom(const std::string &photoFile, const std::string &spriteFil
 void makeGallery(const Material &material, const std::string &folder) {
     Page page(folder);
     showFills(page, material);
-    showRasterOperations(page, material);
+    showRasterOperations(page);
     showText(page, material);
     showLayouts(page, material);
     showScaling(page, material);
@@ -30,8 +30,10 @@ void makeGallery(const Material &material, const std::string &folder) {
     showCursors(page, material);
     showVideo(page, material);
     showColorKey(page, material);
+    showRects(page);
     showRegions(page);
     showImages(page, material);
+    showEncoders(page, material);
     showFiles(page, material);
     page.finish();
 }

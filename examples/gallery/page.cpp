@@ -1,7 +1,7 @@
 #include "page.h"
+#include "snippet.h"
 
 #include <fstream>
-#include <regex>
 
 namespace gallery {
 
@@ -27,21 +27,26 @@ nav a { padding: .15rem .75rem; border: 1px solid var(--line); border-radius: 1r
         background: #fff; text-decoration: none }
 nav a:hover { border-color: var(--blue) }
 figure { margin: 1rem 0; padding: 1.25rem; border: 1px solid var(--line); border-radius: .5rem;
-         background: #fff; overflow-x: auto }
-.wide::before { display: none; position: sticky; left: 0; margin-bottom: .5rem; color: var(--soft);
-                font-size: .925rem; content: "Goes on to the right \2192" }
-@media (max-width: 46rem) { .wide::before { display: block } }
+         background: #fff }
 figure a { display: block }
 img { display: block; max-width: 100%; height: auto }
-figcaption { position: sticky; left: 0; max-width: 46rem; margin-top: .9rem; color: var(--soft);
-             font-size: .925rem }
+figcaption { max-width: 46rem; margin-top: .9rem; color: var(--soft); font-size: .925rem }
 code { font: .9em ui-monospace, Consolas, "DejaVu Sans Mono", monospace; color: var(--ink) }
+/* Code that goes on beyond an edge has a shadow there, which scrolls away. */
+pre { margin: .9rem 0 0; padding: .75rem 1rem; overflow-x: auto; font-size: .875rem;
+      line-height: 1.45; border-radius: .25rem;
+      background: linear-gradient(90deg, #f3f5f7 50%, #f3f5f700) 0 0 / 3rem 100% no-repeat local,
+                  linear-gradient(270deg, #f3f5f7 50%, #f3f5f700) 100% 0 / 3rem 100% no-repeat local,
+                  linear-gradient(90deg, #1f2a3640, #1f2a3600) 0 0 / .75rem 100% no-repeat scroll,
+                  linear-gradient(270deg, #1f2a3640, #1f2a3600) 100% 0 / .75rem 100% no-repeat scroll
+                  #f3f5f7 }
+@media (max-width: 30rem) { main { padding: 1.5rem .5rem 3rem } figure { padding: .5rem } }
 .file { display: inline-block; margin: 0 1rem .25rem 0 }
 </style>
 <main>
 <h1>libquillon: a gallery</h1>
-<p>Every picture here was drawn by the library, the lettering in it too. A picture opens in its
-true size at a click.</p>
+<p>Every picture here was drawn by the library, the lettering in it too, by the lines of the
+<code>examples/gallery</code> that stand below it. A picture opens in its true size at a click.</p>
 )";
 
 // Text as HTML, with what stands between backticks as code.
@@ -56,6 +61,8 @@ std::string markup(const std::string &text) {
             html += "&lt;";
         } else if (c == '&') {
             html += "&amp;";
+        } else if (c == '"') {
+            html += "&quot;";
         } else {
             html += c;
         }
@@ -63,12 +70,18 @@ std::string markup(const std::string &text) {
     return html;
 }
 
-// The first sentence of a caption, for those who do not see the picture.
-std::string alternative(const std::string &caption) {
-    std::string text;
-    for (const char c : markup(caption.substr(0, caption.find(". "))))
-        text += c == '"' ? '\'' : c;
-    return std::regex_replace(text, std::regex("</?code>"), "");
+// Up to how wide a window is narrow, and what fits one.
+constexpr const char *kNarrowWindow = "(max-width: 48rem)";
+constexpr int32_t kNarrow = 360;
+
+std::string sizeOf(const Picture &picture) {
+    return " width=\"" + std::to_string(picture.width()) + "\" height=\"" +
+           std::to_string(picture.height()) + "\"";
+}
+
+std::string imageOf(const Picture &picture, const Exhibit &exhibit) {
+    return "<img src=\"" + exhibit.name + ".png\" alt=\"" + markup(exhibit.alternative) + "\"" +
+           sizeOf(picture) + ">";
 }
 
 } // namespace
@@ -79,18 +92,35 @@ void Page::room(const std::string &title, const std::string &text) {
     body += "<h2 id=\"" + id + "\">" + markup(title) + "</h2>\n<p>" + markup(text) + "</p>\n";
 }
 
-void Page::show(const Picture &picture, const std::string &name, const std::string &caption) {
-    const std::string fileName = name + ".png";
-    save(picture, fileName);
-    // In a small window a picture shrinks until its labels would be too small to
-    // read; then it can be scrolled.
-    const std::string size = " width=\"" + std::to_string(picture.width()) + "\" height=\"" +
-                             std::to_string(picture.height()) + "\" style=\"min-width: min(" +
-                             std::to_string(picture.width()) + "px, 40rem)\"";
-    const char *const figure = picture.width() > 480 ? "<figure class=\"wide\">" : "<figure>";
-    body += std::string(figure) + "<a href=\"" + fileName + "\"><img src=\"" + fileName +
-            "\" alt=\"" + alternative(caption) + "\"" + size + "></a>\n<figcaption>" +
-            markup(caption) + "</figcaption></figure>\n";
+void Page::show(const Picture &picture, const Exhibit &exhibit) {
+    save(picture, exhibit.name + ".png");
+    frame(imageOf(picture, exhibit), exhibit);
+}
+
+void Page::show(const Picture &wide, const Picture &narrow, const Exhibit &exhibit) {
+    save(wide, exhibit.name + ".png");
+    const std::string narrowFile = exhibit.name + "-narrow.png";
+    save(narrow, narrowFile);
+    frame(std::string("<picture><source media=\"") + kNarrowWindow + "\" srcset=\"" + narrowFile +
+              "\"" + sizeOf(narrow) + ">" + imageOf(wide, exhibit) + "</picture>",
+          exhibit);
+}
+
+void Page::show(const Sheet &sheet, const Exhibit &exhibit) {
+    const Picture wide = sheet.drawn();
+    const Picture narrow = sheet.drawnWithin(kNarrow);
+    if (narrow.width() < wide.width())
+        show(wide, narrow, exhibit);
+    else
+        show(wide, exhibit);
+}
+
+void Page::frame(const std::string &picture, const Exhibit &exhibit) {
+    body += "<figure><a href=\"" + exhibit.name + ".png\">" + picture + "</a>\n<figcaption>" +
+            markup(exhibit.caption) + "</figcaption>\n";
+    for (const std::string &name : exhibit.snippets)
+        body += "<pre tabindex=\"0\"><code>" + markup(snippet(name)) + "</code></pre>\n";
+    body += "</figure>\n";
 }
 
 void Page::link(const Picture &picture, const std::string &fileName) {
@@ -99,10 +129,12 @@ void Page::link(const Picture &picture, const std::string &fileName) {
 }
 
 void Page::save(const Picture &picture, const std::string &fileName) const {
+    //! [write]
     const bool bmp = fileName.ends_with(".bmp");
     if (!ImageUtil_WriteImage(&picture.info(), (folder + fileName).c_str(),
                               bmp ? IMAGEUTIL_FORMAT_BMP : IMAGEUTIL_FORMAT_PNG))
         fail(folder + fileName + " cannot be written");
+    //! [write]
 }
 
 void Page::finish() const {

@@ -74,9 +74,13 @@ Picture read(const std::string &fileName) {
     constexpr uint32_t kLargest = 32767;
     if (info.width > kLargest || info.height > kLargest)
         fail(fileName + " is too large: no side may have more than 32767 pixels");
+    return in32Bits(std::move(file));
+}
+
+Picture in32Bits(Picture file) {
+    const ImageInfo &info = file.info();
     if (info.bpp == 32)
         return file;
-
     // A palette.  Its entries are pixels whose fourth byte is not set.
     std::vector<uint32_t> palette(256);
     for (size_t i = 0; i < palette.size(); ++i) {
@@ -176,11 +180,13 @@ Picture resized(const Picture &source, int32_t width, int32_t height) {
 }
 
 Picture zoomed(const Picture &source, int32_t factor) {
+    //! [enlarge]
     Picture large = blank(source.width() * factor, source.height() * factor, 0);
     if (!Raster_Scale(large.data(), large.step(), large.info().width, large.info().height, 0, 0,
                       large.width(), large.height(), source.data(), source.step(),
                       source.info().width, source.info().height, factor, factor, 0))
         fail("a picture cannot be enlarged");
+    //! [enlarge]
     return large;
 }
 

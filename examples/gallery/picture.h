@@ -61,6 +61,8 @@ Rect area(int32_t x, int32_t y, int32_t width, int32_t height);
 Picture blank(int32_t width, int32_t height, uint32_t colour);
 // A PNG of any kind the library reads, whether it has alpha or a palette.
 Picture read(const std::string &fileName);
+// Of 32 bits a pixel, from an image of that kind or with a palette.
+Picture in32Bits(Picture file);
 
 // Drawing.  The library does not clip; here, drawing past an edge is a failure.
 void fill(Picture &ground, const Rect &part, uint32_t colour);

@@ -36,7 +36,9 @@ class Story {
 public:
     explicit Story(Sheet &sheetToFill) : sheet(sheetToFill) {}
     void add(int32_t x, int32_t y, int32_t width, int32_t height) {
+        //! [regionAdd]
         const uint32_t pixels = Raster_AddRect(&list, x, y, width, height);
+        //! [regionAdd]
         tell("added: ", pixels, area(x, y, width, height), kOrange);
     }
     void cut(int32_t x, int32_t y, int32_t width, int32_t height) {
@@ -75,31 +77,15 @@ void showRegions(Page &page) {
     story.scatter(14);
     story.add(136, 72, 20, 20);
     story.add(8, 104, 20, 20);
-    page.show(sheet.drawn(), "regions",
-              "`Raster_AddRect` and `Raster_SubRect`. Each entry is outlined in blue, the "
-              "rectangle just added in orange, the one just cut in black. Entries never overlap, "
-              "and those that could be one are one. The last step would take a sixteenth entry, so "
-              "the region becomes the box around it.");
-
-    // Which part of a source is seen in a clip, and where that goes in a target.
-    //! [rect]
-    const Rect source = area(20, 20, 96, 72), clip = area(72, 48, 80, 64);
-    const Rect target = area(24, 12, 120, 104);
-    Rect seen, goes;
-    Rect_IntersectPair(&seen, &source, &clip, &goes, &target);
-    //! [rect]
-    Picture left = blank(kWidth, kHeight, kPale), right = blank(kWidth, kHeight, kPale);
-    fill(left, seen, 0xFF9CC5DC);
-    outline(left, source, kBlue);
-    outline(left, clip, kOrange, 2);
-    fill(right, goes, 0xFF9CC5DC);
-    outline(right, target, kBlue);
-    Sheet mapping(2);
-    mapping.add(std::move(left), "source, cut by a clip");
-    mapping.add(std::move(right), "the same part of target");
-    page.show(mapping.drawn(), "rectangles",
-              "`Rect_IntersectPair`: as much of the source (blue) as the clip (orange) leaves, and "
-              "where it lies in the target.");
+    page.show(sheet,
+              {"regions",
+               "Eight steps of a region: rectangles are added, a hole and a gap are cut, the hole "
+               "is filled, squares are scattered, and the region becomes one box.",
+               "`Raster_AddRect` and `Raster_SubRect`. Each entry is outlined in blue, the "
+               "rectangle just added in orange, the one just cut in black. Entries never overlap, "
+               "and those that could be one are one. The last step would take a sixteenth entry, "
+               "so the region becomes the box around it.",
+               {"regionAdd", "regionWalk"}});
 }
 
 } // namespace gallery

@@ -14,7 +14,7 @@ struct Material {
 };
 
 void showFills(Page &page, const Material &material);
-void showRasterOperations(Page &page, const Material &material);
+void showRasterOperations(Page &page);
 void showText(Page &page, const Material &material);
 void showLayouts(Page &page, const Material &material);
 void showScaling(Page &page, const Material &material);
@@ -22,8 +22,10 @@ void showBlending(Page &page, const Material &material);
 void showCursors(Page &page, const Material &material);
 void showVideo(Page &page, const Material &material);
 void showColorKey(Page &page, const Material &material);
+void showRects(Page &page);
 void showRegions(Page &page);
 void showImages(Page &page, const Material &material);
+void showEncoders(Page &page, const Material &material);
 // Plain files, as a program that handles pictures would make them.
 void showFiles(Page &page, const Material &material);
 

@@ -90,19 +90,26 @@ void showScaling(Page &page, const Material &material) {
     up.add(scaled(detail, detail.width() * kFactor, detail.height() * kFactor, kFiltered),
            "8 times, filtered");
     addDamage(up, detail, kFactor);
-    page.show(
-        up.drawn(), "scale-up",
-        "Enlarged: squares, or slopes between them. Below, `Raster_ScaleSrcCoordinates` tells "
-        "which pixels of an enlargement depend on a part of its source.");
+    page.show(up,
+              {"scale-up",
+               "A detail of a landscape eight times enlarged, as squares and smooth; below, a part "
+               "that has changed, and the larger part of the enlargement that depends on it.",
+               "Enlarged: squares, or slopes between them. Below, `Raster_ScaleSrcCoordinates` "
+               "tells which pixels of an enlargement depend on a part of its source.",
+               {"enlarge", "scaleDamage"}});
 
     Sheet down(3);
     addReductions(down, spokes(672), 224, 224);
     addReductions(down, covering(material.photo, 896, 608), 224, 152);
-    page.show(down.drawn(), "scale-down",
-              "Reduced, and shown with each pixel as a square. Nearest samples invent patterns "
-              "where the spokes are finer than the pixels; averages turn them grey. Averages leave "
-              "the last column of their source out, which would darken the right edge: the source "
-              "has been handed over with that column twice.");
+    page.show(down,
+              {"scale-down",
+               "Spokes and a landscape, reduced: by nearest samples with false patterns, by "
+               "averages smooth.",
+               "Reduced, and shown with each pixel as a square. Nearest samples invent patterns "
+               "where the spokes are finer than the pixels; averages turn them grey. Averages "
+               "leave the last column of their source out, which would darken the right edge: the "
+               "source has been handed over with that column twice.",
+               {"scale"}});
 }
 
 } // namespace gallery

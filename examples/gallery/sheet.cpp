@@ -9,6 +9,13 @@ namespace gallery {
 
 namespace {
 constexpr int32_t kColumnGap = 16, kRowGap = 18, kLabelGap = 5, kLinePitch = kGlyphHeight + 2;
+
+// The gaps between sizes are one less than there are of these.
+int32_t total(const std::vector<int32_t> &sizes, int32_t gap) {
+    return std::accumulate(sizes.begin(), sizes.end(), -gap,
+                           [gap](int32_t sum, int32_t size) { return sum + size + gap; });
+}
+
 } // namespace
 
 int32_t Sheet::Tile::width() const {
@@ -30,21 +37,36 @@ void Sheet::add(Picture picture, const std::string &label) {
     tiles.push_back({std::move(picture), std::move(lines)});
 }
 
-Picture Sheet::drawn() const {
-    std::vector<int32_t> widths(std::min(columnCount, tiles.size()));
-    std::vector<int32_t> heights((tiles.size() + columnCount - 1) / columnCount);
+int32_t Sheet::Grid::width() const {
+    return total(widths, kColumnGap);
+}
+
+int32_t Sheet::Grid::height() const {
+    return total(heights, kRowGap);
+}
+
+Sheet::Grid Sheet::gridOf(size_t columns) const {
+    Grid grid;
+    grid.widths.resize(std::min(columns, tiles.size()));
+    grid.heights.resize((tiles.size() + columns - 1) / columns);
     for (size_t i = 0; i < tiles.size(); ++i) {
-        int32_t &width = widths[i % columnCount], &height = heights[i / columnCount];
+        int32_t &width = grid.widths[i % columns], &height = grid.heights[i / columns];
         width = std::max(width, tiles[i].width());
         height = std::max(height, tiles[i].height());
     }
-    // The gaps between columns and rows, one less than there are of these.
-    const auto total = [](const std::vector<int32_t> &sizes, int32_t gap) {
-        return std::accumulate(sizes.begin(), sizes.end(), -gap,
-                               [gap](int32_t sum, int32_t size) { return sum + size + gap; });
-    };
-    Picture sheet = blank(total(widths, kColumnGap), total(heights, kRowGap), kWhite);
+    return grid;
+}
 
+Picture Sheet::drawnWithin(int32_t width) const {
+    size_t columns = columnCount;
+    while (columns > 1 && gridOf(columns).width() > width)
+        --columns;
+    return drawnIn(columns);
+}
+
+Picture Sheet::drawnIn(size_t columns) const {
+    const Grid grid = gridOf(columns);
+    Picture sheet = blank(grid.width(), grid.height(), kWhite);
     int32_t x = 0, y = 0;
     for (size_t i = 0; i < tiles.size(); ++i) {
         paste(sheet, tiles[i].picture, x, y);
@@ -53,9 +75,9 @@ Picture Sheet::drawn() const {
             write(sheet, x, line, text, kInk, kWhite);
             line += kLinePitch;
         }
-        const bool last = i % columnCount == columnCount - 1;
-        x = last ? 0 : x + widths[i % columnCount] + kColumnGap;
-        y += last ? heights[i / columnCount] + kRowGap : 0;
+        const bool last = i % columns == columns - 1;
+        x = last ? 0 : x + grid.widths[i % columns] + kColumnGap;
+        y += last ? grid.heights[i / columns] + kRowGap : 0;
     }
     return sheet;
 }

@@ -14,7 +14,9 @@ public:
     explicit Sheet(size_t columns) : columnCount(columns) {}
     // A label may have several lines.
     void add(Picture picture, const std::string &label);
-    Picture drawn() const;
+    Picture drawn() const { return drawnIn(columnCount); }
+    // In fewer columns, as many as have room in a width, but one at least.
+    Picture drawnWithin(int32_t width) const;
 
 private:
     struct Tile {
@@ -24,6 +26,15 @@ private:
         int32_t width() const;
         int32_t height() const;
     };
+    // Where tiles stand, in so many columns.
+    struct Grid {
+        std::vector<int32_t> widths, heights; // of columns and rows
+        int32_t width() const;
+        int32_t height() const;
+    };
+    Grid gridOf(size_t columns) const;
+    Picture drawnIn(size_t columns) const;
+
     size_t columnCount;
     std::vector<Tile> tiles;
 };

@@ -3,21 +3,23 @@
 #include "rooms.h"
 #include "sheet.h"
 
+#include <algorithm>
+
 namespace gallery {
 
 namespace {
 
-Picture allGlyphs() {
-    constexpr int32_t kColumns = 32, kRows = 3, kPitch = kGlyphHeight + 3;
-    Picture table = blank(kColumns * kGlyphWidth + 8, kRows * kPitch + 5, kPale);
-    for (int32_t row = 0; row < kRows; ++row) {
+Picture allGlyphs(int32_t columns) {
+    constexpr int32_t kPitch = kGlyphHeight + 3, kCount = kLastGlyph - kFirstGlyph + 1;
+    const int32_t rows = (kCount + columns - 1) / columns;
+    Picture table = blank(columns * kGlyphWidth + 8, rows * kPitch + 5, kPale);
+    for (int32_t first = 0; first < kCount; first += columns) {
         std::string line;
-        for (int32_t c = kFirstGlyph + row * kColumns; c <= kLastGlyph; ++c)
-            if (line.size() < kColumns)
-                line += static_cast<char>(c);
-        write(table, 4, 4 + row * kPitch, line, kInk, kPale);
+        for (int32_t i = first; i < std::min(first + columns, kCount); ++i)
+            line += static_cast<char>(kFirstGlyph + i);
+        write(table, 4, 4 + first / columns * kPitch, line, kInk, kPale);
     }
-    return table;
+    return zoomed(table, 2);
 }
 
 using Lettering = void (*)(Picture &, int32_t x, int32_t y);
@@ -34,8 +36,11 @@ Picture lettered(const Picture &photo, Lettering lettering) {
 void showText(Page &page, const Material &material) {
     page.room("Text", "A bitmap with one bit a pixel becomes pixels. Every label on this page was "
                       "drawn that way, in a font of the gallery's own.");
-    page.show(zoomed(allGlyphs(), 2), "text-font",
-              "`Raster_BitsToPixels`: the font, each line of it one call, at twice its size.");
+    page.show(allGlyphs(32), allGlyphs(16),
+              {"text-font",
+               "All printable characters of ASCII, in a font of pixels.",
+               "`Raster_BitsToPixels`: the font, each line of it one call, at twice its size.",
+               {"text"}});
 
     Sheet ways(2);
     ways.add(lettered(material.photo,
@@ -49,9 +54,13 @@ void showText(Page &page, const Material &material) {
                           stencil(picture, x, y, " Sphinx of quartz ", kWhite);
                       }),
              "a stencil, over its own shadow");
-    page.show(ways.drawn(), "text-ways",
-              "`Raster_BitsToPixels` writes ink and paper; `Raster_BitsToPixelsStencil` writes the "
-              "ink alone, and the picture stays between the letters.");
+    page.show(ways,
+              {"text-ways",
+               "The words Sphinx of quartz over a landscape: on yellow paper, and as white letters "
+               "with a shadow.",
+               "`Raster_BitsToPixels` writes ink and paper; `Raster_BitsToPixelsStencil` writes "
+               "the ink alone, and the picture stays between the letters.",
+               {"stencil"}});
 }
 
 } // namespace gallery

@@ -99,8 +99,10 @@ Picture pixelByPixel(const Picture &picture) {
     Picture result = blank(kWidth, kHeight, 0);
     for (int32_t y = 0; y < kHeight; ++y)
         for (int32_t x = 0; x < kWidth; ++x) {
+            //! [videoPixel]
             const Yuv yuv = yuvOf(picture, x, y, 1, 1);
             fill(result, area(x, y, 1, 1), RasterRGB_YUVtoBGRX(yuv.y, yuv.u, yuv.v));
+            //! [videoPixel]
         }
     return result;
 }
@@ -143,19 +145,28 @@ void showVideo(Page &page, const Material &material) {
     for (const int32_t depth : {24, 16, 15})
         sheet.add(converted(planar, RASTER_VIDEO_YV12, depth),
                   "YV12, depth " + std::to_string(depth));
-    page.show(sheet.drawn(), "video-formats",
-              "`Raster_YUVtoRGB`: the same frame in each format, and in each depth of pixels.");
+    page.show(sheet,
+              {"video-formats",
+               "The same landscape six times, its colours a little off.",
+               "`Raster_YUVtoRGB`: the same frame in each format, and in each depth of pixels.",
+               {"video"}});
 
+    //! [videoExchanged]
     Picture exact = converted(packedFrame(photo, 0, true), RASTER_VIDEO_YUY2, 32);
     exchangeRedAndBlue(exact);
+    //! [videoExchanged]
     Sheet colours(3);
     colours.add(copyOf(photo), "what was filmed");
     colours.add(pixelByPixel(photo), "one pixel at a time");
     colours.add(std::move(exact), "YUY2, U and V exchanged");
-    page.show(colours.drawn(), "video-colours",
-              "`RasterRGB_YUVtoBGRX` gives the colours that were filmed. `Raster_YUVtoRGB` has U "
-              "and V in each other's places, so its colours above are a little off; a frame in "
-              "which they are exchanged, and red and blue afterwards, gets them right.");
+    page.show(colours,
+              {"video-colours",
+               "The landscape as it was filmed, and twice after its way through video, with the "
+               "same colours.",
+               "`RasterRGB_YUVtoBGRX` gives the colours that were filmed. `Raster_YUVtoRGB` has U "
+               "and V in each other's places, so its colours above are a little off; a frame in "
+               "which they are exchanged, and red and blue afterwards, gets them right.",
+               {"videoPixel", "videoExchanged"}});
 }
 
 void showColorKey(Page &page, const Material &material) {
@@ -173,9 +184,13 @@ void showColorKey(Page &page, const Material &material) {
     Sheet sheet(2);
     sheet.add(copyOf(background), "the desktop, with the key in magenta");
     sheet.add(std::move(result), "with the film in its place");
-    page.show(sheet.drawn(), "color-key",
-              "`Raster_ApplyColorKey`: the film replaces the key colour, and nothing else, so the "
-              "note stays in front of it.");
+    page.show(sheet,
+              {"color-key",
+               "A desktop with a window whose screen is magenta, and the same with a landscape "
+               "there; a note lies in front of both.",
+               "`Raster_ApplyColorKey`: the film replaces the key colour, and nothing else, so the "
+               "note stays in front of it.",
+               {"colorKey"}});
 }
 
 } // namespace gallery
