@@ -9,13 +9,13 @@ cxx=("$2" ${3:+--sysroot="$3"}) emulator=("${@:6}")
 work=$(mktemp -d)
 trap 'rm -rf "$work"' EXIT
 
-block() { # LANGUAGE NUMBER
-    awk -v fence="\`\`\`$1" -v number="$2" '
-        /^```/ { inside = $0 == fence && ++count == number; next } inside' "$sourceDir/README.md"
+block() { # LANGUAGE FILE, of which the first block counts
+    awk -v fence="\`\`\`$1" '
+        /^```/ { inside = $0 == fence && ++count == 1; next } inside' "$sourceDir/$2"
 }
-block c 1 | diff - "$sourceDir/examples/readme.c"
-block cpp 1 | diff - "$sourceDir/examples/readme.cpp"
-block cpp 2 | "${cxx[@]}" -std=c++17 -fsyntax-only -Wall -Wextra -Werror -I"$sourceDir/include" -x c++ -
+block c README.md | diff - "$sourceDir/examples/readme.c"
+block cpp README.md | diff - "$sourceDir/examples/readme.cpp"
+block cpp docs/site/hearth.md | "${cxx[@]}" -std=c++17 -fsyntax-only -Wall -Wextra -Werror -I"$sourceDir/include" -x c++ -
 
 expectSize() { # PROGRAM PICTURE SIZE
     "${emulator[@]}" "$1" "$sourceDir/examples/pictures/$2.png" "$work/out.png"
