@@ -54,7 +54,7 @@ HWY_INLINE V blendOver(D d, V src, V dst) {
 // Much of what lies over a picture is clear or opaque, in long runs.  A look at the alpha
 // of one pixel is cheaper than one at a vector.
 HWY_INLINE bool isClearOrOpaque(const uint8_t *pixel) {
-    return static_cast<uint8_t>(pixel[3] + 1) <= 1;
+    return pixel[3] == 0 || pixel[3] == 255;
 }
 
 // The same for as many pixels as there are bytes in a vector, by channels.
@@ -94,12 +94,11 @@ struct BlendBody {
         const hn::CappedTag<uint32_t, C::kUnits> d;
         const auto over = access.load(d, from);
         if (isClearOrOpaque(from)) {
-            if (from[3] == 0) {
-                if (hn::AllTrue(d, hn::Eq(over, hn::Zero(d))))
-                    return;
-            } else if (hn::AllTrue(d, hn::Gt(over, hn::Set(d, 0xFEFFFFFF)))) {
+            if (hn::AllTrue(d, hn::Eq(over, hn::Zero(d))))
+                return;
+            if (hn::AllTrue(d,
+                            hn::Eq(hn::Or(over, hn::Set(d, 0x00FFFFFF)), hn::Set(d, 0xFFFFFFFF))))
                 return access.store(d, colourOf(d, over, access.load(d, pixels)), pixels);
-            }
         }
         access.store(d, blendOver(d, over, access.load(d, pixels)), pixels);
     }
