@@ -70,8 +70,12 @@ struct PatternVectors {
     hn::Vec<D> first, second, third;
 
     HWY_INLINE PatternVectors(D d, const PixelPattern &pattern, size_t offset)
-        : first(pattern.from(d, offset)), second(pattern.from(d, offset + kBytesOf<D>)),
-          third(pattern.from(d, offset + 2 * kBytesOf<D>)) {}
+        : first(pattern.from(d, offset)), second(first), third(first) {
+        if (!pattern.isSameAt(0, kBytesOf<D>)) {
+            second = pattern.from(d, offset + kBytesOf<D>);
+            third = pattern.from(d, offset + 2 * kBytesOf<D>);
+        }
+    }
 
     template <size_t kTurn>
     HWY_INLINE hn::Vec<D> get() const {
