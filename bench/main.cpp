@@ -6,15 +6,31 @@
 #include "shapes.h"
 
 #include <hwy/targets.h>
+#include <quillon/version.h>
 #include <sched.h>
 
 #include <algorithm>
+#include <cstdio>
 #include <fstream>
 #include <span>
+#include <string_view>
 
 namespace {
 
 using namespace quillon::bench;
+
+constexpr char kHelp[] =
+    "usage: quillonBench [OPTION...]\n"
+    "\n"
+    "Measures every operation beside other libraries and beside what memory allows.\n"
+    "\n"
+    "  --target=NAME       with the kernels of one instruction set, such as AVX2\n"
+    "  --report=FOLDER     write the page there instead of showing it\n"
+    "  --sweep             look for slow shapes of rectangles\n"
+    "  --growth            time a pixel, from small to large\n"
+    "  --instructions      mark each operation for an emulator that counts\n"
+    "  --benchmark_...     options of Google Benchmark, as --benchmark_filter=REGEX\n"
+    "  --help, --version   show this text; show the version\n";
 
 void pinToThisCore() {
     cpu_set_t one;
@@ -50,6 +66,11 @@ bool publish(const std::string &page, const std::string &folder, const char *nam
 } // namespace
 
 int main(int argc, char **argv) {
+    const std::string_view option = argc == 2 ? argv[1] : "";
+    if (option == "--help")
+        return std::fputs(kHelp, stdout) < 0;
+    if (option == "--version")
+        return std::puts("quillonBench " QUILLON_VERSION_STRING) < 0;
     pinToThisCore();
     benchmark::Initialize(&argc, argv);
     std::string folder;

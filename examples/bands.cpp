@@ -3,15 +3,25 @@
 //
 //     c++ -std=c++17 -pthread bands.cpp $(pkg-config --cflags --libs quillon)
 #include <quillon/raster.h>
+#include <quillon/version.h>
 
 #include <algorithm>
 #include <chrono>
 #include <cstdio>
 #include <cstdlib>
+#include <string_view>
 #include <thread>
 #include <vector>
 
 namespace {
+
+constexpr char kHelp[] =
+    "usage: bands [THREADS]\n"
+    "\n"
+    "Converts a frame of 3840 by 2160 pixels by 1, 2, ... THREADS threads, as many as there are\n"
+    "cores unless told, and prints what each number is worth.\n"
+    "\n"
+    "  --help, --version   show this text; show the version\n";
 
 constexpr uint32_t kWidth = 3840, kHeight = 2160;
 constexpr int32_t kFrameStride = kWidth * 2, kScreenStride = kWidth * 4;
@@ -55,7 +65,14 @@ double shortest(Work work) {
 } // namespace
 
 int main(int argc, char **argv) {
-    const int given = argc > 1 ? std::atoi(argv[1]) : 0;
+    const std::string_view option = argc == 2 ? argv[1] : "";
+    if (option == "--help")
+        return std::fputs(kHelp, stdout) < 0;
+    if (option == "--version")
+        return std::puts("bands " QUILLON_VERSION_STRING) < 0;
+    const int given = argc == 2 ? std::atoi(argv[1]) : 0;
+    if (argc > 2 || (argc == 2 && given < 1))
+        return std::fputs(kHelp, stderr), 2;
     const uint32_t most = given > 0 ? static_cast<uint32_t>(given)
                                     : std::max(1u, std::thread::hardware_concurrency());
     std::vector<uint8_t> frame(size_t{kFrameStride} * kHeight);

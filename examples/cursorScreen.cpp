@@ -5,6 +5,7 @@
 //     ./a.out SHEET.png
 #include <quillon/imageUtil.h>
 #include <quillon/raster.h>
+#include <quillon/version.h>
 
 #include <algorithm>
 #include <array>
@@ -13,6 +14,13 @@
 #include <vector>
 
 namespace {
+
+constexpr char kHelp[] =
+    "usage: cursorScreen SHEET.png\n"
+    "\n"
+    "Moves two cursors over a screen and its edges, and writes what was to be seen at some stops.\n"
+    "\n"
+    "  --help, --version   show this text; show the version\n";
 
 // A surface of 32-bit pixels whose rows lie end to end.
 struct Surface {
@@ -96,6 +104,13 @@ void moveCursor(Surface &screen, const RasterCursor &cursor, const RectPoint &po
 } // namespace
 
 int main(int argc, char **argv) {
+    const std::string_view option = argc == 2 ? argv[1] : "";
+    if (option == "--help")
+        return std::fputs(kHelp, stdout) < 0;
+    if (option == "--version")
+        return std::puts("cursorScreen " QUILLON_VERSION_STRING) < 0;
+    if (argc != 2)
+        return std::fputs(kHelp, stderr), 2;
     Surface screen(128, 96);
     for (uint32_t x = 0; x < screen.width; x += 16) { // stripes, from blue to orange
         const uint32_t pixel = (0x20 + x * 3 / 2) << 16 | 0x60 << 8 | (0x90 - x);
@@ -135,8 +150,8 @@ int main(int argc, char **argv) {
     image.bpp = 32;
     image.bytesPerLine = sheet.width * 4;
     image.data = sheet.data();
-    if (argc != 2 || !ImageUtil_WriteImage(&image, argv[1], IMAGEUTIL_FORMAT_PNG)) {
-        std::fputs("cursorScreen: give the name of a PNG file that can be written\n", stderr);
+    if (!ImageUtil_WriteImage(&image, argv[1], IMAGEUTIL_FORMAT_PNG)) {
+        std::fprintf(stderr, "cursorScreen: %s cannot be written\n", argv[1]);
         return 1;
     }
     return 0;

@@ -3,13 +3,23 @@
 //
 //     c++ -std=c++17 damage.cpp $(pkg-config --cflags --libs quillon)
 #include <quillon/raster.h>
+#include <quillon/version.h>
 
 #include <algorithm>
 #include <cstdio>
 #include <random>
+#include <string_view>
 #include <vector>
 
 namespace {
+
+constexpr char kHelp[] =
+    "usage: damage\n"
+    "\n"
+    "Keeps a 32-bit screen up to date with a 16-bit one for 500 refreshes, and prints how many\n"
+    "pixels were converted instead of all.\n"
+    "\n"
+    "  --help, --version   show this text; show the version\n";
 
 constexpr int32_t kWidth = 640, kHeight = 400;
 constexpr int32_t kClientStep = kWidth * 2, kScreenStep = kWidth * 4;
@@ -89,7 +99,14 @@ void refresh(DamagedScreen &s) {
 
 } // namespace
 
-int main() {
+int main(int argc, char **argv) {
+    const std::string_view option = argc == 2 ? argv[1] : "";
+    if (option == "--help")
+        return std::fputs(kHelp, stdout) < 0;
+    if (option == "--version")
+        return std::puts("damage " QUILLON_VERSION_STRING) < 0;
+    if (argc != 1)
+        return std::fputs(kHelp, stderr), 2;
     constexpr int kRefreshes = 500;
     DamagedScreen s;
     convert(s, {0, 0, kWidth, kHeight}); // from here on the screen is true

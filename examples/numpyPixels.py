@@ -4,8 +4,8 @@
 
 Reads a picture, fills a strip of it, darkens its middle by a blend, and writes it.
 """
+import argparse
 import ctypes
-import sys
 
 import numpy
 
@@ -93,7 +93,12 @@ def write(pixels, name):
 
 
 def main():
-    picture = read(sys.argv[1])
+    parser = argparse.ArgumentParser(description=__doc__.splitlines()[0])
+    parser.add_argument("input", metavar="IN.png")
+    parser.add_argument("output", metavar="OUT.png")
+    parser.add_argument("--version", action="version", version="%(prog)s for libquillon 1")
+    files = parser.parse_args()
+    picture = read(files.input)
     height, width, _ = picture.shape
     # A part of an array is a surface too.
     middle = picture[height // 4:height - height // 4, width // 4:width - width // 4]
@@ -101,7 +106,7 @@ def main():
     shade[..., 3] = 128
     blend(middle, 0, 0, shade)
     fill(picture, 0xFF2F6690, 0, 0, width, height // 8)
-    write(picture, sys.argv[2])
+    write(picture, files.output)
 
 
 if __name__ == "__main__":

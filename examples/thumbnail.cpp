@@ -121,8 +121,7 @@ std::optional<Request> parseArguments(int argc, char **argv) {
             std::fputs(kUsage, stdout);
             return std::nullopt;
         case 'v':
-            std::printf("quillon-thumbnail %d.%d.%d\n", QUILLON_VERSION_MAJOR,
-                        QUILLON_VERSION_MINOR, QUILLON_VERSION_PATCH);
+            std::puts("quillon-thumbnail " QUILLON_VERSION_STRING);
             return std::nullopt;
         default:
             throw std::runtime_error(std::string(argv[optind - 1]) +

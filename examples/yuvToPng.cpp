@@ -22,6 +22,13 @@
 
 namespace {
 
+constexpr char kHelp[] =
+    "usage: yuvToPng IN.yuv WIDTH HEIGHT FORMAT OUT.png\n"
+    "\n"
+    "Turns one raw video frame into a picture.  FORMAT is I420 (yuv420p of ffmpeg), YV12, NV12,\n"
+    "YUY2, UYVY, YVYU or VYUY.\n"
+    "\n"
+    "  --help, --version   show this text; show the version\n";
 constexpr char kFormatNames[] = "I420, YV12, NV12, YUY2, UYVY, YVYU or VYUY";
 
 int32_t parseSide(const char *what, std::string_view text) {
@@ -83,11 +90,14 @@ void run(char **arguments) {
 } // namespace
 
 int main(int argc, char **argv) {
+    const std::string_view option = argc == 2 ? argv[1] : "";
+    if (option == "--help")
+        return std::fputs(kHelp, stdout) < 0;
+    if (option == "--version")
+        return std::puts("yuvToPng " QUILLON_VERSION_STRING) < 0;
+    if (argc != 6)
+        return std::fputs(kHelp, stderr), 2;
     try {
-        if (argc != 6)
-            throw std::runtime_error("usage: IN.yuv WIDTH HEIGHT FORMAT OUT.png, where FORMAT "
-                                     "is " +
-                                     std::string(kFormatNames));
         run(argv + 1);
         return 0;
     } catch (const std::exception &problem) {

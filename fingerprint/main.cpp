@@ -16,6 +16,8 @@
 #include "support/judge.h"
 #include "support/targets.h"
 
+#include <quillon/version.h>
+
 #include <cstdio>
 #include <cstdlib>
 #include <cstring>
@@ -25,6 +27,17 @@
 
 namespace quillon::fingerprint {
 namespace {
+
+constexpr char kHelp[] =
+    "usage: fingerprint [--long] [--target=NAME] [--targets]\n"
+    "\n"
+    "Prints a line for each family of functions: its name, how many calls, the CRC of what came\n"
+    "of them.\n"
+    "\n"
+    "  --long              twenty times as many calls\n"
+    "  --target=NAME       on one instruction set, such as AVX2\n"
+    "  --targets           list those that there are\n"
+    "  --help, --version   show this text; show the version\n";
 
 struct Family {
     const char *name;
@@ -115,10 +128,12 @@ int main(int argumentCount, char **arguments) {
         }
         if (argument == "--targets")
             return EXIT_SUCCESS;
-        if (!isKnown) {
-            fprintf(stderr, "Usage: fingerprint [--long] [--target=NAME] [--targets]\n");
-            return 2;
-        }
+        if (argument == "--help")
+            return fputs(fingerprint::kHelp, stdout) < 0;
+        if (argument == "--version")
+            return puts("fingerprint " QUILLON_VERSION_STRING) < 0;
+        if (!isKnown)
+            return fputs(fingerprint::kHelp, stderr), 2;
     }
     for (const fingerprint::Family &family : fingerprint::kFamilies)
         fingerprint::run(family, isLong);

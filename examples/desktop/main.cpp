@@ -159,7 +159,7 @@ int main(int argc, char **argv) {
         if (options.mode == desktop::Mode::kHelp)
             std::fputs(desktop::kHelp, stdout);
         else if (options.mode == desktop::Mode::kVersion)
-            std::printf("desktop of libquillon %s\n", desktop::kLibraryVersion.c_str());
+            std::puts("desktop " QUILLON_VERSION_STRING);
         else
             return desktop::runMode(options);
         return 0;

@@ -50,7 +50,7 @@ void Terminal::execute(const std::string &command) {
     if (name == "help") {
         print({{"about  colors  echo TEXT  seq N  clear", kYellow}});
     } else if (name == "about") {
-        print({{"libquillon ", kAccent}, {kLibraryVersion, kInk}});
+        print({{"libquillon ", kAccent}, {QUILLON_VERSION_STRING, kInk}});
         print({{"Every pixel here is drawn by it, in plain memory:", kFadedInk}});
         print({{"  text", kViolet}, {"     bits expanded to pixels"}});
         print({{"  scroll", kViolet}, {"   copies that overlap"}});

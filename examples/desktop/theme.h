@@ -52,10 +52,6 @@ constexpr Color translucent(Color color, uint8_t alpha) {
            (color.argb() >> 8 & 0xFF) * alpha / 255 << 8 | (color.argb() & 0xFF) * alpha / 255;
 }
 
-inline const std::string kLibraryVersion = std::to_string(QUILLON_VERSION_MAJOR) + "." +
-                                           std::to_string(QUILLON_VERSION_MINOR) + "." +
-                                           std::to_string(QUILLON_VERSION_PATCH);
-
 // A picture of a size, all transparent; throws std::bad_alloc.
 Image created(Size size);
 // A picture of another size; throws std::bad_alloc.

@@ -7,13 +7,23 @@
 // Rays go from the eye through the picture, against a landscape of noise, and are
 // thrown back once by the water.  Lengths are metres: x to the right, y up, z away.
 #include <quillon/imageUtil.h>
+#include <quillon/version.h>
 
 #include <algorithm>
 #include <cmath>
 #include <cstdint>
+#include <cstdio>
+#include <string_view>
 #include <vector>
 
 namespace {
+
+constexpr char kHelp[] =
+    "usage: lake FILE.png\n"
+    "\n"
+    "Draws lake.png, a landscape to judge scaling by.  It takes some minutes.\n"
+    "\n"
+    "  --help, --version   show this text; show the version\n";
 
 constexpr int kWidth = 1280;
 constexpr int kHeight = 853;
@@ -366,13 +376,20 @@ uint8_t toByte(float light) {
 } // namespace
 
 int main(int argc, char **argv) {
+    const std::string_view option = argc == 2 ? argv[1] : "";
+    if (option == "--help")
+        return std::fputs(kHelp, stdout) < 0;
+    if (option == "--version")
+        return std::puts("lake " QUILLON_VERSION_STRING) < 0;
     if (argc != 2)
-        return 2;
+        return std::fputs(kHelp, stderr), 2;
     std::vector<uint8_t> pixels;
     pixels.reserve(size_t{kWidth} * kHeight * 3);
     const std::vector<float> reeds = drawReeds();
 
     for (int y = 0; y < kHeight; ++y) {
+        if (y % 50 == 0)
+            std::fprintf(stderr, "row %d of %d\n", y, kHeight);
         for (int x = 0; x < kWidth; ++x) {
             Vec sum = {0, 0, 0};
             for (int sample = 0; sample < kSamples * kSamples; ++sample) {

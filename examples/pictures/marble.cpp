@@ -4,12 +4,21 @@
 //
 //     marble marble.png
 #include <quillon/imageUtil.h>
+#include <quillon/version.h>
 
 #include <algorithm>
 #include <cmath>
+#include <cstdio>
+#include <string_view>
 #include <vector>
 
 namespace {
+
+constexpr char kHelp[] = "usage: marble FILE.png\n"
+                         "\n"
+                         "Draws marble.png, a glass marble with a soft shadow.\n"
+                         "\n"
+                         "  --help, --version   show this text; show the version\n";
 
 constexpr int kSize = 256;
 constexpr float kRadius = 96;
@@ -78,8 +87,13 @@ uint8_t toByte(float channel) {
 } // namespace
 
 int main(int argc, char **argv) {
+    const std::string_view option = argc == 2 ? argv[1] : "";
+    if (option == "--help")
+        return std::fputs(kHelp, stdout) < 0;
+    if (option == "--version")
+        return std::puts("marble " QUILLON_VERSION_STRING) < 0;
     if (argc != 2)
-        return 2;
+        return std::fputs(kHelp, stderr), 2;
     std::vector<uint8_t> pixels;
     for (int y = 0; y < kSize; ++y) {
         for (int x = 0; x < kSize; ++x) {

@@ -19,6 +19,16 @@
 #define QUILLON_VERSION                                                                            \
     QUILLON_MAKE_VERSION(QUILLON_VERSION_MAJOR, QUILLON_VERSION_MINOR, QUILLON_VERSION_PATCH)
 
+/** The version of these headers as text, such as "1.0.0". */
+#define QUILLON_VERSION_STRING                                                                     \
+    QUILLON_TEXT_OF(QUILLON_VERSION_MAJOR)                                                         \
+    "." QUILLON_TEXT_OF(QUILLON_VERSION_MINOR) "." QUILLON_TEXT_OF(QUILLON_VERSION_PATCH)
+
+/** @cond */
+#define QUILLON_TEXT_OF(number) QUILLON_TEXT(number)
+#define QUILLON_TEXT(number) #number
+/** @endcond */
+
 /** True when these headers are of the given version, or of a later one with the same major
  * version.  Works in the preprocessor:
  *
