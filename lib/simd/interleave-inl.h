@@ -107,6 +107,27 @@ HWY_INLINE void storeInterleaved(D d, hn::Vec<D> byte0, hn::Vec<D> byte1, hn::Ve
     access.store(d16, hn::InterleaveUpper(d16, lowHalves2, highHalves2), dst + 3 * n);
 }
 
+// The same, of two blocks each whose quads come in QuadOrder::kNarrowed: to store every
+// block by itself is cheaper than to bring quads across blocks.
+template <class Access, class D>
+HWY_INLINE void storeInterleavedByBlocks(D d, hn::Vec<D> byte0, hn::Vec<D> byte1, hn::Vec<D> byte2,
+                                         hn::Vec<D> byte3, uint8_t *dst, Access access) {
+    static_assert(kBytesOf<D> == 32);
+    const hn::Repartition<uint16_t, D> d16;
+    const hn::Half<decltype(d16)> block;
+    const auto storeBlocks = [&](hn::Vec<decltype(d16)> pixels, size_t at) HWY_ATTR {
+        access.store(block, hn::LowerHalf(block, pixels), dst + at);
+        access.store(block, hn::UpperHalf(block, pixels), dst + at + 32);
+    };
+    const auto storePairs = [&](hn::Vec<D> lows, hn::Vec<D> highs, size_t at) HWY_ATTR {
+        const auto low = hn::BitCast(d16, lows), high = hn::BitCast(d16, highs);
+        storeBlocks(hn::InterleaveLower(d16, low, high), at);
+        storeBlocks(hn::InterleaveUpper(d16, low, high), at + 16);
+    };
+    storePairs(hn::InterleaveLower(d, byte0, byte1), hn::InterleaveLower(d, byte2, byte3), 0);
+    storePairs(hn::InterleaveUpper(d, byte0, byte1), hn::InterleaveUpper(d, byte2, byte3), 64);
+}
+
 // ---- Three bytes ----------------------------------------------------------
 
 // 16 pixels have three parts of 16 bytes each in memory.

@@ -184,6 +184,10 @@ HWY_INLINE void storePixels(D d, const FieldSums<V> &first, const FieldSums<V> &
         const hn::RebindToUnsigned<decltype(d16)> du16;
         access.store(du16, pixels16<kLayout>(d16, first), dst);
         access.store(du16, pixels16<kLayout>(d16, second), dst + kLanes<D>);
+    } else if constexpr (kBytes == 4 && kOrder == QuadOrder::kNarrowed && kBytesOf<D> == 32) {
+        storeInterleavedByBlocks(d, fieldBytes(d, first.low, second.low),
+                                 fieldBytes(d, first.mid, second.mid),
+                                 fieldBytes(d, first.high, second.high), hn::Zero(d), dst, access);
     } else {
         const auto field = [&](V firstSums, V secondSums) HWY_ATTR {
             return orderForStore<kBytes, kOrder>(d, fieldBytes(d, firstSums, secondSums));
