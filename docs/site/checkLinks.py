@@ -17,7 +17,7 @@ class Page(html.parser.HTMLParser):
     def handle_starttag(self, tag, attributes):
         attributes = dict(attributes)
         self.places |= {attributes.get("id"), attributes.get("name")}
-        for name in ("href", "src", "data"):
+        for name in ("href", "src", "srcset", "data"):
             if attributes.get(name):
                 self.links.append(attributes[name])
 

@@ -45,8 +45,8 @@ pre { margin: .9rem 0 0; padding: .75rem 1rem; overflow-x: auto; font-size: .875
 </style>
 <main>
 <h1>libquillon: a gallery</h1>
-<p>Every picture here was drawn by the library, the lettering in it too, by the lines of the
-<code>examples/gallery</code> that stand below it. A picture opens in its true size at a click.</p>
+<p>Every picture here was drawn by the library, the lettering in it too, by the lines
+of <code>examples/gallery</code> that stand below it. A picture opens in its true size at a click.</p>
 )";
 
 // Text as HTML, with what stands between backticks as code.

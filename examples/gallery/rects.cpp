@@ -105,7 +105,7 @@ void showScreens(Page &page) {
     outline(whole, screens[1], kBlue);
     outline(whole, damage, kOrange, 2);
     Sheet sheet(3);
-    sheet.add(std::move(whole), "two screens, and damage");
+    sheet.add(std::move(whole), "two screens, damage");
     for (const Rect &screen : screens) {
         //! [rectMap]
         Rect local, onDesktop;
