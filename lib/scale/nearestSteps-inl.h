@@ -41,13 +41,15 @@ struct FirstOfEachBody {
     }
 
 private:
-    // By vectors of every fourth pixel.
+    // By vectors of every second pixel.
     static HWY_INLINE void storeFirstOfEach2(const uint8_t *from, uint8_t *to) {
         const Widest<uint32_t> d;
-        hn::Vec<decltype(d)> first, second, third, fourth;
-        hn::LoadInterleaved4(d, reinterpret_cast<const uint32_t *>(from), first, second, third,
-                             fourth);
-        hn::StoreInterleaved2(first, third, d, reinterpret_cast<uint32_t *>(to));
+        hn::Vec<decltype(d)> low, high, other;
+        hn::LoadInterleaved2(d, reinterpret_cast<const uint32_t *>(from), low, other);
+        hn::LoadInterleaved2(d, reinterpret_cast<const uint32_t *>(from) + 2 * kVectorPixels, high,
+                             other);
+        storeBytes(d, low, to);
+        storeBytes(d, high, to + kVectorBytes);
     }
 
     template <size_t kCount>

@@ -44,9 +44,10 @@ HWY_INLINE V inRegister(V v) {
 
 // Keeps the stores before it ahead of those after it in the code.  Processors write
 // two vectors to one cache line at once where their stores come one after the other,
-// and GCC takes any order.
+// and GCC takes any order.  Elsewhere two stores may become one instruction.
 HWY_INLINE void keepStoreOrder() {
-    asm volatile("" ::: "memory");
+    if constexpr (HWY_ARCH_X86)
+        asm volatile("" ::: "memory");
 }
 
 // Whole vectors at any address, through the caches.
