@@ -23,11 +23,11 @@ template <class D8>
 HWY_INLINE void copyWithoutFourth([[maybe_unused]] D8 d, const uint8_t *src, uint8_t *dst) {
 #if QUILLON_NEON
     // GCC would copy the vectors between a load of four and a store of three.
-    asm volatile("ld4 {v0.16b-v3.16b}, [%1]\n\t"
-                 "st3 {v0.16b-v2.16b}, [%0]"
-                 :
-                 : "r"(dst), "r"(src)
-                 : "v0", "v1", "v2", "v3", "memory");
+    asm("ld4 {v0.16b-v3.16b}, [%2]\n\t"
+        "st3 {v0.16b-v2.16b}, [%1]"
+        : "=m"(*reinterpret_cast<uint8_t(*)[48]>(dst))
+        : "r"(dst), "r"(src), "m"(*reinterpret_cast<const uint8_t(*)[64]>(src))
+        : "v0", "v1", "v2", "v3");
 #else
     hn::Vec<D8> first, second, third, fourth;
     hn::LoadInterleaved4(d, src, first, second, third, fourth);
