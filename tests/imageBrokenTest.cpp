@@ -116,6 +116,7 @@ struct Tally {
         ASSERT_EQ(isRead, isExpected) << shown(file);
         ASSERT_EQ(image.data == nullptr, expected.image.bytesPerLine == 0) << shown(file);
         if (image.data != nullptr) {
+            acceptStale(image.data, expected.pixels.size()); // rows that were not reached
             EXPECT_EQ(std::memcmp(image.data, expected.pixels.data(), expected.pixels.size()), 0)
                 << shown(file);
         }

@@ -114,6 +114,7 @@ void expectRecord(const ImageInfo &image, const PngPicture &picture, uint32_t fl
         return Color{at8Bits(2), at8Bits(1), at8Bits(0),
                      picture.hasAlpha() ? at8Bits(3) : uint8_t{255}};
     });
+    acceptStale(image.data, size_t{image.height} * image.bytesPerLine);
     for (uint32_t i = 0; i < image.height * image.bytesPerLine; ++i)
         EXPECT_TRUE(i % image.bytesPerLine < rowBytes || image.data[i] == kStale) << "padding";
 }

@@ -11,6 +11,7 @@
 #include <valgrind/memcheck.h>
 #else
 #define VALGRIND_MAKE_MEM_UNDEFINED(address, size) ((void)0)
+#define VALGRIND_MAKE_MEM_DEFINED(address, size) ((void)(address), (void)(size))
 #endif
 
 namespace quillon::test {
@@ -39,6 +40,10 @@ MemoryFault::MemoryFault(uint64_t n, bool ofHearth) : requestsLeft(n), isOfHeart
 
 MemoryFault::~MemoryFault() {
     current = nullptr;
+}
+
+void acceptStale(const void *bytes, size_t size) {
+    VALGRIND_MAKE_MEM_DEFINED(bytes, size);
 }
 
 } // namespace quillon::test

@@ -15,6 +15,10 @@ namespace quillon::test {
 
 inline constexpr uint8_t kStale = 0xA5;
 
+// Bytes of such a block are undefined to valgrind until they are written.  Has it take
+// these as they are, for a test of what nothing writes.
+void acceptStale(const void *bytes, size_t size);
+
 // UtilSafeMalloc0 gives null for more.
 inline size_t mostBytesPerBlock = SIZE_MAX;
 
