@@ -82,7 +82,7 @@ double geometricMean(const std::vector<double> &speeds) {
 // Mean, median and count.
 std::string averageText(const Results &results, Standing Result::*standing) {
     const std::vector<double> all = speeds(results, standing);
-    return all.empty() ? "| | |"
+    return all.empty() ? "| | | "
                        : text("| ", fixed(geometricMean(all), 2), " | ", fixed(median(all), 2),
                               " | ", all.size(), " ");
 }
