@@ -83,8 +83,8 @@ int main(int argc, char **argv) {
     const double alone = shortest([&] { show(whole, frame, 1); });
     for (uint32_t threads = 1; threads <= most; ++threads) {
         const double together = shortest([&] { show(screen, frame, threads); });
-        std::printf("%u threads: %.0f us, %.2f times as fast as one\n", threads, together,
-                    alone / together);
+        std::printf("%u thread%s: %.0f us, %.2f times as fast as one\n", threads,
+                    threads == 1 ? "" : "s", together, alone / together);
         if (screen != whole)
             return 1;
     }

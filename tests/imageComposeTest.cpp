@@ -104,7 +104,7 @@ TEST(Combine, LikeAPainter) {
 }
 
 TEST(Combine, NeverReadsOrWritesOutside) {
-    forEachCase(3000, [](Random &random) {
+    forEachCase(1000, [](Random &random) {
         const auto coordinate = [&] {
             return random.oneOf({kMin, kMin + 9, -9, 0, 5, kMax - 9, kMax});
         };
