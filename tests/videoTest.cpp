@@ -59,7 +59,7 @@ TEST(VideoAttributes, geometry) {
     using Numbers = std::vector<size_t>;
     size_t size = 1, pitches[] = {2, 3, 4}, offsets[] = {5, 6, 7};
     const auto geometry = [&](uint32_t format, uint32_t width, uint32_t height) {
-        EXPECT_TRUE(RasterComputeVideoAttributes(format, width, height, &size, pitches, offsets));
+        EXPECT_TRUE(layOutFrame(format, width, height, &size, pitches, offsets));
         return Numbers{size,       pitches[0], pitches[1], pitches[2],
                        offsets[0], offsets[1], offsets[2]};
     };
@@ -68,7 +68,7 @@ TEST(VideoAttributes, geometry) {
     constexpr size_t kRow = size_t{1} << 32;
     EXPECT_EQ(geometry(RASTER_VIDEO_YV12, UINT32_MAX, 3),
               (Numbers{6 * kRow, kRow, kRow / 2, kRow / 2, 0, 4 * kRow, 5 * kRow}));
-    EXPECT_TRUE(RasterComputeVideoAttributes(RASTER_VIDEO_UYVY, 2, 2, &size, nullptr, nullptr));
+    EXPECT_TRUE(layOutFrame(RASTER_VIDEO_UYVY, 2, 2, &size, nullptr, nullptr));
 }
 
 // Each message has a latch of its own; the depth is looked at first.
@@ -76,7 +76,7 @@ TEST(VideoMessages, comeOnce) {
     const FencedBuffer fence(1);
     size_t size = 1;
     for (const uint32_t format : {0xFFFFFFFEu, 0u}) {
-        EXPECT_FALSE(RasterComputeVideoAttributes(format, 5, 3, &size, nullptr, nullptr));
+        EXPECT_FALSE(layOutFrame(format, 5, 3, &size, nullptr, nullptr));
         EXPECT_EQ(size, 0u);
     }
     for (const auto &[format, depth] : std::vector<std::pair<uint32_t, int32_t>>{

@@ -25,8 +25,8 @@ static_assert(sizeof(void *) != 8 || sizeof(ImageUtilPngBuffer) == 24);
 namespace {
 
 // Writes the bytes of a buffer to a file; logs a failure.
-bool ImageUtilWriteBuf(const DynBuf *buffer, const char *fileName) {
-    constexpr char kFunction[] = "ImageUtilWriteBuf";
+bool writeBuffer(const DynBuf *buffer, const char *fileName) {
+    constexpr char kFunction[] = "ImageUtilWriteBuf"; // a fixed text of the interface
     FileIODescriptor file;
     FileIO_Invalidate(&file);
     int status = FileIO_Open(&file, fileName, FILEIO_ACCESS_WRITE, FILEIO_OPEN_CREATE);
@@ -74,7 +74,7 @@ bool ImageUtil_WriteImage(const ImageInfo *image, const char *fileName, uint32_t
         panicNotImplemented(kUnitImageUtil);
         return false;
     }
-    const bool isWritten = isEncoded && ImageUtilWriteBuf(&buffer, fileName);
+    const bool isWritten = isEncoded && writeBuffer(&buffer, fileName);
     DynBuf_Destroy(&buffer);
     return isWritten;
 }
@@ -82,8 +82,8 @@ bool ImageUtil_WriteImage(const ImageInfo *image, const char *fileName, uint32_t
 bool ImageUtil_WritePNG(const ImageInfo *image, const char *fileName,
                         const ImageUtilPngOptions *options) {
     DynBuf buffer = {};
-    const bool isWritten = ImageUtil_ConstructPNGBuffer(image, options, &buffer) &&
-                           ImageUtilWriteBuf(&buffer, fileName);
+    const bool isWritten =
+        ImageUtil_ConstructPNGBuffer(image, options, &buffer) && writeBuffer(&buffer, fileName);
     DynBuf_Destroy(&buffer);
     return isWritten;
 }

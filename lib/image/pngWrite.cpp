@@ -165,8 +165,8 @@ bool encode(PngWriter &writer) {
     return true;
 }
 
-bool ImageUtilEncodePNG(const ImageInfo *image, const ImageUtilPngOptions *options, void *ioPointer,
-                        png_rw_ptr writeFunction, const ImageUtilMemOps *memOps) {
+bool encodePng(const ImageInfo *image, const ImageUtilPngOptions *options, void *ioPointer,
+               png_rw_ptr writeFunction, const ImageUtilMemOps *memOps) {
     if (image == nullptr || !isReadable(*image))
         return false;
     PngWriter writer = {};
@@ -180,15 +180,15 @@ bool ImageUtilEncodePNG(const ImageInfo *image, const ImageUtilPngOptions *optio
     return isWritten;
 }
 
-void *ImageUtilDefaultAlloc(void * /*context*/, size_t size) {
+void *defaultAlloc(void * /*context*/, size_t size) {
     return std::malloc(size);
 }
 
-void ImageUtilDefaultFree(void * /*context*/, void *block) {
+void defaultFree(void * /*context*/, void *block) {
     std::free(block);
 }
 
-void *ImageUtilDefaultRealloc(void * /*context*/, void *block, size_t size) {
+void *defaultRealloc(void * /*context*/, void *block, size_t size) {
     return std::realloc(block, size);
 }
 
@@ -217,9 +217,8 @@ bool ImageUtil_ConstructPNGBuffer(const ImageInfo *image, const ImageUtilPngOpti
     if (buffer == nullptr || image == nullptr)
         return false;
     DynBuf_Init(buffer);
-    const ImageUtilMemOps memOps = {nullptr, ImageUtilDefaultAlloc, ImageUtilDefaultFree,
-                                    ImageUtilDefaultRealloc};
-    if (!ImageUtilEncodePNG(image, options, buffer, ImageUtilDynBufWriteCallback, &memOps)) {
+    const ImageUtilMemOps memOps = {nullptr, defaultAlloc, defaultFree, defaultRealloc};
+    if (!encodePng(image, options, buffer, ImageUtilDynBufWriteCallback, &memOps)) {
         DynBuf_Destroy(buffer);
         return false;
     }
@@ -231,7 +230,7 @@ bool ImageUtil_ConstructPNGBufferWithMemOps(const ImageInfo *image,
                                             uint32_t *outSize, const ImageUtilMemOps *memOps) {
     ImageUtilPngBuffer buffer = {};
     buffer.memOps = memOps;
-    if (!ImageUtilEncodePNG(image, options, &buffer, ImageUtilBufferWriteCallback, memOps)) {
+    if (!encodePng(image, options, &buffer, ImageUtilBufferWriteCallback, memOps)) {
         *outSize = 0;
         memOps->free(memOps->context, buffer.data);
         return false;

@@ -13,16 +13,16 @@ struct RowEdges {
     int32_t rows[2 * kMaxBoxes];
 };
 
-struct RasterRectSpan {
+struct Span {
     int32_t left;
     int32_t right;
     bool matched; // an open entry of the result continues in this span
 };
 
 // The spans of one row, ascending; they neither overlap nor touch.
-struct RasterRectBand {
+struct Band {
     int count = 0;
-    RasterRectSpan spans[kMaxBoxes];
+    Span spans[kMaxBoxes];
 
     // Replaces the spans first to last - 1, which may be none, by one.
     void replace(int first, int last, int32_t left, int32_t right) {
@@ -42,7 +42,7 @@ struct RasterRectBand {
     }
 };
 
-void RasterInsertEdge(int32_t row, RowEdges &edges) {
+void insertEdge(int32_t row, RowEdges &edges) {
     int32_t *const end = edges.rows + edges.count;
     int32_t *const place = std::lower_bound(edges.rows, end, row);
     if (place != end && *place == row)
@@ -53,7 +53,7 @@ void RasterInsertEdge(int32_t row, RowEdges &edges) {
 }
 
 // Merges the columns of the boxes in row y to spans.
-void RasterBuildBand(int32_t y, const ListBoxes &list, RasterRectBand &band) {
+void buildBand(int32_t y, const ListBoxes &list, Band &band) {
     for (const Rect &box : list) {
         if (isEmpty(box) || y < box.top || y >= box.bottom)
             continue;
@@ -74,9 +74,9 @@ void RasterBuildBand(int32_t y, const ListBoxes &list, RasterRectBand &band) {
 
 // Removes the columns of the cut.  Gives false when a span has to be split with all
 // slots in use.
-bool cutBand(const Rect &cut, RasterRectBand &band) {
+bool cutBand(const Rect &cut, Band &band) {
     for (int i = 0; i < band.count && band.spans[i].left < cut.right;) {
-        RasterRectSpan &span = band.spans[i];
+        Span &span = band.spans[i];
         const int32_t end = span.right;
         if (end <= cut.left) {
             ++i;
@@ -102,13 +102,13 @@ bool cutBand(const Rect &cut, RasterRectBand &band) {
 // Continues the open entries of the result in the spans with their columns, closes
 // the others at row y, and opens an entry for each span that is left.  An entry is
 // open while its height is 0.  Gives false when there is no slot for a span.
-bool RasterCommitBand(int32_t y, ListBoxes &result, RasterRectBand &band) {
-    RasterRectSpan *const end = band.spans + band.count;
+bool commitBand(int32_t y, ListBoxes &result, Band &band) {
+    Span *const end = band.spans + band.count;
     for (int i = 0; i < result.count; ++i) {
         Rect &entry = result.boxes[i];
         if (entry.bottom != entry.top)
             continue;
-        RasterRectSpan *const span = std::find_if(band.spans, end, [&](const RasterRectSpan &s) {
+        Span *const span = std::find_if(band.spans, end, [&](const Span &s) {
             return s.left == entry.left && s.right == entry.right;
         });
         if (span != end)
@@ -116,7 +116,7 @@ bool RasterCommitBand(int32_t y, ListBoxes &result, RasterRectBand &band) {
         else
             entry.bottom = y;
     }
-    for (const RasterRectSpan *span = band.spans; span != end; ++span) {
+    for (const Span *span = band.spans; span != end; ++span) {
         if (span->matched)
             continue;
         if (result.count == kMaxEntries)
@@ -131,20 +131,20 @@ bool RasterCommitBand(int32_t y, ListBoxes &result, RasterRectBand &band) {
 bool sweepBoxes(const ListBoxes &list, const Rect *cut, ListBoxes &result) {
     RowEdges edges;
     for (const Rect &box : list) {
-        RasterInsertEdge(box.top, edges);
-        RasterInsertEdge(box.bottom, edges);
+        insertEdge(box.top, edges);
+        insertEdge(box.bottom, edges);
     }
     if (cut != nullptr) {
-        RasterInsertEdge(cut->top, edges);
-        RasterInsertEdge(cut->bottom, edges);
+        insertEdge(cut->top, edges);
+        insertEdge(cut->bottom, edges);
     }
     for (int i = 0; i < edges.count; ++i) {
         const int32_t y = edges.rows[i];
-        RasterRectBand band;
-        RasterBuildBand(y, list, band);
+        Band band;
+        buildBand(y, list, band);
         if (cut != nullptr && cut->top <= y && y < cut->bottom && !cutBand(*cut, band))
             return false;
-        if (!RasterCommitBand(y, result, band))
+        if (!commitBand(y, result, band))
             return false;
     }
     return std::all_of(result.begin(), result.end(), isStorable);

@@ -15,8 +15,8 @@ size_t roundedUpToEven(uint32_t extent) {
 
 } // namespace
 
-bool RasterComputeVideoAttributes(uint32_t format, uint32_t width, uint32_t height, size_t *size,
-                                  size_t *pitches, size_t *offsets) {
+bool layOutFrame(uint32_t format, uint32_t width, uint32_t height, size_t *size, size_t *pitches,
+                 size_t *offsets) {
     if (offsets != nullptr)
         offsets[0] = 0;
 
@@ -43,7 +43,7 @@ bool RasterComputeVideoAttributes(uint32_t format, uint32_t width, uint32_t heig
     }
     default:
         *size = 0;
-        if (attributesLatch.firstTime())
+        if (attributesLatch.firstTime()) // the message is a fixed text of the interface
             Log("%s: format :%u not supported.\n", "RasterComputeVideoAttributes", format);
         return false;
     }

@@ -15,7 +15,7 @@ namespace quillon {
 //
 // For an unknown format the result is false and the size 0; the first one is
 // logged.
-bool RasterComputeVideoAttributes(uint32_t format, uint32_t width, uint32_t height, size_t *size,
-                                  size_t *pitches, size_t *offsets);
+bool layOutFrame(uint32_t format, uint32_t width, uint32_t height, size_t *size, size_t *pitches,
+                 size_t *offsets);
 
 } // namespace quillon

@@ -23,7 +23,7 @@ namespace quillon::HWY_NAMESPACE {
 #if QUILLON_HAS_VECTORS
 
 // One row, or two that share their chroma.
-template <RasterVideoPixelLayout kLayout, size_t kRows>
+template <VideoPixelLayout kLayout, size_t kRows>
 struct PlanarBody {
     static constexpr size_t kDstBytes = kLayout.bytesPerPixel;
     static constexpr size_t kUnitsPerGroup = 2;
@@ -98,7 +98,7 @@ private:
 };
 
 // Converts rows that are shorter than a chunk, by way of rows of its own.
-template <RasterVideoPixelLayout kLayout>
+template <VideoPixelLayout kLayout>
 class ShortRowsConverter {
 public:
     void operator()(const PlanarBody<kLayout, 2> &rows, size_t width) {
@@ -120,7 +120,7 @@ private:
 };
 
 // Together where both rows lie to cache lines alike.
-template <RasterVideoPixelLayout kLayout>
+template <VideoPixelLayout kLayout>
 void convertRowsNonTemporal(const PlanarBody<kLayout, 2> &rows, size_t width,
                             PrefetchDistance distance) {
     using Body = PlanarBody<kLayout, 2>;

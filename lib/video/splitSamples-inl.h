@@ -41,7 +41,7 @@ HWY_INLINE Halves<ChromaTerms<hn::Vec<D16>>> chromaTermsOf(D8 d, hn::Vec<D8> chr
 }
 
 // The bytes of the pixels of a vector of luma samples.
-template <RasterVideoPixelLayout kLayout, class D8, class V16>
+template <VideoPixelLayout kLayout, class D8, class V16>
 HWY_INLINE void pixelBytes(D8 d, hn::Vec<D8> luma, const Halves<ChromaTerms<V16>> &chroma,
                            hn::Vec<D8> (&bytes)[kLayout.bytesPerPixel]) {
     const hn::Repartition<int16_t, D8> d16;
@@ -83,7 +83,7 @@ HWY_INLINE void storePixelBytes(D8 d, const hn::Vec<D8> (&bytes)[kBytes], uint8_
 }
 
 // kMostPixels pixels.
-template <RasterVideoPixelLayout kLayout, class D8, class V16>
+template <VideoPixelLayout kLayout, class D8, class V16>
 HWY_INLINE void storeSplitPixels(D8 d, hn::Vec<D8> evenLuma, hn::Vec<D8> oddLuma,
                                  const Halves<ChromaTerms<V16>> &chroma, uint8_t *dst) {
     constexpr size_t kBytes = kLayout.bytesPerPixel;
@@ -99,7 +99,7 @@ HWY_INLINE void storeSplitPixels(D8 d, hn::Vec<D8> evenLuma, hn::Vec<D8> oddLuma
 }
 
 // kMostPixels pixels of an interleaved frame.
-template <VideoGroup kGroup, RasterVideoPixelLayout kLayout>
+template <VideoGroup kGroup, VideoPixelLayout kLayout>
 HWY_INLINE void convertSplitGroups(const uint8_t *src, uint8_t *dst) {
     const Widest<uint8_t> d;
     hn::Vec<decltype(d)> samples[4];

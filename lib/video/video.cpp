@@ -35,7 +35,7 @@ using namespace quillon;
 
 void Raster_YUVtoRGB(const uint8_t *srcBuffer, uint8_t *dstBuffer, uint32_t width, uint32_t height,
                      uint32_t format, int32_t bppdepth) {
-    const RasterVideoPixelLayout *layout = videoLayoutAt(bppdepth);
+    const VideoPixelLayout *layout = videoLayoutAt(bppdepth);
     if (layout == nullptr) {
         if (depthLatch.firstTime())
             Log("%s: bppdepth:%d not supported.\n", kYuvToRgb, bppdepth);
@@ -47,7 +47,7 @@ void Raster_YUVtoRGB(const uint8_t *srcBuffer, uint8_t *dstBuffer, uint32_t widt
         return;
     }
     size_t size = 0, pitches[3] = {}, offsets[3] = {};
-    if (!RasterComputeVideoAttributes(format, width, height, &size, pitches, offsets))
+    if (!layOutFrame(format, width, height, &size, pitches, offsets))
         return;
 
     // Pixels come in pairs; what is odd is left alone.

@@ -10,7 +10,7 @@ namespace quillon {
 // What a pixel made from a frame looks like.  Its three fields of 8 bits are cut
 // to their top bits and put together, the low one lowest; the low and the high
 // field have the same width.
-struct RasterVideoPixelLayout {
+struct VideoPixelLayout {
     uint8_t bytesPerPixel;
     uint8_t fieldShift; // bits cut off the low and the high field
     uint8_t midShift;   // and off the one between
@@ -26,7 +26,7 @@ struct RasterVideoPixelLayout {
 
 struct VideoDepth {
     int32_t bppdepth;
-    RasterVideoPixelLayout layout;
+    VideoPixelLayout layout;
 };
 inline constexpr VideoDepth kVideoDepths[] = {
     {15, {2, 3, 3, 5, 5, 1}},
@@ -36,7 +36,7 @@ inline constexpr VideoDepth kVideoDepths[] = {
 };
 
 // Null for a depth that there is not.
-constexpr const RasterVideoPixelLayout *videoLayoutAt(int32_t bppdepth) {
+constexpr const VideoPixelLayout *videoLayoutAt(int32_t bppdepth) {
     for (const VideoDepth &depth : kVideoDepths)
         if (depth.bppdepth == bppdepth)
             return &depth.layout;

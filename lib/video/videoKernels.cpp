@@ -26,7 +26,7 @@ namespace {
 
 // ---- Interleaved frames ---------------------------------------------------
 
-template <VideoGroup kGroup, RasterVideoPixelLayout kLayout>
+template <VideoGroup kGroup, VideoPixelLayout kLayout>
 struct InterleavedBody {
     static constexpr size_t kDstBytes = kLayout.bytesPerPixel;
     static constexpr size_t kUnitsPerGroup = 2;
@@ -50,7 +50,7 @@ struct InterleavedBody {
     }
 };
 
-template <VideoGroup kGroup, RasterVideoPixelLayout kLayout>
+template <VideoGroup kGroup, VideoPixelLayout kLayout>
 void convertFewInterleaved(uint8_t *dst, const uint8_t *src, size_t pixels) {
     uint8_t samples[2 * kLeastPixels] = {}, converted[kLayout.bytesPerPixel * kLeastPixels];
     const InterleavedBody<kGroup, kLayout> body = {converted, samples};
@@ -65,7 +65,7 @@ struct InterleavedFrame {
     const uint8_t *src;
     size_t pixels;
 
-    template <RasterVideoPixelLayout kLayout>
+    template <VideoPixelLayout kLayout>
     void convert() const {
         if (pixels < kLeastPixels)
             return convertFewInterleaved<kGroup, kLayout>(dst, src, pixels);
@@ -87,7 +87,7 @@ struct PlanarFrame {
     VideoPlanes src;
     Extent extent;
 
-    template <RasterVideoPixelLayout kLayout>
+    template <VideoPixelLayout kLayout>
     void convert() const {
         // A copy: for all the compiler knows, the stores of pixels change *this.
         const PlanarFrame frame = *this;
@@ -110,7 +110,7 @@ struct PlanarFrame {
     }
 
 private:
-    template <RasterVideoPixelLayout kLayout, class Use>
+    template <VideoPixelLayout kLayout, class Use>
     HWY_INLINE void forRowPairs(const Use &use) const {
         PlanarBody<kLayout, 2> rows = {dst.first,           src.luma.first, src.chromaHigh.first,
                                        src.chromaLow.first, dst.stride,     src.luma.stride};
@@ -132,7 +132,7 @@ struct InterleavedFrame {
     const uint8_t *src;
     size_t pixels;
 
-    template <RasterVideoPixelLayout kLayout>
+    template <VideoPixelLayout kLayout>
     void convert() const {
         for (size_t i = 0; i < pixels; i += 2) {
             const uint8_t *group = src + 2 * i;
@@ -148,7 +148,7 @@ struct PlanarFrame {
     const VideoPlanes &src;
     Extent extent;
 
-    template <RasterVideoPixelLayout kLayout>
+    template <VideoPixelLayout kLayout>
     void convert() const {
         for (size_t y = 0; y < extent.height; ++y)
             for (size_t x = 0; x < extent.width; x += 2)

@@ -10,7 +10,7 @@
 namespace quillon {
 
 // Two pixels that share their chroma.
-template <RasterVideoPixelLayout kLayout>
+template <VideoPixelLayout kLayout>
 void convertPair(uint8_t luma0, uint8_t luma1, uint8_t chromaLow, uint8_t chromaHigh,
                  uint8_t *dst) {
     const auto clamped = [](int32_t field) {

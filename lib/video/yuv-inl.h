@@ -148,7 +148,7 @@ HWY_INLINE hn::Vec<D> topBitsAt(D d, hn::Vec<D> field) {
 }
 
 // Pixels of two bytes.
-template <RasterVideoPixelLayout kLayout, class D16, class D = hn::RebindToUnsigned<D16>>
+template <VideoPixelLayout kLayout, class D16, class D = hn::RebindToUnsigned<D16>>
 HWY_INLINE hn::Vec<D> pixels16(D16 /*d16*/, const FieldSums<hn::Vec<D16>> &sums) {
     constexpr int kLowAt = kLayout.finalShift;
     constexpr int kMidAt = kLowAt + kLayout.lowBits;
@@ -175,7 +175,7 @@ HWY_INLINE hn::Vec<D> fieldBytes(D d, V first, V second) {
 
 // As many pixels as d has bytes, from their sums in two vectors, whose quads come
 // in kOrder once they are bytes.
-template <RasterVideoPixelLayout kLayout, QuadOrder kOrder, class D, class V, class Access>
+template <VideoPixelLayout kLayout, QuadOrder kOrder, class D, class V, class Access>
 HWY_INLINE void storePixels(D d, const FieldSums<V> &first, const FieldSums<V> &second,
                             uint8_t *dst, Access access) {
     constexpr size_t kBytes = kLayout.bytesPerPixel;
