@@ -126,9 +126,9 @@ struct ShortSpansBody {
 // between whole.  The last source pixel enters no sum; what would begin there is a
 // copy of it.  Lanes of sums are of type T (see SpanSums).
 template <class T>
-class RasterScaleRowBox {
+class BoxRow {
 public:
-    explicit RasterScaleRowBox(const ScaleAxis &axis)
+    explicit BoxRow(const ScaleAxis &axis)
         : axis_(axis),
           inner_(std::min(stepsBefore(axis.start, axis.lastPosition(), axis.step), axis.dstSize)) {}
 

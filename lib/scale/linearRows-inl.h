@@ -47,9 +47,9 @@ struct LinearBody {
 
 // Copies of the first pixel while positions are negative, blends, and copies of the
 // last pixel.
-class RasterScaleRowLinear {
+class LinearRow {
 public:
-    explicit RasterScaleRowLinear(const ScaleAxis &axis)
+    explicit LinearRow(const ScaleAxis &axis)
         : step_(axis.step), srcSize_(axis.srcSize), leading_(0) {
         const bool isNegative = axis.start >> 31 != 0;
         if (isNegative)

@@ -28,9 +28,9 @@ namespace {
 // Each pixel is the source pixel of its position, or the last one where the position
 // lies behind that.  Kinds of rows differ in how positions advance; the kind is
 // chosen once for all rows.
-class RasterScaleRowNearest {
+class NearestRow {
 public:
-    explicit RasterScaleRowNearest(const ScaleAxis &axis)
+    explicit NearestRow(const ScaleAxis &axis)
         : start_(axis.start), step_(axis.step), srcSize_(axis.srcSize), count_(axis.dstSize),
           inner_(std::min(stepsBefore(axis.start, axis.lastPosition(), axis.step), axis.dstSize)) {}
 
@@ -77,9 +77,9 @@ struct NearestGatherBody {
                 gather(d, table, hn::BitCast(hn::RebindToSigned<PixelTag<C>>(), index));
             access.store(d, pixels, dst + 4 * i);
         } else {
-            // Read before they are written: the compiler cannot know that the rows do
-            // not overlap.
-            // The index in the upper half of 64 bits: one instruction less for each.
+            // All are read before any is written, as the compiler cannot know that the
+            // rows do not overlap.  The index stands in the upper half of 64 bits: one
+            // instruction less for each.
             uint32_t pixels[C::kUnits];
             uint64_t position = uint64_t{first} << 16;
             for (uint32_t &pixel : pixels) {
@@ -93,8 +93,8 @@ struct NearestGatherBody {
 };
 
 template <class Access>
-struct NearestGathered : RasterScaleRowNearest {
-    using RasterScaleRowNearest::RasterScaleRowNearest;
+struct NearestGathered : NearestRow {
+    using NearestRow::NearestRow;
 
     HWY_INLINE void operator()(uint8_t *dst, const uint8_t *src) const {
         const NearestGatherBody body = {dst, src, start_, step_};
@@ -108,8 +108,8 @@ struct NearestGathered : RasterScaleRowNearest {
 
 // ---- Steps of one pixel, and of a half ------------------------------------
 
-struct NearestCopied : RasterScaleRowNearest {
-    using RasterScaleRowNearest::RasterScaleRowNearest;
+struct NearestCopied : NearestRow {
+    using NearestRow::NearestRow;
 
     HWY_INLINE void operator()(uint8_t *dst, const uint8_t *src) const {
         std::memcpy(dst, src + size_t{4} * (start_ >> 16), size_t{4} * inner_);
@@ -199,7 +199,7 @@ struct NearestToEndBody {
     }
 };
 
-template <uint32_t kWindows, class Access>
+template <class Access, uint32_t kWindows>
 class NearestPicked {
 public:
     explicit NearestPicked(const ScaleAxis &axis)

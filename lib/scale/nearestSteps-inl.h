@@ -15,6 +15,7 @@
 #include "scale/nearestRows-inl.h"
 
 #include <algorithm>
+#include <bit>
 
 HWY_BEFORE_NAMESPACE();
 namespace quillon::HWY_NAMESPACE {
@@ -73,10 +74,10 @@ private:
     }
 };
 
-template <uint32_t kLog2Step, class Access>
-struct NearestFirstOfEach : RasterScaleRowNearest {
+template <class Access, uint32_t kStep>
+struct NearestFirstOfEach : NearestRow {
     explicit NearestFirstOfEach(const ScaleAxis &axis)
-        : RasterScaleRowNearest(axis), first_(axis.start >> 16),
+        : NearestRow(axis), first_(axis.start >> 16),
           whole_(std::min((axis.srcSize - std::min(first_, axis.srcSize)) >> kLog2Step,
                           axis.dstSize)) {}
 
@@ -90,6 +91,8 @@ struct NearestFirstOfEach : RasterScaleRowNearest {
     }
 
 private:
+    static constexpr uint32_t kLog2Step = std::countr_zero(kStep);
+
     HWY_INLINE void walk(const FirstOfEachBody<kLog2Step> &body) const {
         constexpr size_t kUnits = kLog2Step == 1 ? 2 * kVectorPixels : kVectorPixels;
         if (kHasInterleavedAccess && whole_ >= kUnits)

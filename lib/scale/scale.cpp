@@ -65,13 +65,13 @@ ScaleAxis makeAxis(double scale, bool isFiltered, int32_t first, int32_t end, ui
 bool scaleRect(const ScaleJob &job) {
     const ScaleCacheShape shape(job);
     if (shape.slotCount == 0) {
-        RasterScaleRect(job, nullptr);
+        scaleRows(job, nullptr);
         return true;
     }
     void *cache = UtilSafeMalloc0(shape.bytes());
     if (cache == nullptr)
         return false;
-    RasterScaleRect(job, cache);
+    scaleRows(job, cache);
     std::free(cache);
     return true;
 }

@@ -31,7 +31,7 @@ struct ScaleTap {
 inline constexpr size_t kScaleMaxTaps = 32;
 
 // A source row after the horizontal pass.
-struct RasterScaleRowSlot {
+struct ScaleCacheSlot {
     uint8_t *pixels;
     uint32_t rowIndex;
 };
@@ -57,12 +57,12 @@ struct ScaleCacheShape {
 
     // The slots, and behind them, aligned, their rows.
     size_t bytes() const {
-        return slotCount * (sizeof(RasterScaleRowSlot) + rowBytes) + kAlignment - 1;
+        return slotCount * (sizeof(ScaleCacheSlot) + rowBytes) + kAlignment - 1;
     }
 };
 
 // Writes the rectangle.  cache is a block of ScaleCacheShape(job).bytes() bytes,
 // null where there are no slots.
-void RasterScaleRect(const ScaleJob &job, void *cache);
+void scaleRows(const ScaleJob &job, void *cache);
 
 } // namespace quillon

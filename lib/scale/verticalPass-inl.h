@@ -1,8 +1,5 @@
-// The vertical pass of the scaler: the walks over the destination rows, which fetch
-// source rows after the horizontal pass and blend or average them.
-//
-// A Row is a function object (uint8_t *dst, const uint8_t *src) that makes the
-// horizontal pass over one source row.
+// The vertical pass of the scaler: source rows after the horizontal pass are kept, and
+// blended or averaged.
 //
 // Included once per instruction set; the usual guards do not apply.
 
@@ -22,7 +19,6 @@
 #include "simd/thresholds.h"
 
 #include <algorithm>
-#include <cstring>
 
 HWY_BEFORE_NAMESPACE();
 namespace quillon::HWY_NAMESPACE {
@@ -122,13 +118,13 @@ HWY_INLINE uint32_t rowOf(const ScaleAxis &axis, uint32_t position) {
     return isAbove ? 0 : std::min(position >> 16, axis.srcSize - 1);
 }
 
-// The source rows that neighbouring destination rows share, after the horizontal
-// pass.
+// The source rows that neighbouring destination rows share, after the horizontal pass,
+// which row(uint8_t *dst, const uint8_t *src) makes.
 template <class Row>
 class RowCache {
 public:
     RowCache(const ScaleJob &job, const Row &row, void *block)
-        : axis_(job.y), src_(job.src), row_(row), slots_(static_cast<RasterScaleRowSlot *>(block)) {
+        : axis_(job.y), src_(job.src), row_(row), slots_(static_cast<ScaleCacheSlot *>(block)) {
         const ScaleCacheShape shape(job);
         mask_ = static_cast<uint32_t>(shape.slotCount - 2);
         const auto behindSlots = reinterpret_cast<uintptr_t>(slots_ + shape.slotCount);
@@ -140,7 +136,7 @@ public:
 
     HWY_INLINE const uint8_t *fetch(uint32_t position) const {
         const uint32_t index = rowOf(axis_, position);
-        RasterScaleRowSlot &slot = slots_[index == 0 ? 0 : 1 + (index & mask_)];
+        ScaleCacheSlot &slot = slots_[index == 0 ? 0 : 1 + (index & mask_)];
         if (slot.rowIndex != index) {
             slot.rowIndex = index;
             row_(slot.pixels, src_.row(index));
@@ -152,100 +148,9 @@ private:
     ScaleAxis axis_;
     SrcRows src_;
     const Row &row_;
-    RasterScaleRowSlot *slots_;
+    ScaleCacheSlot *slots_;
     uint32_t mask_; // slotCount - 2: the divisor is a power of two
 };
-
-// ---- Walks ----------------------------------------------------------------
-
-// Each destination row is a source row, without a cache.  With kCopiesRepeats, a row
-// that comes again is copied from the destination row before.
-template <bool kCopiesRepeats, class Row>
-HWY_INLINE void walkDirect(const ScaleJob &job, const Row &row) {
-    const ByteExtent extent = job.dstExtent();
-    const auto stride = static_cast<uint64_t>(job.dst.stride);
-    uint8_t *dst = job.dst.first;
-    uint32_t y = job.y.start;
-    uint32_t previous = kScaleNoRow;
-    for (size_t i = 0; i < extent.height; ++i, y += job.y.step) {
-        const uint32_t index = rowOf(job.y, y);
-        if (kCopiesRepeats && index == previous)
-            std::memmove(dst, advance(dst, -stride), extent.rowBytes); // rows may overlap
-        else
-            row(dst, job.src.row(index));
-        previous = index;
-        dst = advance(dst, stride);
-    }
-}
-
-// Each destination row is a blend of two source rows, with weights that sum to 255;
-// at the edges both can be the same row.
-template <class Row>
-HWY_INLINE void walkLinear(const ScaleJob &job, const Row &row, void *block) {
-    const RowCache<Row> cache(job, row, block);
-    const RowMixer mixer(job);
-    const auto stride = static_cast<uint64_t>(job.dst.stride);
-    uint8_t *dst = job.dst.first;
-    uint32_t y = job.y.start;
-    for (size_t i = 0; i < job.y.dstSize; ++i, y += job.y.step) {
-        const uint8_t *upper = cache.fetch(y);
-        const uint8_t *lower = cache.fetch(y + kScaleOne);
-        mixer.blend(dst, upper, lower, (y & 0xFFFF) >> 8);
-        dst = advance(dst, stride);
-    }
-}
-
-// Each destination row is the average of the source rows that the step covers, or of
-// the first 32 of them.  A row that is covered whole has the weight 255.
-template <class Row>
-HWY_INLINE void walkBox(const ScaleJob &job, const Row &row, void *block) {
-    const RowCache<Row> cache(job, row, block);
-    const RowMixer mixer(job);
-    const auto stride = static_cast<uint64_t>(job.dst.stride);
-    uint8_t *dst = job.dst.first;
-    uint32_t y = job.y.start;
-    for (size_t i = 0; i < job.y.dstSize; ++i, y += job.y.step) {
-        ScaleTap taps[kScaleMaxTaps];
-        size_t tapCount = 0;
-        uint32_t position = y;
-        uint32_t remaining = job.y.step;
-        while (remaining != 0 && tapCount < kScaleMaxTaps) {
-            const uint32_t toNext = kScaleOne - (position & 0xFFFF);
-            const uint32_t covered = std::min(toNext, remaining);
-            const uint32_t weight = std::min<uint32_t>(covered >> 8, 255);
-            taps[tapCount++] = {cache.fetch(position), weight};
-            position += covered;
-            remaining -= covered;
-        }
-        mixer.average(dst, taps, tapCount);
-        dst = advance(dst, stride);
-    }
-}
-
-template <class Row>
-void walkRows(const ScaleJob &job, const Row &row, void *block) {
-    switch (job.y.method) {
-    case ScaleMethod::kNearest:
-        return walkDirect<true>(job, row);
-    case ScaleMethod::kLinear:
-        return walkLinear(job, row, block);
-    case ScaleMethod::kBox:
-        return walkBox(job, row, block);
-    }
-}
-
-// Each destination row is made of two source rows at once: row is called with
-// (uint8_t *dst, const uint8_t *upper, const uint8_t *lower).
-template <class RowOfTwo>
-HWY_INLINE void walkPairs(const ScaleJob &job, const RowOfTwo &row) {
-    const auto stride = static_cast<uint64_t>(job.dst.stride);
-    uint8_t *dst = job.dst.first;
-    uint32_t y = job.y.start;
-    for (size_t i = 0; i < job.y.dstSize; ++i, y += job.y.step) {
-        row(dst, job.src.row(rowOf(job.y, y)), job.src.row(rowOf(job.y, y + kScaleOne)));
-        dst = advance(dst, stride);
-    }
-}
 
 } // namespace
 } // namespace quillon::HWY_NAMESPACE
