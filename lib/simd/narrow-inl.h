@@ -19,47 +19,6 @@ HWY_BEFORE_NAMESPACE();
 namespace quillon::HWY_NAMESPACE {
 #if QUILLON_HAS_VECTORS
 
-// ---- Intrinsics by size of vector -----------------------------------------
-
-namespace detail {
-
-// pack...: the lanes of a block of a, then those of the same block of b, saturated.
-#if QUILLON_X86_SSSE3
-HWY_INLINE __m128i packSigned16(__m128i a, __m128i b) {
-    return _mm_packs_epi16(a, b);
-}
-#endif
-#if QUILLON_X86_AVX2
-HWY_INLINE __m256i packSigned16(__m256i a, __m256i b) {
-    return _mm256_packs_epi16(a, b);
-}
-HWY_INLINE __m128i packUnsigned32(__m128i a, __m128i b) {
-    return _mm_packus_epi32(a, b);
-}
-HWY_INLINE __m256i packUnsigned32(__m256i a, __m256i b) {
-    return _mm256_packus_epi32(a, b);
-}
-HWY_INLINE __m128i packUnsigned16(__m128i a, __m128i b) {
-    return _mm_packus_epi16(a, b);
-}
-HWY_INLINE __m256i packUnsigned16(__m256i a, __m256i b) {
-    return _mm256_packus_epi16(a, b);
-}
-#endif
-#if QUILLON_X86_AVX512
-HWY_INLINE __m512i packSigned16(__m512i a, __m512i b) {
-    return _mm512_packs_epi16(a, b);
-}
-HWY_INLINE __m512i packUnsigned32(__m512i a, __m512i b) {
-    return _mm512_packus_epi32(a, b);
-}
-HWY_INLINE __m512i packUnsigned16(__m512i a, __m512i b) {
-    return _mm512_packus_epi16(a, b);
-}
-#endif
-
-} // namespace detail
-
 // ---- Narrowing ------------------------------------------------------------
 
 // Signed 16-bit lanes to signed bytes, saturated.  Each block has the lanes of
@@ -68,7 +27,12 @@ template <class D8, class D16 = hn::Repartition<int16_t, D8>>
 HWY_INLINE hn::Vec<D8> narrowSaturated([[maybe_unused]] D8 d8, hn::Vec<D16> first,
                                        hn::Vec<D16> second) {
 #if QUILLON_X86_SSSE3
-    return hn::Vec<D8>{detail::packSigned16(first.raw, second.raw)};
+    if constexpr (kBytesOf<D8> == 64)
+        return hn::Vec<D8>{_mm512_packs_epi16(first.raw, second.raw)};
+    else if constexpr (kBytesOf<D8> == 32)
+        return hn::Vec<D8>{_mm256_packs_epi16(first.raw, second.raw)};
+    else
+        return hn::Vec<D8>{_mm_packs_epi16(first.raw, second.raw)};
 #else
     if constexpr (kBytesOf<D8> <= 16) {
         const hn::RebindToSigned<D8> signed8;
@@ -107,6 +71,27 @@ HWY_INLINE hn::Vec<D8> shiftAndNarrowSaturated(D8 d8, hn::Vec<D16> first, hn::Ve
 
 namespace detail {
 
+// The lanes of a block of a, then those of the same block of b, with unsigned saturation:
+// 32-bit lanes to 16 bits, and 16-bit lanes to 8.
+template <class D16, class V>
+HWY_INLINE hn::Vec<D16> pack32(D16 /*d16*/, V a, V b) {
+    if constexpr (kBytesOf<D16> == 64)
+        return hn::Vec<D16>{_mm512_packus_epi32(a.raw, b.raw)};
+    else if constexpr (kBytesOf<D16> == 32)
+        return hn::Vec<D16>{_mm256_packus_epi32(a.raw, b.raw)};
+    else
+        return hn::Vec<D16>{_mm_packus_epi32(a.raw, b.raw)};
+}
+template <class D8, class V>
+HWY_INLINE hn::Vec<D8> pack16(D8 /*d8*/, V a, V b) {
+    if constexpr (kBytesOf<D8> == 64)
+        return hn::Vec<D8>{_mm512_packus_epi16(a.raw, b.raw)};
+    else if constexpr (kBytesOf<D8> == 32)
+        return hn::Vec<D8>{_mm256_packus_epi16(a.raw, b.raw)};
+    else
+        return hn::Vec<D8>{_mm_packus_epi16(a.raw, b.raw)};
+}
+
 // Packing takes a piece of each vector in turn within a block.  These 32-bit
 // indices bring the pieces of the first vector in front.
 template <size_t kWords, size_t kVectors>
@@ -141,21 +126,21 @@ HWY_INLINE hn::Vec<D> inPackedOrder(D d, hn::Vec<D> packed) {
 // Two vectors of 32-bit lanes, of values that fit, to 16 bits.
 template <class D16, class V>
 HWY_INLINE hn::Vec<D16> narrowTo16(D16 d16, V a, V b) {
-    return detail::inPackedOrder<2>(d16, hn::Vec<D16>{detail::packUnsigned32(a.raw, b.raw)});
+    return detail::inPackedOrder<2>(d16, detail::pack32(d16, a, b));
 }
 
 // Two vectors of 16-bit lanes, of values that fit, to 8 bits.
 template <class D8, class V>
 HWY_INLINE hn::Vec<D8> narrowTo8(D8 d8, V a, V b) {
-    return detail::inPackedOrder<2>(d8, hn::Vec<D8>{detail::packUnsigned16(a.raw, b.raw)});
+    return detail::inPackedOrder<2>(d8, detail::pack16(d8, a, b));
 }
 
 // Four vectors of 32-bit lanes, of values that fit, to 8 bits.
 template <class D8, class V>
 HWY_INLINE hn::Vec<D8> narrowTo8(D8 d8, const V (&v)[4]) {
-    const auto halves = detail::packUnsigned16(detail::packUnsigned32(v[0].raw, v[1].raw),
-                                               detail::packUnsigned32(v[2].raw, v[3].raw));
-    return detail::inPackedOrder<4>(d8, hn::Vec<D8>{halves});
+    const hn::Repartition<uint16_t, D8> d16;
+    const auto low = detail::pack32(d16, v[0], v[1]), high = detail::pack32(d16, v[2], v[3]);
+    return detail::inPackedOrder<4>(d8, detail::pack16(d8, low, high));
 }
 
 #else

@@ -19,37 +19,36 @@ HWY_BEFORE_NAMESPACE();
 namespace quillon::HWY_NAMESPACE {
 #if QUILLON_HAS_VECTORS
 
+#if QUILLON_X86_SSSE3
+
 namespace detail {
 
-// multiplyBytes: unsigned bytes of a by signed bytes of b, the products of each
-// 16-bit lane added with signed saturation.  addPairs: the products of signed
-// 16-bit lanes added in each 32-bit lane.
-#if QUILLON_X86_SSSE3
-HWY_INLINE __m128i multiplyBytes(__m128i a, __m128i b) {
-    return _mm_maddubs_epi16(a, b);
+// Unsigned bytes of a by signed bytes of b, the products of each 16-bit lane added with
+// signed saturation.
+template <class D16, class A, class B>
+HWY_INLINE hn::Vec<D16> multiplyBytes(D16 /*d16*/, A a, B b) {
+    if constexpr (kBytesOf<D16> == 64)
+        return hn::Vec<D16>{_mm512_maddubs_epi16(a.raw, b.raw)};
+    else if constexpr (kBytesOf<D16> == 32)
+        return hn::Vec<D16>{_mm256_maddubs_epi16(a.raw, b.raw)};
+    else
+        return hn::Vec<D16>{_mm_maddubs_epi16(a.raw, b.raw)};
 }
-HWY_INLINE __m128i addPairs(__m128i a, __m128i b) {
-    return _mm_madd_epi16(a, b);
+
+// The products of signed 16-bit lanes added in each 32-bit lane.
+template <class D, class A, class B>
+HWY_INLINE hn::Vec<D> addPairs(D /*d*/, A a, B b) {
+    if constexpr (kBytesOf<D> == 64)
+        return hn::Vec<D>{_mm512_madd_epi16(a.raw, b.raw)};
+    else if constexpr (kBytesOf<D> == 32)
+        return hn::Vec<D>{_mm256_madd_epi16(a.raw, b.raw)};
+    else
+        return hn::Vec<D>{_mm_madd_epi16(a.raw, b.raw)};
 }
-#endif
-#if QUILLON_X86_AVX2
-HWY_INLINE __m256i multiplyBytes(__m256i a, __m256i b) {
-    return _mm256_maddubs_epi16(a, b);
-}
-HWY_INLINE __m256i addPairs(__m256i a, __m256i b) {
-    return _mm256_madd_epi16(a, b);
-}
-#endif
-#if QUILLON_X86_AVX512
-HWY_INLINE __m512i multiplyBytes(__m512i a, __m512i b) {
-    return _mm512_maddubs_epi16(a, b);
-}
-HWY_INLINE __m512i addPairs(__m512i a, __m512i b) {
-    return _mm512_madd_epi16(a, b);
-}
-#endif
 
 } // namespace detail
+
+#endif
 
 // Of each 32-bit lane the sum of its lower three bytes, each by two factors: its
 // own byte in bytes, and the half of pairs that the sum of two bytes is multiplied
@@ -57,8 +56,9 @@ HWY_INLINE __m512i addPairs(__m512i a, __m512i b) {
 template <class D>
 HWY_INLINE hn::Vec<D> weightedByteSum(D d, hn::Vec<D> v, uint32_t bytes, uint32_t pairs) {
 #if QUILLON_X86_SSSE3
-    const auto sums = detail::multiplyBytes(v.raw, hn::Set(d, bytes).raw);
-    return hn::Vec<D>{detail::addPairs(sums, hn::Set(d, pairs).raw)};
+    const hn::Repartition<int16_t, D> d16;
+    const auto sums = detail::multiplyBytes(d16, v, hn::Set(d, bytes));
+    return detail::addPairs(d, sums, hn::Set(d, pairs));
 #else
     const uint32_t lower = pairs & 0xFFFF, upper = pairs >> 16;
     const auto byte = hn::Set(d, 0xFF);
@@ -76,7 +76,7 @@ template <uint8_t kLower, uint8_t kUpper, class D16>
 HWY_INLINE hn::Vec<D16> weightedPairSum(D16 d, hn::Vec<D16> v) {
 #if QUILLON_X86_SSSE3
     const auto factors = hn::Set(d, static_cast<int16_t>(kUpper << 8 | kLower));
-    return hn::Vec<D16>{detail::multiplyBytes(factors.raw, v.raw)};
+    return detail::multiplyBytes(d, factors, v);
 #else
     const auto lower = hn::ShiftRight<8>(hn::ShiftLeft<8>(v));
     return hn::Add(hn::Mul(lower, hn::Set(d, kLower)),
@@ -95,7 +95,7 @@ HWY_INLINE Halves<V> addHalves(const Halves<V> &a, const Halves<V> &b) {
     return {hn::Add(a.lower, b.lower), hn::Add(a.upper, b.upper)};
 }
 
-// The products of bytes by a factor that fits 16 bits, as they do.
+// The products of bytes and a factor, all of which fit 16 bits.
 template <class D8, class T16 = hwy::MakeWide<hn::TFromD<D8>>, class D16 = hn::Repartition<T16, D8>>
 HWY_INLINE Halves<hn::Vec<D16>> multiplyWide(D8 /*d*/, hn::Vec<D8> v, int factor) {
 #if QUILLON_NEON
