@@ -142,53 +142,46 @@ using SourceOf =
 
 // ---- Destinations ---------------------------------------------------------
 
-// Formats of the same size share their code, and differ by their weights.
-template <size_t kBytes, class D, size_t kVectors>
-HWY_INLINE void narrowPixels(D d, const hn::Vec<D> (&pixels)[kVectors],
-                             const NarrowingWeights &weights, hn::Vec<D> (&narrow)[kVectors]) {
-    for (size_t v = 0; v < kVectors; ++v) {
-        const auto bits = masked(d, pixels[v], weights.mask);
+// One or two bytes.  Formats of the same size share their code, and differ by their
+// weights.
+template <size_t kBytesIn>
+struct ToFewBits : Storage<kBytesIn, false> {
+    template <class D, size_t kVectors, class Access>
+    HWY_INLINE static void store(D d, const hn::Vec<D> (&pixels)[kVectors], uint8_t *dst,
+                                 const NarrowingWeights &weights, Access access) {
+        using Lane = hwy::UnsignedFromSize<kBytesIn>;
+        hn::Vec<D> v[kVectors];
+        for (size_t i = 0; i < kVectors; ++i)
+            v[i] = narrowed(d, pixels[i], weights);
+        if constexpr (kVectors == 1) {
+            const hn::Rebind<Lane, D> few;
+            access.store(few, narrowOne(few, d, v[0]), dst);
+        } else {
+            storeWhole(hn::Repartition<Lane, D>(), v, dst, access);
+        }
+    }
+
+private:
+    template <class DNarrow, class V, size_t kVectors, class Access>
+    HWY_INLINE static void storeWhole(DNarrow d, const V (&v)[kVectors], uint8_t *dst,
+                                      Access access) {
+        if constexpr (kBytesIn == 2) {
+            for (size_t i = 0; i < kVectors; i += 2)
+                access.store(d, narrowTo16(d, v[i], v[i + 1]), dst + i / 2 * kBytesOf<DNarrow>);
+        } else if constexpr (kVectors == 4) {
+            access.store(d, narrowTo8(d, v), dst);
+        } else {
+            const hn::Half<DNarrow> half;
+            const V twice[4] = {v[0], v[1], v[0], v[1]};
+            access.store(half, hn::LowerHalf(half, narrowTo8(d, twice)), dst);
+        }
+    }
+
+    template <class D>
+    HWY_INLINE static hn::Vec<D> narrowed(D d, hn::Vec<D> pixels, const NarrowingWeights &weights) {
+        const auto bits = masked(d, pixels, weights.mask);
         const auto sum = weightedByteSum(d, bits, weights.bytes, weights.pairs);
-        narrow[v] = hn::ShiftRight<narrowingDistance(kBytes)>(sum);
-    }
-}
-
-struct To8Bits : Storage<1, false> {
-    template <class D, size_t kVectors, class Access>
-    HWY_INLINE static void store(D d, const hn::Vec<D> (&pixels)[kVectors], uint8_t *dst,
-                                 const NarrowingWeights &weights, Access access) {
-        hn::Vec<D> narrow[kVectors];
-        narrowPixels<kBytes>(d, pixels, weights, narrow);
-        if constexpr (kVectors == 1) {
-            const hn::Rebind<uint8_t, D> d8;
-            access.store(d8, narrowOne(d8, d, narrow[0]), dst);
-        } else if constexpr (kVectors == 2) {
-            const hn::Repartition<uint8_t, D> d8;
-            const hn::Half<decltype(d8)> half;
-            const hn::Vec<D> twice[4] = {narrow[0], narrow[1], narrow[0], narrow[1]};
-            access.store(half, hn::LowerHalf(half, narrowTo8(d8, twice)), dst);
-        } else {
-            const hn::Repartition<uint8_t, D> d8;
-            access.store(d8, narrowTo8(d8, narrow), dst);
-        }
-    }
-};
-
-struct To16Bits : Storage<2, false> {
-    template <class D, size_t kVectors, class Access>
-    HWY_INLINE static void store(D d, const hn::Vec<D> (&pixels)[kVectors], uint8_t *dst,
-                                 const NarrowingWeights &weights, Access access) {
-        hn::Vec<D> narrow[kVectors];
-        narrowPixels<kBytes>(d, pixels, weights, narrow);
-        if constexpr (kVectors == 1) {
-            const hn::Rebind<uint16_t, D> d16;
-            access.store(d16, narrowOne(d16, d, narrow[0]), dst);
-        } else {
-            const hn::Repartition<uint16_t, D> d16;
-            for (size_t v = 0; v < kVectors; v += 2)
-                access.store(d16, narrowTo16(d16, narrow[v], narrow[v + 1]),
-                             dst + v * kLanes<D> * kBytes);
-        }
+        return hn::ShiftRight<narrowingDistance(kBytesIn)>(sum);
     }
 };
 
@@ -216,8 +209,9 @@ struct To32Bits : Storage<4, true> {
 
 // By the bytes of a pixel, from 1 on.
 template <PixelFormat kFormat>
-using DestinationOf = std::tuple_element_t<traitsOf(kFormat).bytesPerPixel - 1,
-                                           std::tuple<To8Bits, To16Bits, To24Bits, To32Bits>>;
+using DestinationOf =
+    std::tuple_element_t<traitsOf(kFormat).bytesPerPixel - 1,
+                         std::tuple<ToFewBits<1>, ToFewBits<2>, To24Bits, To32Bits>>;
 
 #endif
 } // namespace quillon::HWY_NAMESPACE

@@ -21,17 +21,6 @@ struct ChannelMasks {
     }
 };
 
-// Masks of the one-byte formats, by depth: red, green, blue.  Depths 3, 6 and 8
-// exist; the other rows are only there to make the depth an index.
-inline constexpr uint8_t RasterSmallMasks[9][3] = {
-    {}, {}, {}, {0x04, 0x20, 0x80}, {}, {}, {0x30, 0x0C, 0x03}, {}, {0x07, 0x38, 0xC0},
-};
-
-constexpr ChannelMasks smallMasks(size_t depth) {
-    const auto &masks = RasterSmallMasks[depth];
-    return {masks[0], masks[1], masks[2]};
-}
-
 inline constexpr ChannelMasks kMasksOfBytes = {0xFF0000, 0x00FF00, 0x0000FF};
 
 enum class PixelFormat : uint8_t {
@@ -58,12 +47,12 @@ inline constexpr int32_t kNoDepth = -1;
 
 // clang-format off
 inline constexpr FormatTraits kPixelFormats[] = {
-    //                     depth     bytes  masks                     source dest.  alpha
+    //                     depth     bytes  red, green, blue          source dest.  alpha
     {PixelFormat::kNone,   kNoDepth, 0,     {},                       false, false, false},
     {PixelFormat::kIndex,  kNoDepth, 1,     kMasksOfBytes,            true,  false, true},
-    {PixelFormat::kSmall3, 3,        1,     smallMasks(3),            false, true,  false},
-    {PixelFormat::kSmall6, 6,        1,     smallMasks(6),            false, true,  false},
-    {PixelFormat::kSmall8, 8,        1,     smallMasks(8),            false, true,  false},
+    {PixelFormat::kSmall3, 3,        1,     {0x04, 0x20, 0x80},       false, true,  false},
+    {PixelFormat::kSmall6, 6,        1,     {0x30, 0x0C, 0x03},       false, true,  false},
+    {PixelFormat::kSmall8, 8,        1,     {0x07, 0x38, 0xC0},       false, true,  false},
     {PixelFormat::kRgb15,  15,       2,     {0x7C00, 0x03E0, 0x001F}, true,  true,  false},
     {PixelFormat::kRgb16,  16,       2,     {0xF800, 0x07E0, 0x001F}, true,  true,  false},
     {PixelFormat::kRgb24,  24,       3,     kMasksOfBytes,            true,  true,  false},
