@@ -43,6 +43,42 @@ TEST(Convert, every16BitPixel) {
         }
 }
 
+// The palette is narrowed as far as its use has grown, and ends at an inaccessible page.
+TEST(Convert, usesMoreOfThePaletteFromRowToRow) {
+    constexpr uint32_t kWidth = 300, kHeight = 250, kStride = kWidth + 7, kFirst = 3;
+    const FencedBuffer entries(kHeight * sizeof(uint32_t), FencedBuffer::Flush::kBefore);
+    const FencedBuffer lastEntries(kHeight * sizeof(uint32_t));
+    Random random(1);
+    random.fill(entries.data(), entries.size());
+    std::memcpy(lastEntries.data(), entries.data(), entries.size());
+    std::vector<uint8_t> rising(size_t{kStride} * kHeight), falling(rising.size());
+    for (uint32_t y = 0; y < kHeight; ++y)
+        for (uint32_t x = 0; x < kWidth; ++x) {
+            const uint32_t i = random.below(y + 1);
+            rising[y * kStride + x] = static_cast<uint8_t>(i);
+            falling[y * kStride + x] = static_cast<uint8_t>(kFirst + kHeight - 1 - i);
+        }
+    const auto *low = reinterpret_cast<const uint32_t *>(lastEntries.data());
+    const auto *high = reinterpret_cast<const uint32_t *>(entries.data()) - kFirst;
+    for (const auto &[src, palette] : {std::pair(rising, low), std::pair(falling, high)})
+        for (const int32_t depth : {3, 6, 8, 15, 16, 24, 32}) {
+            const uint32_t bytes = depth <= 8 ? 1 : static_cast<uint32_t>(depth + 1) / 8;
+            std::vector<uint8_t> expected(src.size() * bytes), dst(expected.size());
+            for (uint32_t y = 0; y < kHeight; ++y)
+                for (uint32_t x = 0; x < kWidth; ++x) {
+                    const size_t i = y * kStride + x;
+                    const uint32_t wanted = reference::converted(palette[src[i]], 32, depth);
+                    std::memcpy(&expected[i * bytes], &wanted, bytes);
+                }
+            forEachTarget([&, &src = src, &palette = palette] {
+                dst.assign(dst.size(), 0);
+                Raster_ConvertPixels(dst.data(), kStride * bytes, depth, src.data(), kStride, 8,
+                                     true, palette, 0, 0, 0, 0, kWidth, kHeight);
+                EXPECT_TRUE(dst == expected) << "to " << depth;
+            });
+        }
+}
+
 TEST(ConvertOne, matchesReference) {
     forEachCase(200000, tryConvertOne);
     // An index is unsigned.

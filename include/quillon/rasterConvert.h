@@ -19,9 +19,9 @@
  * below itself.  There is no rounding and no dithering.
  *
  * With pseudoColor, source pixels are one-byte indices into a palette: an array of 32-bit
- * pixels that the caller owns.  It must cover every index in use; other entries are not
- * read.  Without pseudoColor the palette is not read and may be null.  No destination
- * has a palette.
+ * pixels that the caller owns.  It must cover every index in use; entries below the
+ * lowest of these, or above the highest, are not read.  Without pseudoColor the palette
+ * is not read and may be null.  No destination has a palette.
  */
 #ifndef QUILLON_RASTER_CONVERT_H
 #define QUILLON_RASTER_CONVERT_H

@@ -11,6 +11,7 @@
 #include "hwy/highway.h"
 
 #include "convert/conversionBodies-inl.h"
+#include "convert/narrowPalette-inl.h"
 #include "simd/rowLoop-inl.h"
 
 HWY_BEFORE_NAMESPACE();
@@ -93,6 +94,11 @@ void convertRectangle(DstRows dst, SrcRows src, Extent extent, const uint32_t *p
     } else {
         using Through32 = ConvertThrough32Body<SourceOf<kFrom>, DestinationOf<kTo>>;
         constexpr NarrowingWeights weights = narrowingWeights(to);
+        if constexpr (kHasTableLookup && kFrom == PixelFormat::kIndex && to.bytesPerPixel <= 2) {
+            if (paysToNarrowPalette<to.bytesPerPixel>(extent))
+                return convertByNarrowPalette<DestinationOf<kTo>>(dst, src, extent, palette,
+                                                                  weights);
+        }
         const Through32 body = {{dst.first, src.first}, palette, weights};
         if constexpr (kHasInterleavedAccess && kFrom != PixelFormat::kIndex)
             convertRowsBy(dst, src, extent, ConvertByChannelsBody<kFrom, kTo>{body});

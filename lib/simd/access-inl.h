@@ -79,7 +79,7 @@ struct NonTemporal : Unaligned {
     }
 };
 
-// Only the first lanes of a vector, of 8 or 32 bits.  Memory of the others is not
+// Only the first lanes of a vector, of 8, 16 or 32 bits.  Memory of the others is not
 // touched.  Lanes that become 32 bits are loaded from the vectors of 8 or 16 bits
 // that have as many.
 struct FirstLanes {
@@ -94,6 +94,8 @@ struct FirstLanes {
             return hn::Vec<D>{_mm512_maskz_loadu_epi32(mask, from)};
         } else if constexpr (kBytesOf<D> == 32 && kLaneBytes == 2) {
             return hn::Vec<D>{_mm256_maskz_loadu_epi16(mask, from)};
+        } else if constexpr (kBytesOf<D> == 32 && kLaneBytes == 1) {
+            return hn::Vec<D>{_mm256_maskz_loadu_epi8(mask, from)};
         } else if constexpr (kBytesOf<D> == 16 && kLaneBytes == 1) {
             return hn::Vec<D>{_mm_maskz_loadu_epi8(mask, from)};
         } else {
@@ -107,6 +109,8 @@ struct FirstLanes {
         const auto mask = hn::FirstN(d, count).raw;
         if constexpr (sizeof(hn::TFromD<D>) == 1)
             _mm512_mask_storeu_epi8(to, mask, v.raw);
+        else if constexpr (sizeof(hn::TFromD<D>) == 2)
+            _mm512_mask_storeu_epi16(to, mask, v.raw);
         else
             _mm512_mask_storeu_epi32(to, mask, v.raw);
     }

@@ -80,6 +80,9 @@ inline constexpr bool kHasWideningProducts = QUILLON_NEON;
 // Whether to prefetch: what the processor does not do of itself is measured on x86.
 inline constexpr bool kPrefetchesAhead = HWY_ARCH_X86;
 
+// Lookups in tables of 256 bytes or words that stay in vectors.
+inline constexpr bool kHasTableLookup = QUILLON_X86_AVX512 || QUILLON_NEON;
+
 // Whether a gather is faster than to load its lanes one by one.
 inline constexpr bool kHasFastGather = QUILLON_X86_AVX512;
 

@@ -80,6 +80,14 @@ inline constexpr size_t kConvertLongRow = 512;
 // next row: it is one or two lines.
 inline constexpr size_t kConvertPrefetchRow = 32;
 
+// Palette indices to 8 or 16 bits: from so many pixels on, it pays to narrow the palette
+// first, for lookups in vectors.
+inline constexpr size_t kNarrowPalettePixels = 2048;
+
+// These search a tile of so many pixels for the palette entries that it uses, and convert
+// it while it is in the nearest cache.
+inline constexpr size_t kNarrowPaletteTile = 8192;
+
 // ---- Source pixels ----------------------------------------------------------
 
 // Nearest pixels: steps of up to so many source pixels read the source in whole
