@@ -47,7 +47,8 @@ HWY_INLINE void forVectors(D d, Buffer buffer, size_t firstRow, size_t endRow, c
 // Fastest of 512, 1024, 2048 and 4096 uncached, on Sapphire Rapids.
 constexpr size_t kPrefetchDistance = 1024;
 
-// By bands of some rows: those of each source, then those of the destination.
+// By bands of some rows: those of each source, then those of the destination.  The ways
+// are those of limitsOf.
 template <size_t kWay, bool kReadsDst>
 void moveBands(const Job &job) {
     constexpr bool kNonTemporal = kWay == 2, kPrefetches = kWay >= 2;
@@ -77,16 +78,12 @@ void moveBands(const Job &job) {
         hwy::FlushStream();
 }
 
-template <size_t kWay>
-void moveBy(const Job &job, size_t way, bool readsDst) {
-    if (way == kWay)
-        readsDst ? moveBands<kWay, true>(job) : moveBands<kWay, false>(job);
-    else if constexpr (kWay != 0)
-        moveBy<kWay - 1>(job, way, readsDst);
-}
-
 void moveKernel(const Job &job, size_t way, bool readsDst) {
-    moveBy<3>(job, way, readsDst);
+    constexpr void (*kMoves[][2])(const Job &) = {{moveBands<0, false>, moveBands<0, true>},
+                                                  {moveBands<1, false>, moveBands<1, true>},
+                                                  {moveBands<2, false>, moveBands<2, true>},
+                                                  {moveBands<3, false>, moveBands<3, true>}};
+    kMoves[way][readsDst](job);
 }
 
 } // namespace

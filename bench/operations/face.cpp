@@ -16,74 +16,46 @@ Rect around(const Buffer &buffer) {
 
 // What a call of the face takes beside the call of the C interface that it makes, which
 // stands in the column of limits.
-template <class Face, class Bare>
-void add(Plan &plan, const char *name, std::vector<Plane> planes, const Face &face,
-         const Bare &bare) {
-    plan.add(name, "C++ face", Traffic::None, std::move(planes), face)
-        .contenders.push_back({"the call", prepare(bare), Kind::Limit});
+template <class Face>
+void add(Plan &plan, const char *name, const char *bareName, const Face &face) {
+    for (const Operation &bare : pixelOperations(plan.area))
+        if (bare.name == bareName)
+            plan.add(name, "C++ face", Traffic::None, bare.planes, face)
+                .contenders.push_back({"the call", bare.contenders[0].prepare, Kind::Limit});
+}
+
+// A call of the face from a surface of the format to one of 32 bits.
+template <class Call>
+auto onSurfaces(Format srcFormat, const Call &call) {
+    return [=](const Buffer &dst, const Buffer &src) -> Work {
+        return [=, to = surfaceOf(dst, Format::kBgra32), from = surfaceOf(src, srcFormat),
+                rect = around(src)]() mutable { benchmark::DoNotOptimize(call(to, from, rect)); };
+    };
 }
 
 } // namespace
 
 void addFace(Plan &plan) {
-    add(
-        plan, "face: fill 32", {{32, noise}},
-        [](const Buffer &dst) -> Work {
-            return [surface = surfaceOf(dst, Format::kBgra32), rect = around(dst)]() mutable {
-                benchmark::DoNotOptimize(surface.fill(rect, kPixel));
-            };
-        },
-        [](const Buffer &dst) {
-            Raster_RectFill(dst.data, dst.stride, 4, kPixel, 0, 0, dst.width, dst.height);
-        });
-    add(
-        plan, "face: copy 32", {{32, noise}, {32, noise}},
-        [](const Buffer &dst, const Buffer &src) -> Work {
-            return [to = surfaceOf(dst, Format::kBgra32), from = surfaceOf(src, Format::kBgra32),
-                    rect = around(src)]() mutable {
-                benchmark::DoNotOptimize(to.copy({-1, -1}, from, rect));
-            };
-        },
-        [](const Buffer &dst, const Buffer &src) {
-            Raster_RectCopy(dst.data, dst.stride, src.data, src.stride, 4, 0, 0, 0, 0, dst.width,
-                            dst.height);
-        });
-    add(
-        plan, "face: convert 16 to 32", {{32, noise}, {16, noise}},
-        [](const Buffer &dst, const Buffer &src) -> Work {
-            return [to = surfaceOf(dst, Format::kBgra32), from = surfaceOf(src, Format::kRgb16),
-                    rect = around(src)]() mutable {
-                benchmark::DoNotOptimize(to.copy({-1, -1}, from, rect));
-            };
-        },
-        [](const Buffer &dst, const Buffer &src) {
-            Raster_ConvertPixels(dst.data, static_cast<uint32_t>(dst.stride), 32, src.data,
-                                 static_cast<uint32_t>(src.stride), 16, false, nullptr, 0, 0, 0, 0,
-                                 dst.width, dst.height);
-        });
-    add(
-        plan, "face: blend", {{32, noise}, {32, noise}},
-        [](const Buffer &dst, const Buffer &src) -> Work {
-            return [to = surfaceOf(dst, Format::kBgra32), from = surfaceOf(src, Format::kBgra32),
-                    rect = around(src)]() mutable {
-                benchmark::DoNotOptimize(to.blend({-1, -1}, from, rect));
-            };
-        },
-        [](const Buffer &dst, const Buffer &src) {
-            Raster_AlphaBlendOver(dst.data, 0, 0, dst.stride, src.data, 0, 0, src.stride, dst.width,
-                                  dst.height);
-        });
-    add(
-        plan, "face: stencil 32", {{32, noise}, {1, noise}},
+    const auto copy = [](Surface &to, const Surface &from, Rect rect) {
+        return to.copy({-1, -1}, from, rect);
+    };
+    const auto blend = [](Surface &to, const Surface &from, Rect rect) {
+        return to.blend({-1, -1}, from, rect);
+    };
+    add(plan, "face: fill 32", "fill 32", [](const Buffer &dst) -> Work {
+        return [surface = surfaceOf(dst, Format::kBgra32), rect = around(dst)]() mutable {
+            benchmark::DoNotOptimize(surface.fill(rect, kPixel));
+        };
+    });
+    add(plan, "face: copy 32", "copy 32", onSurfaces(Format::kBgra32, copy));
+    add(plan, "face: convert 16 to 32", "convert 16 to 32", onSurfaces(Format::kRgb16, copy));
+    add(plan, "face: blend", "blend noise", onSurfaces(Format::kBgra32, blend));
+    add(plan, "face: stencil 32", "stencil noise to 32",
         [](const Buffer &dst, const Buffer &src) -> Work {
             return [to = surfaceOf(dst, Format::kBgra32),
                     bits = Bitmap(src.data, src.stride, {src.w(), src.h()})]() mutable {
                 benchmark::DoNotOptimize(to.stencil({0, 0}, bits, kForeground));
             };
-        },
-        [](const Buffer &dst, const Buffer &src) {
-            Raster_BitsToPixelsStencil(src.data, src.stride, dst.data, dst.stride, 4, dst.w(),
-                                       dst.height, kForeground);
         });
 }
 
