@@ -6,14 +6,13 @@
 namespace quillon::test {
 namespace {
 
-constexpr int32_t kLayouts[] = {3, 6, 8, 15, 16, 24, 32};
-constexpr int32_t kSources[] = {15, 16, 24, 32};
+using reference::kDepths, reference::kSourceDepths;
 
 uint32_t bytesOf(int32_t depth) {
     return depth <= 8 ? 1 : static_cast<uint32_t>(depth + 1) / 8;
 }
 
-// From a layout, or a palette, to a layout.
+// From a pixel format, or a palette, to a format.
 struct Pair {
     int32_t srcDepth, dstDepth;
     bool pseudoColor;
@@ -21,7 +20,7 @@ struct Pair {
 };
 
 Pair drawPair(Random &random) {
-    Pair pair = {random.oneOf(kSources), random.oneOf(kLayouts), random.oneIn(4)};
+    Pair pair = {random.oneOf(kSourceDepths), random.oneOf(kDepths), random.oneIn(4)};
     if (pair.pseudoColor)
         pair.srcDepth = random.oneOf({8, 4, 0, -15, INT32_MIN}); // all mean one byte
     else if (random.oneIn(8))                                    // any depth can be copied
@@ -31,8 +30,10 @@ Pair drawPair(Random &random) {
 
 // All pairs in turn.
 Pair pairOf(uint64_t number) {
-    const uint64_t src = number / std::size(kLayouts) % 5;
-    return {src < 4 ? kSources[src] : 8, kLayouts[number % std::size(kLayouts)], src == 4};
+    constexpr size_t kSources = std::size(kSourceDepths);
+    const size_t src = number / std::size(kDepths) % (kSources + 1);
+    const bool isPalette = src == kSources;
+    return {isPalette ? 8 : kSourceDepths[src], kDepths[number % std::size(kDepths)], isPalette};
 }
 
 // By one of the functions that do the pair.
@@ -132,7 +133,7 @@ void tryConvert(Random &random, std::optional<Shape> shape) {
 void tryConvertOne(Random &random) {
     static thread_local uint32_t palette[300]; // an index is not cut to a byte
     const uint32_t pixel = random.word(), index = random.below(300);
-    const int32_t dst = random.oneOf(kLayouts), src = random.oneOf(kSources);
+    const int32_t dst = random.oneOf(kDepths), src = random.oneOf(kSourceDepths);
     palette[index] = pixel;
     compare(Raster_ConvertOnePixel(pixel, src, dst, false, nullptr),
             reference::convertedAlone(pixel, src, dst), "one pixel");

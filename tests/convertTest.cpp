@@ -24,7 +24,7 @@ TEST(Convert, every16BitPixel) {
     std::vector<uint16_t> pixels(kSide * kSide);
     std::iota(pixels.begin(), pixels.end(), uint16_t{0});
     for (const int32_t srcDepth : {15, 16})
-        for (const int32_t dstDepth : {3, 6, 8, 15, 16, 24, 32}) {
+        for (const int32_t dstDepth : reference::kDepths) {
             const uint32_t bytes = dstDepth <= 8 ? 1 : static_cast<uint32_t>(dstDepth + 1) / 8;
             std::vector<uint8_t> expected(pixels.size() * bytes), dst(expected.size());
             for (uint32_t pixel = 0; pixel <= 0xFFFF; ++pixel) {

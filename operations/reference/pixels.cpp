@@ -7,13 +7,13 @@
 namespace quillon::reference {
 namespace {
 
-struct Layout {
+struct Format {
     int32_t depth;
     uint32_t red, green, blue, alpha; // masks
 };
 
-const Layout &layoutOf(int32_t depth) {
-    static const Layout layouts[] = {
+const Format &formatAt(int32_t depth) {
+    static const Format formats[] = {
         {3, 0x04, 0x20, 0x80, 0},
         {6, 0x30, 0x0C, 0x03, 0},
         {8, 0x07, 0x38, 0xC0, 0},
@@ -22,9 +22,9 @@ const Layout &layoutOf(int32_t depth) {
         {24, 0xFF0000, 0x00FF00, 0x0000FF, 0},
         {32, 0xFF0000, 0x00FF00, 0x0000FF, 0xFF000000},
     };
-    for (const Layout &layout : layouts)
-        if (layout.depth == depth)
-            return layout;
+    for (const Format &format : formats)
+        if (format.depth == depth)
+            return format;
     std::abort(); // the test asks for what there is not
 }
 
@@ -61,7 +61,7 @@ uint32_t blended(uint32_t src, uint32_t dst) {
 }
 
 uint32_t converted(uint32_t pixel, int32_t srcDepth, int32_t dstDepth) {
-    const Layout &src = layoutOf(srcDepth), &dst = layoutOf(dstDepth);
+    const Format &src = formatAt(srcDepth), &dst = formatAt(dstDepth);
     const uint32_t color = moved(pixel, src.red, dst.red) | moved(pixel, src.green, dst.green) |
                            moved(pixel, src.blue, dst.blue);
     return color | (src.alpha == 0 ? dst.alpha : pixel & dst.alpha);

@@ -11,7 +11,12 @@ uint32_t combined(uint32_t rop, uint32_t src, uint32_t dst);
 
 uint32_t blended(uint32_t src, uint32_t dst);
 
-// In a rectangle: a layout without alpha counts as opaque.
+// The pixel formats by their depths: all, to which pixels are converted, and those from
+// which they are.
+inline constexpr int32_t kDepths[] = {3, 6, 8, 15, 16, 24, 32};
+inline constexpr int32_t kSourceDepths[] = {15, 16, 24, 32};
+
+// In a rectangle: a format without alpha counts as opaque.
 uint32_t converted(uint32_t pixel, int32_t srcDepth, int32_t dstDepth);
 
 // By itself.
