@@ -3,13 +3,17 @@
 #include "support/judge.h"
 #include <quillon/raster.h>
 
+#include <algorithm>
+
 namespace quillon::test {
 namespace {
 
 using reference::kDepths, reference::kSourceDepths;
 
+// Rounded up for formats, and down for other depths, which can only be copied.
 uint32_t bytesOf(int32_t depth) {
-    return depth <= 8 ? 1 : static_cast<uint32_t>(depth + 1) / 8;
+    const bool isFormat = std::ranges::find(kDepths, depth) != std::end(kDepths);
+    return static_cast<uint32_t>(isFormat ? depth + 7 : depth) / 8;
 }
 
 // From a pixel format, or a palette, to a format.

@@ -25,7 +25,7 @@ TEST(Convert, every16BitPixel) {
     std::iota(pixels.begin(), pixels.end(), uint16_t{0});
     for (const int32_t srcDepth : {15, 16})
         for (const int32_t dstDepth : reference::kDepths) {
-            const uint32_t bytes = dstDepth <= 8 ? 1 : static_cast<uint32_t>(dstDepth + 1) / 8;
+            const uint32_t bytes = static_cast<uint32_t>(dstDepth + 7) / 8;
             std::vector<uint8_t> expected(pixels.size() * bytes), dst(expected.size());
             for (uint32_t pixel = 0; pixel <= 0xFFFF; ++pixel) {
                 const uint32_t wanted =

@@ -122,7 +122,9 @@ constexpr WideningFactors wideningFactors(const ChannelMasks &from) {
 // ---- Narrowing by products ------------------------------------------------
 
 // A narrower pixel is a weighted sum of the bytes of a 32-bit pixel, so many bits too
-// far up.  Formats of the same size differ by nothing but the weights.
+// far up that no weight of a channel is below 1: in one byte channels end at bit 2 or
+// above, in two bytes at bit 5.  Formats of the same size differ by nothing but the
+// weights.
 constexpr int narrowingDistance(int32_t bytesPerPixel) {
     return bytesPerPixel == 1 ? 6 : 3;
 }
