@@ -151,6 +151,17 @@ TEST(Combine, AtTheLimits) {
     EXPECT_TRUE(cut.width == 3 && cut.height == 2);
     EXPECT_EQ(std::memcmp(cut.data + 12, image.data + image.bytesPerLine, 12), 0);
 
+    // Strides beyond int32_t, of any of the images.
+    collage.positions = {{0, 0}, {10, 0}};
+    for (ImageInfo &far : collage.images) {
+        const ImageInfo whole = far;
+        far.bytesPerLine = 0x80000000;
+        far.height = 1;
+        Result canvas;
+        EXPECT_FALSE(collage.combine(canvas));
+        far = whole;
+    }
+
     collage.images[0].depth = 12;
     collage.images[0].bpp = 16;
     collage.positions = {{0, 0}, {19, 0}};
@@ -243,6 +254,10 @@ TEST(CropAndScale, Refusals) {
         Result result;
         EXPECT_FALSE(request.run(image.info, result)) << "number " << &request - kRefused;
     }
+    ImageInfo far = image.info; // one row of it
+    far.bytesPerLine = 0x80000000;
+    Result scaled;
+    EXPECT_FALSE((Request{.bottom = 1, .width = 20}).run(far, scaled));
     for (const Request &request : {Request{}, Request{.width = 20}}) {
         ImageInfo empty = image.info, narrow = image.info;
         empty.data = nullptr;

@@ -1,13 +1,15 @@
 // Every Panic of the library, left by an exception, by a jump and by the end of the
-// process.  Nothing may be left behind.
+// process, and one that comes back.  Nothing may be left behind.
 
 #include "support/faults.h"
 #include "support/messages.h"
 #include <quillon/quillon.h>
 
+#include <algorithm>
 #include <csignal>
 #include <cstdio>
 #include <cstdlib>
+#include <cstring>
 
 using namespace quillon::test;
 
@@ -15,6 +17,7 @@ namespace {
 
 const uint32_t kPalette[256] = {};
 uint8_t memory[4096];
+constexpr size_t kPlanes = 1024, kPlaneBytes = 256; // of a cursor of 8 x 8
 
 void convertDepths(int32_t dstDepth, int32_t srcDepth, bool isIndexed) {
     Raster_ConvertPixels(memory, 64, dstDepth, memory, 64, srcDepth, isIndexed, kPalette, 0, 0, 0,
@@ -26,7 +29,7 @@ void combineRects(uint32_t dstX) {
 }
 
 void expandPlanes(uint32_t andDepth, uint32_t xorDepth, uint32_t size) {
-    Raster_ExpandPlanarCursorData(8, 8, andDepth, memory, xorDepth, memory, 32, memory + 1024,
+    Raster_ExpandPlanarCursorData(8, 8, andDepth, memory, xorDepth, memory, 32, memory + kPlanes,
                                   size);
 }
 
@@ -124,6 +127,18 @@ bool jumpsOut(void (*call)()) {
     return hasJumped;
 }
 
+// The call returns and leaves all memory alone, but for the first of two planes, which
+// is written ahead of the check of the second.
+void expectReturn(void (*call)()) {
+    std::memset(memory, 0xA5, sizeof(memory));
+    panicWay = PanicWay::kReturn;
+    call();
+    panicWay = PanicWay::kThrow;
+    const auto isSame = [](uint8_t byte) { return byte == 0xA5; };
+    EXPECT_TRUE(std::all_of(memory, memory + kPlanes, isSame));
+    EXPECT_TRUE(std::all_of(memory + kPlanes + kPlaneBytes, std::end(memory), isSame));
+}
+
 TEST(Panics, LeaveInEveryWay) {
     for (const auto &[name, call] : kPanics) {
         SCOPED_TRACE(name);
@@ -133,11 +148,12 @@ TEST(Panics, LeaveInEveryWay) {
         const MemoryFault none(UINT64_MAX);
         EXPECT_EQ(thrownBy(call), message);
         EXPECT_TRUE(jumpsOut(call));
+        expectReturn(call);
         Messages().swap(warnings);
         EXPECT_EQ(none.blocksHeld, 0);
         EXPECT_EXIT((panicWay = PanicWay::kAbort, call()), testing::KilledBySignal(SIGABRT),
                     message);
-        std::printf("%-40s thrown, jumped, aborted: %s", name, message.c_str());
+        std::printf("%-40s thrown, jumped, returned, aborted: %s", name, message.c_str());
     }
 }
 

@@ -39,4 +39,15 @@ lookedUp() { # PATTERN
 compare "names looked up in the host against hearth.h" \
     "$(declared HEARTH_API "$sourceDir/include/hearth/hearth.h")" "$(lookedUp '^[A-Z][A-Za-z0-9_]*$')"
 [ -z "$(lookedUp QUILLON_)" ] || { echo "Looked up, though its own: $(lookedUp QUILLON_)"; failed=1; }
+
+# Where kernels have a fallback, instructions that not every processor has stand in the
+# namespaces of the instruction sets alone: in a function that several files share, or
+# behind a pragma that is left open, they would run anywhere.
+newer='^(v[a-z]|pshufb|pmaddubsw|palignr|pmulhrsw|p(ext|ins)r[bdq]|pblend|ptest|pmov[sz]x|pm(ax|in)(sb|sd|uw|ud)|pmulld)'
+if nm "$libquillon" | grep -E '[0-9]N_(SCALAR|EMU128|SSE2)[0-9]' >/dev/null; then
+    strays=$(objdump -d --no-show-raw-insn "$libquillon" | awk -v newer="$newer" '
+        /^[0-9a-f]+ <.*>:$/ { name = $2 }
+        name !~ /[0-9]N_(AVX|SSE4|SSSE3)/ && $2 ~ newer { print $2, "in", name }' | sort -u)
+    [ -z "$strays" ] || { echo "Not on every processor: $strays"; failed=1; }
+fi
 exit $failed

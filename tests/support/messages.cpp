@@ -14,6 +14,8 @@ void Panic(const char *format, ...) {
     va_end(arguments);
     if (panicWay == PanicWay::kJump)
         longjmp(panicJump, 1);
+    if (panicWay == PanicWay::kReturn)
+        return;
     if (panicWay == PanicWay::kAbort)
         reinterpret_cast<decltype(&Panic)>(dlsym(RTLD_NEXT, "Panic"))("%s", text);
     throw PanicError(text);

@@ -14,7 +14,7 @@
 
 namespace quillon::test {
 
-enum class PanicWay { kThrow, kJump, kAbort };
+enum class PanicWay { kThrow, kJump, kAbort, kReturn };
 inline PanicWay panicWay = PanicWay::kThrow;
 inline jmp_buf panicJump; // where to, with kJump
 
