@@ -229,7 +229,7 @@ QUILLON_API void Raster_RectROPcopy(uint8_t *dstBuffer, int32_t dstLineIncrement
  * its last pixel are ignored.
  *
  * There are no coordinates: srcBits is the first byte of the bitmap, dstBuffer the first
- * pixel of the rectangle.  bitmap and surface must not overlap.
+ * pixel of the rectangle.  Bitmap and surface must not overlap.
  *
  * Stride: exact, for the bitmap and for the surface.
  * @{

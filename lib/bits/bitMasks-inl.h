@@ -27,8 +27,8 @@ namespace quillon::HWY_NAMESPACE {
 // The widest vectors of which there is a whole number in a chunk.  Lanes are
 // pixels of 4 bytes, and single bytes of all others.
 template <size_t kBytes, size_t kPixels>
-using ChunkTag = std::conditional_t<kBytes == 4, hn::CappedTag<uint32_t, kPixels>,
-                                    hn::CappedTag<uint8_t, kPixels *(kBytes == 3 ? 1 : kBytes)>>;
+using ChunkTag = hn::CappedTag<std::conditional_t<kBytes == 4, uint32_t, uint8_t>,
+                               (kBytes == 2 ? 2 : 1) * kPixels>;
 
 // Equal pixels as the vectors of a chunk.  There are three different ones where
 // pixels have 3 bytes.
@@ -52,15 +52,17 @@ private:
 // For each byte of a chunk's pixels: which byte of the bits has its bit, and which
 // bit of that byte it is.
 template <size_t kBytes>
+using ByteTable = std::array<uint8_t, size_t{64} * kBytes>;
+template <size_t kBytes>
 HWY_ALIGN constexpr auto kByteOfBits = [] {
-    std::array<uint8_t, 64 *kBytes> table = {};
+    ByteTable<kBytes> table = {};
     for (size_t i = 0; i < table.size(); ++i)
         table[i] = static_cast<uint8_t>(i / kBytes / 8);
     return table;
 }();
 template <size_t kBytes>
 HWY_ALIGN constexpr auto kBitOfByte = [] {
-    std::array<uint8_t, 64 *kBytes> table = {};
+    ByteTable<kBytes> table = {};
     for (size_t i = 0; i < table.size(); ++i)
         table[i] = static_cast<uint8_t>(0x80 >> i / kBytes % 8);
     return table;

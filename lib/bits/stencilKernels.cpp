@@ -37,8 +37,7 @@ public:
     HWY_INLINE void storeFirst(uint64_t bits, uint8_t *dst, size_t count) const {
         if (kBytes > 1 && bits == 0)
             return;
-            // Unrolled, k is a constant that the masks are made of.
-#pragma GCC unroll 8
+#pragma GCC unroll 8 // k is a constant then, which the masks are made of
         for (size_t k = 0; k < kVectors && k * kBytesOf<D> < count * kBytes; ++k)
             storeVector(bits, dst, k);
     }

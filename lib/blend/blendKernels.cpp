@@ -57,7 +57,7 @@ HWY_INLINE bool isClearOrOpaque(const uint8_t *pixel) {
     return pixel[3] == 0 || pixel[3] == 255;
 }
 
-// The same for as many pixels as there are bytes in a vector, by channels.
+// blendOver by channels, for as many pixels as there are bytes in a vector.
 HWY_INLINE void blendChannelsOver(const uint8_t *src, uint8_t *dst) {
     const Widest<uint8_t> d;
     using Bytes = hn::Vec<decltype(d)>;

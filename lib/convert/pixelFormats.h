@@ -102,7 +102,7 @@ public:
     }
 
     constexpr Function at(PixelFormat from, PixelFormat to) const {
-        return functions[static_cast<size_t>(from)][static_cast<size_t>(to)];
+        return functions_[static_cast<size_t>(from)][static_cast<size_t>(to)];
     }
 
 private:
@@ -114,11 +114,11 @@ private:
     template <PixelFormat kFrom, PixelFormat kTo, class Make>
     constexpr void addPair(Make make) {
         if constexpr (traitsOf(kFrom).isSource && traitsOf(kTo).isDestination)
-            functions[static_cast<size_t>(kFrom)][static_cast<size_t>(kTo)] =
+            functions_[static_cast<size_t>(kFrom)][static_cast<size_t>(kTo)] =
                 make.template operator()<kFrom, kTo>();
     }
 
-    Function functions[kFormatCount][kFormatCount] = {};
+    Function functions_[kFormatCount][kFormatCount] = {};
 };
 
 } // namespace quillon

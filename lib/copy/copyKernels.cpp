@@ -146,7 +146,7 @@ void copyMediumRows(DstRows dst, SrcRows src, ByteExtent extent) {
     HWY_DYNAMIC_DISPATCH(copyMediumKernel)(dst, src, extent);
 }
 
-void copyRowsNonTemporal(DstRows dst, SrcRows src, ByteExtent extent) {
+void copyNonTemporalRows(DstRows dst, SrcRows src, ByteExtent extent) {
     HWY_DYNAMIC_DISPATCH(copyNonTemporalKernel)(dst, src, extent);
 }
 

@@ -14,6 +14,6 @@ void copyMediumRows(DstRows dst, SrcRows src, ByteExtent extent);
 
 // Copies rows of kNonTemporalRowBytes or more around the caches.  The surfaces do
 // not overlap.
-void copyRowsNonTemporal(DstRows dst, SrcRows src, ByteExtent extent);
+void copyNonTemporalRows(DstRows dst, SrcRows src, ByteExtent extent);
 
 } // namespace quillon

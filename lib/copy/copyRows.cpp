@@ -11,7 +11,7 @@ namespace {
 // Rows of more than kCopyShortRow bytes on surfaces that do not overlap.
 void copyLongRows(DstRows dst, SrcRows src, ByteExtent extent) {
     if (isNonTemporal(extent)) {
-        copyRowsNonTemporal(dst, src, extent);
+        copyNonTemporalRows(dst, src, extent);
         return;
     }
     if (extent.rowBytes <= kCopyMediumRow) {

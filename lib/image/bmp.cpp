@@ -10,8 +10,7 @@
 #include <cstdlib>
 #include <cstring>
 
-using namespace quillon;
-
+namespace quillon {
 namespace {
 
 constexpr uint32_t kFileHeaderBytes = 14;
@@ -54,16 +53,16 @@ bool isCopied(const ImageInfo &image) {
 // Stores little-endian fields one after another.
 class FieldWriter {
 public:
-    explicit FieldWriter(uint8_t *out) : next(out) {}
+    explicit FieldWriter(uint8_t *out) : next_(out) {}
     void put16(uint32_t value) { put(value, 2); }
     void put32(uint64_t value) { put(value, 4); }
 
 private:
     void put(uint64_t value, uint32_t bytes) {
         for (uint32_t i = 0; i < bytes; ++i)
-            *next++ = static_cast<uint8_t>(value >> (8 * i));
+            *next_++ = static_cast<uint8_t>(value >> (8 * i));
     }
-    uint8_t *next;
+    uint8_t *next_;
 };
 
 using BmpHeaders = std::array<uint8_t, kHeaderBytes>;
@@ -120,6 +119,9 @@ void fillRows(uint8_t *block, const BmpLayout &layout, const ImageInfo &image) {
 }
 
 } // namespace
+} // namespace quillon
+
+using namespace quillon;
 
 bool ImageUtil_ConstructBMPBuffer(const ImageInfo *image, DynBuf *buffer) {
     if (buffer == nullptr || image == nullptr)

@@ -9,8 +9,7 @@
 #include <cstdlib>
 #include <cstring>
 
-using namespace quillon;
-
+namespace quillon {
 namespace {
 
 struct Canvas {
@@ -149,6 +148,9 @@ void paintPlain(const Canvas &canvas, const ImageInfo &image, const Overlay &par
 }
 
 } // namespace
+} // namespace quillon
+
+using namespace quillon;
 
 bool ImageUtil_Combine(const ImageInfo *images, const RectPoint *positions, uint32_t count,
                        ImageInfo *result) {

@@ -9,8 +9,7 @@
 #include <cstdlib>
 #include <cstring>
 
-using namespace quillon;
-
+namespace quillon {
 namespace {
 
 constexpr int32_t kNotGiven = -1;
@@ -74,6 +73,9 @@ bool scaleCrop(uint8_t *block, size_t stride, const uint8_t *first, const ImageI
 }
 
 } // namespace
+} // namespace quillon
+
+using namespace quillon;
 
 bool ImageUtil_CropAndScaleImage(const ImageInfo *src, int32_t srcLeft, int32_t srcTop,
                                  int32_t srcRight, int32_t srcBottom, int32_t dstLeft,

@@ -7,8 +7,6 @@
 #include <cstddef>
 #include <cstdlib>
 
-using namespace quillon;
-
 // The layout of the records is part of the interface.
 static_assert(sizeof(ImageUtilColor) == 4 && offsetof(ImageUtilColor, red) == 2);
 static_assert(offsetof(ImageInfo, numColors) == 24 && offsetof(ImageInfo, palette) == 28);
@@ -22,6 +20,7 @@ static_assert(sizeof(void *) != 8 || sizeof(ImageUtilPngReadState) == 16);
 static_assert(sizeof(void *) != 8 || offsetof(ImageUtilPngBuffer, memOps) == 16);
 static_assert(sizeof(void *) != 8 || sizeof(ImageUtilPngBuffer) == 24);
 
+namespace quillon {
 namespace {
 
 // Writes the bytes of a buffer to a file; logs a failure.
@@ -52,6 +51,9 @@ bool writeBuffer(const DynBuf *buffer, const char *fileName) {
 }
 
 } // namespace
+} // namespace quillon
+
+using namespace quillon;
 
 void ImageUtil_FreeImageData(ImageInfo *image) {
     if (image->data == nullptr)

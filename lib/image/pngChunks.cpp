@@ -24,38 +24,39 @@ uint32_t bigEndian(const uint8_t *bytes) {
 // Walks the chunks of a file, as far as they lie inside it.
 class ChunkWalk {
 public:
-    explicit ChunkWalk(const PngFile &walked) : file(walked) {}
+    explicit ChunkWalk(const PngFile &file) : file_(file) {}
 
     // Goes to the next chunk; false when there is none that is whole.
     bool next() {
-        start = end;
-        if (file.size < start || file.size - start < kFrameBytes)
+        start_ = end_;
+        if (file_.size < start_ || file_.size - start_ < kFrameBytes)
             return false;
-        length = bigEndian(file.bytes + start);
-        if (length > file.size - start - kFrameBytes)
+        length_ = bigEndian(file_.bytes + start_);
+        if (length_ > file_.size - start_ - kFrameBytes)
             return false;
-        end = start + kFrameBytes + length;
+        end_ = start_ + kFrameBytes + length_;
         return true;
     }
 
-    const uint8_t *name() const { return file.bytes + start + 4; }
+    const uint8_t *name() const { return file_.bytes + start_ + 4; }
     bool is(const void *other) const { return std::memcmp(name(), other, kNameBytes) == 0; }
     bool isCritical() const { return (name()[0] & 0x20) == 0; }
-    bool endsBehind(uint32_t offset) const { return end > offset; }
+    bool endsBehind(uint32_t offset) const { return end_ > offset; }
     bool hasValidHeader() const {
-        return length <= PNG_UINT_31_MAX && std::all_of(name(), name() + kNameBytes, [](uint8_t c) {
+        return length_ <= PNG_UINT_31_MAX &&
+               std::all_of(name(), name() + kNameBytes, [](uint8_t c) {
                    return (c >= 'A' && c <= 'Z') || (c >= 'a' && c <= 'z');
                });
     }
     bool hasRightSum() const {
-        return crc32(0, name(), kNameBytes + length) == bigEndian(file.bytes + end - 4);
+        return crc32(0, name(), kNameBytes + length_) == bigEndian(file_.bytes + end_ - 4);
     }
 
 private:
-    const PngFile &file;
-    uint32_t start = 0;
-    uint32_t end = kPngSignatureBytes;
-    uint32_t length = 0;
+    const PngFile &file_;
+    uint32_t start_ = 0;
+    uint32_t end_ = kPngSignatureBytes;
+    uint32_t length_ = 0;
 };
 
 bool isCostly(const ChunkWalk &chunk) {

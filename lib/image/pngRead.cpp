@@ -11,8 +11,7 @@
 #include <cstring>
 #include <png.h>
 
-using namespace quillon;
-
+namespace quillon {
 namespace {
 
 // Compressed bytes behind the last row that libpng may inflate, only to throw away what
@@ -217,6 +216,9 @@ uint8_t *readFile(const char *fileName, uint32_t *size) {
 }
 
 } // namespace
+} // namespace quillon
+
+using namespace quillon;
 
 bool ImageUtil_ReadPNG(ImageInfo *image, const char *fileName, uint32_t flags) {
     uint32_t size = 0;

@@ -13,8 +13,7 @@
 #include <limits>
 #include <png.h>
 
-using namespace quillon;
-
+namespace quillon {
 namespace {
 
 constexpr ImageUtilPngOptions kDefaultOptions = {.compressionLevel = -1, .stripAlpha = true};
@@ -211,6 +210,9 @@ bool makeRoom(ImageUtilPngBuffer *buffer, size_t length) {
 }
 
 } // namespace
+} // namespace quillon
+
+using namespace quillon;
 
 bool ImageUtil_ConstructPNGBuffer(const ImageInfo *image, const ImageUtilPngOptions *options,
                                   DynBuf *buffer) {

@@ -8,12 +8,11 @@
 #include <algorithm>
 #include <cstddef>
 
-using namespace quillon;
-
 // The layout of the records is part of the interface.
 static_assert(offsetof(Rect, bottom) == 12 && sizeof(Rect) == 16);
 static_assert(offsetof(RectPoint, y) == 4 && sizeof(RectPoint) == 8);
 
+namespace quillon {
 namespace {
 
 bool isEmpty(const Rect &rect) {
@@ -42,6 +41,9 @@ int32_t gap(int32_t a, int32_t b) {
 }
 
 } // namespace
+} // namespace quillon
+
+using namespace quillon;
 
 void Rect_SetFromXYWH(Rect *rect, int32_t x, int32_t y, int32_t width, int32_t height) {
     *rect = {.left = x,

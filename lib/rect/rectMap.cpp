@@ -10,8 +10,7 @@
 
 #include <algorithm>
 
-using namespace quillon;
-
+namespace quillon {
 namespace {
 
 // A rectangle on one axis.
@@ -80,6 +79,9 @@ void storeUnlessNull(Rect *dst, const Rect &value) {
 }
 
 } // namespace
+} // namespace quillon
+
+using namespace quillon;
 
 bool Rect_ApplyDiff(Rect *dst, const Rect *newRect, const Rect *oldRect, const Rect *rect) {
     const auto moved = [=](int32_t Rect::*field) {

@@ -49,7 +49,7 @@ HWY_INLINE void withWidestChunk(size_t count, const Use &use) {
 template <size_t kMostVectors, class Use>
 HWY_INLINE void withShortRow(size_t rowBytes, const Use &use) {
     withWidestChunk<kVectorBytes, 64, 32, 16, 8, 4>(rowBytes, [&](auto chunk) HWY_ATTR {
-        constexpr size_t n = chunk.kUnits;
+        constexpr size_t n = chunk.kUnits, kMost = n == kVectorBytes ? kMostVectors : 2;
         const hn::CappedTag<uint32_t, n / 4> d;
         const size_t vectors = (rowBytes + n - 1) / n;
         const auto useOf = [&]<size_t... kLess>(std::index_sequence<kLess...>) HWY_ATTR {
@@ -57,7 +57,7 @@ HWY_INLINE void withShortRow(size_t rowBytes, const Use &use) {
                     (use(d, std::integral_constant<size_t, kLess + 1>()), true)) ||
                    ...);
         };
-        useOf(std::make_index_sequence < n == kVectorBytes ? kMostVectors : 2 > ());
+        useOf(std::make_index_sequence<kMost>());
     });
 }
 

@@ -238,7 +238,8 @@ HWY_INLINE void walkRowOnce(size_t count, const Body &body) {
     }
 }
 
-// The same in falling order.
+// The first count units of a row, fewer than 2 * kUnits, from the last one on, each smaller
+// chunk at most once.
 template <size_t kUnits, class Body>
 HWY_INLINE void walkHalvesBackward(size_t count, const Body &body) {
     if (count & kUnits)
@@ -247,6 +248,7 @@ HWY_INLINE void walkHalvesBackward(size_t count, const Body &body) {
         walkHalvesBackward<kUnits / 2>(count & (kUnits - 1), body);
 }
 
+// The same as walkRowOnce in falling order.
 template <size_t kUnitBytes, class Body>
 HWY_INLINE void walkRowOnceBackward(size_t count, const Body &body) {
     constexpr size_t kUnits = kVectorBytes / kUnitBytes;

@@ -14,7 +14,7 @@
 
 namespace quillon {
 
-/** One bit per pixel, in memory of the caller's; only read.
+/** One bit per pixel, in the caller's memory; only read.
  *
  * Each row begins on a byte, its leftmost pixel in bit 7.
  */
@@ -60,7 +60,7 @@ private:
 
 /** Glyphs of one size, one behind the other: rows of (width + 7) / 8 bytes each. */
 struct Font {
-    const void *glyphs = nullptr; /**< in memory of the caller's; only read */
+    const void *glyphs = nullptr; /**< in the caller's memory; only read */
     Size size;                    /**< of a glyph, in pixels */
     uint8_t first = 0;            /**< the character of the first glyph */
     int32_t count = 0;            /**< of glyphs */

@@ -1,6 +1,6 @@
 /** @file face/surface.hpp
  *
- * Surfaces: pixels in memory of the caller's, and what is drawn on them.  Part of
+ * Surfaces: pixels in the caller's memory, and what is drawn on them.  Part of
  * quillon.hpp, which states the conventions.
  */
 #ifndef QUILLON_FACE_SURFACE_HPP

@@ -30,7 +30,7 @@ struct VideoPlane {
     int32_t stride = 0;
 };
 
-/** A video frame in memory of the caller's; only read.
+/** A video frame in the caller's memory; only read.
  *
  * Levels are those of television: Y from 16 to 235, U and V from 16 to 240, by the matrix of
  * BT.601.  Where a side is odd, the last samples of U and V belong to one column or row.
