@@ -15,6 +15,7 @@
 
 #include "convert/formatChannels-inl.h"
 #include "convert/pixelFormats-inl.h"
+#include "simd/pixelCopies-inl.h"
 
 HWY_BEFORE_NAMESPACE();
 namespace quillon::HWY_NAMESPACE {
@@ -56,15 +57,39 @@ struct ConvertByChannelsBody : ConvertThrough32Body<SourceOf<kFrom>, Destination
     HWY_INLINE void operator()(C chunk, size_t i, Access access) const {
         if constexpr (C::kUnits == kVectorBytes) {
             const Widest<uint8_t> d;
-            const uint8_t *from = this->src + i * this->kSrcBytes;
-            uint8_t *to = this->dst + i * this->kDstBytes;
-            if constexpr (kFrom == PixelFormat::kRgb32 && kTo == PixelFormat::kRgb24)
-                copyWithoutFourth(d, from, to);
-            else
-                storeChannels<kTo>(d, loadChannels<kFrom>(d, from), to);
+            storeChannels<kTo>(d, loadChannels<kFrom>(d, this->src + i * this->kSrcBytes),
+                               this->dst + i * this->kDstBytes);
         } else {
             ConvertThrough32Body<SourceOf<kFrom>, DestinationOf<kTo>>::operator()(chunk, i, access);
         }
+    }
+};
+
+// The same from three or four bytes to the other of these.
+template <PixelFormat kFrom, PixelFormat kTo>
+struct ConvertByCopyBody : ConvertThrough32Body<SourceOf<kFrom>, DestinationOf<kTo>> {
+    static constexpr size_t kMovingUnits = kVectorBytes;
+
+    template <class C, class Access>
+    HWY_INLINE void operator()(C chunk, size_t i, Access access) const {
+        if constexpr (C::kUnits == kVectorBytes)
+            movedTo(i).takeNext(chunk);
+        else
+            ConvertThrough32Body<SourceOf<kFrom>, DestinationOf<kTo>>::operator()(chunk, i, access);
+    }
+
+    HWY_INLINE ConvertByCopyBody movedTo(size_t i) const {
+        ConvertByCopyBody moved = *this;
+        moved.src += i * this->kSrcBytes;
+        moved.dst += i * this->kDstBytes;
+        return moved;
+    }
+    template <class C>
+    HWY_INLINE void takeNext(C /*chunk*/) {
+        if constexpr (kTo == PixelFormat::kRgb24)
+            copyWithoutFourth<C::kUnits / kVectorBytes>(this->src, this->dst);
+        else
+            copyWithFourth<C::kUnits / kVectorBytes>(this->src, this->dst);
     }
 };
 

@@ -100,7 +100,9 @@ void convertRectangle(DstRows dst, SrcRows src, Extent extent, const uint32_t *p
                                                                   weights);
         }
         const Through32 body = {{dst.first, src.first}, palette, weights};
-        if constexpr (kHasInterleavedAccess && kFrom != PixelFormat::kIndex)
+        if constexpr (kHasInterleavedAccess && from.bytesPerPixel >= 3 && to.bytesPerPixel >= 3)
+            convertRowsBy(dst, src, extent, ConvertByCopyBody<kFrom, kTo>{body});
+        else if constexpr (kHasInterleavedAccess && kFrom != PixelFormat::kIndex)
             convertRowsBy(dst, src, extent, ConvertByChannelsBody<kFrom, kTo>{body});
         else
             convertRowsBy(dst, src, extent, body);

@@ -18,23 +18,6 @@ HWY_BEFORE_NAMESPACE();
 namespace quillon::HWY_NAMESPACE {
 #if QUILLON_HAS_VECTORS
 
-// Pixels of four bytes, as many as there are lanes, without the fourth.
-template <class D8>
-HWY_INLINE void copyWithoutFourth([[maybe_unused]] D8 d, const uint8_t *src, uint8_t *dst) {
-#if QUILLON_NEON
-    // GCC would copy the vectors between a load of four and a store of three.
-    asm("ld4 {v0.16b-v3.16b}, [%2]\n\t"
-        "st3 {v0.16b-v2.16b}, [%1]"
-        : "=m"(*reinterpret_cast<uint8_t(*)[48]>(dst))
-        : "r"(dst), "r"(src), "m"(*reinterpret_cast<const uint8_t(*)[64]>(src))
-        : "v0", "v1", "v2", "v3");
-#else
-    hn::Vec<D8> first, second, third, fourth;
-    hn::LoadInterleaved4(d, src, first, second, third, fourth);
-    hn::StoreInterleaved3(first, second, third, d, dst);
-#endif
-}
-
 // Within a block: three bytes a pixel to four, and back.
 HWY_ALIGN constexpr uint8_t kSpreadBytes[16] = {0, 1, 2, 0x80, 3, 4,  5,  0x80,
                                                 6, 7, 8, 0x80, 9, 10, 11, 0x80};

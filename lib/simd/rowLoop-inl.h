@@ -25,7 +25,16 @@
 //
 //     template <class Use> void forChunksFrom(size_t begin, const Use &use) const
 //
-// which calls use with the body for these chunks, once a row.
+// which calls use with the body for these chunks, once a row.  A body whose pointers
+// can move along the row, which is for instruction sets whose loads and stores move
+// them without a further instruction, has
+//
+//     static constexpr size_t kMovingUnits;  // of chunks, and those of multiples
+//     Body movedTo(size_t i) const
+//     template <class C> void takeNext(C chunk)      // not const
+//
+// the last of which handles the units at the pointers and moves these behind them; the
+// turns of an unrolled loop are one larger chunk.
 //
 // A row is a head up to the first cache line, whole chunks, and a tail.  All three
 // run the same body, so that there is no second algorithm for the ends of rows,
@@ -112,6 +121,14 @@ template <RowPolicy kPolicy, class Access, size_t kUnits, class Body>
 HWY_INLINE void walkWholeChunks(size_t begin, size_t tail, const Body &body,
                                 [[maybe_unused]] PrefetchDistance distance) {
     constexpr size_t kStep = kPolicy.unroll * kUnits;
+    if constexpr (requires { requires kUnits % Body::kMovingUnits == 0; }) {
+        Body moving = body.movedTo(begin);
+        for (size_t steps = (tail - begin) / kStep; steps != 0; --steps)
+            moving.takeNext(Chunk<kStep>());
+        for (size_t chunks = (tail - begin) % kStep / kUnits; chunks != 0; --chunks)
+            moving.takeNext(Chunk<kUnits>());
+        return;
+    }
     size_t i = begin;
     for (; tail - i >= kStep; i += kStep) {
         if constexpr (kPolicy.prefetches)
