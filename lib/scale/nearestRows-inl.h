@@ -92,6 +92,9 @@ struct NearestGatherBody {
     }
 };
 
+// Pixels one by one: as many as there are registers for.
+inline constexpr size_t kGatheredAtOnce = kGeneralRegisters / 2;
+
 template <class Access>
 struct NearestGathered : NearestRow {
     using NearestRow::NearestRow;
@@ -101,7 +104,7 @@ struct NearestGathered : NearestRow {
         if constexpr (kHasFastGather)
             walkPixelsBy<Access>(inner_, body);
         else
-            walkPixels<8>(inner_, body);
+            walkPixels<kGatheredAtOnce>(inner_, body);
         fillBehindInner(dst, src);
     }
 };

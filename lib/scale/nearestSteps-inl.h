@@ -13,6 +13,7 @@
 
 #include "scale/channels-inl.h"
 #include "scale/nearestRows-inl.h"
+#include "simd/pixelCopies-inl.h"
 
 #include <algorithm>
 #include <bit>
@@ -26,33 +27,31 @@ namespace {
 template <uint32_t kLog2Step>
 struct FirstOfEachBody {
     static constexpr size_t kDstBytes = 4;
+    // More than a chunk has where pointers do not move.
+    static constexpr size_t kMovingUnits = 2 * kVectorPixels;
     uint8_t *dst;
     const uint8_t *src;
 
     template <class C, class Access>
-    HWY_INLINE void operator()(C /*chunk*/, size_t i, Access access) const {
-        const PixelTag<C> d;
+    HWY_INLINE void operator()([[maybe_unused]] C chunk, size_t i, Access access) const {
         const uint8_t *from = src + 4 * (i << kLog2Step);
-        if constexpr (C::kUnits == 2 * kVectorPixels)
-            storeFirstOfEach2(from, dst + 4 * i);
+        if constexpr (C::kUnits == kMovingUnits)
+            movedTo(i).takeNext(chunk);
         else if constexpr (kHasInterleavedAccess && kLog2Step == 3)
             copyFirstOfEach<C::kUnits>(from, dst + 4 * i);
         else
-            access.store(d, firstOfEach<kLog2Step>(d, from), dst + 4 * i);
+            access.store(PixelTag<C>(), firstOfEach<kLog2Step>(PixelTag<C>(), from), dst + 4 * i);
+    }
+
+    HWY_INLINE FirstOfEachBody movedTo(size_t i) const {
+        return {dst + 4 * i, src + 4 * (i << kLog2Step)};
+    }
+    template <class C>
+    HWY_INLINE void takeNext(C /*chunk*/) {
+        copyEvenPixels<C::kUnits / (2 * kVectorPixels)>(src, dst);
     }
 
 private:
-    // By vectors of every second pixel.
-    static HWY_INLINE void storeFirstOfEach2(const uint8_t *from, uint8_t *to) {
-        const Widest<uint32_t> d;
-        hn::Vec<decltype(d)> low, high, other;
-        hn::LoadInterleaved2(d, reinterpret_cast<const uint32_t *>(from), low, other);
-        hn::LoadInterleaved2(d, reinterpret_cast<const uint32_t *>(from) + 2 * kVectorPixels, high,
-                             other);
-        storeBytes(d, low, to);
-        storeBytes(d, high, to + kVectorBytes);
-    }
-
     template <size_t kCount>
     static HWY_INLINE void copyFirstOfEach(const uint8_t *from, uint8_t *to) {
         uint32_t pixels[kCount];
@@ -75,14 +74,22 @@ private:
 };
 
 template <class Access, uint32_t kStep>
-struct NearestFirstOfEach : NearestRow {
+class NearestFirstOfEach : NearestRow {
+    static constexpr uint32_t kLog2Step = std::countr_zero(kStep);
+    static constexpr size_t kUnits = kLog2Step == 1 ? 2 * kVectorPixels : kVectorPixels;
+    using Body = FirstOfEachBody<kLog2Step>;
+
+public:
     explicit NearestFirstOfEach(const ScaleAxis &axis)
         : NearestRow(axis), first_(axis.start >> 16),
           whole_(std::min((axis.srcSize - std::min(first_, axis.srcSize)) >> kLog2Step,
                           axis.dstSize)) {}
 
     HWY_INLINE void operator()(uint8_t *dst, const uint8_t *src) const {
-        walk(FirstOfEachBody<kLog2Step>{dst, src + size_t{4} * first_});
+        if (kHasInterleavedAccess && whole_ >= kUnits)
+            copyInside(dst, src);
+        else
+            walkPixelsBy<Access>(whole_, bodyOf(dst, src));
         if (whole_ != count_) {
             const size_t index = size_t{first_} + (size_t{whole_} << kLog2Step);
             writeEnd(dst + size_t{4} * whole_, src, index, inner_ - whole_, srcSize_ - 1,
@@ -90,15 +97,18 @@ struct NearestFirstOfEach : NearestRow {
         }
     }
 
-private:
-    static constexpr uint32_t kLog2Step = std::countr_zero(kStep);
+    // Whether every step of the row lies in it, and whole chunks do: copyInside is all then.
+    bool isInside() const { return whole_ == count_ && whole_ >= kUnits; }
 
-    HWY_INLINE void walk(const FirstOfEachBody<kLog2Step> &body) const {
-        constexpr size_t kUnits = kLog2Step == 1 ? 2 * kVectorPixels : kVectorPixels;
-        if (kHasInterleavedAccess && whole_ >= kUnits)
-            walkRow<RowPolicy{.unroll = 4}>(Chunk<kUnits>(), whole_, body);
-        else
-            walkPixelsBy<Access>(whole_, body);
+    HWY_INLINE void copyInside(uint8_t *dst, const uint8_t *src) const {
+        if (whole_ < kUnits)
+            __builtin_unreachable();
+        walkRow<RowPolicy{.unroll = 4}>(Chunk<kUnits>(), whole_, bodyOf(dst, src));
+    }
+
+private:
+    HWY_INLINE Body bodyOf(uint8_t *dst, const uint8_t *src) const {
+        return {dst, src + size_t{4} * first_};
     }
 
     // The pixel whose step reaches behind the row, and copies of the last one.

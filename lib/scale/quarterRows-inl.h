@@ -39,16 +39,21 @@ HWY_INLINE hn::Vec<D> averageQuarters(D d, const Neighbours<D> &upper, const Nei
     return hn::BitCast(d, hn::Not(hn::AverageRound(averageRow(upper), averageRow(lower))));
 }
 
-// The same by vectors of every fourth pixel, for twice as many as a vector has.
-HWY_INLINE void averageSplitQuarters(uint8_t *dst, const uint8_t *upper, const uint8_t *lower) {
+// Every fourth pixel of a row, from each of the first four on, by vectors.
+using SplitPixels = hn::Vec<Widest<uint32_t>>[4];
+
+HWY_INLINE void loadSplitPixels(const uint8_t *from, SplitPixels &pixels) {
+    const Widest<uint32_t> d;
+    hn::LoadInterleaved4(d, reinterpret_cast<const uint32_t *>(from), pixels[0], pixels[1],
+                         pixels[2], pixels[3]);
+}
+
+// The same averages of twice as many pixels as a vector has.
+HWY_INLINE void storeSplitQuarters(const SplitPixels &above, const SplitPixels &below,
+                                   uint8_t *dst) {
     const Widest<uint32_t> d;
     const Widest<uint8_t> d8;
     using Pixels = hn::Vec<decltype(d)>;
-    Pixels above[4], below[4];
-    hn::LoadInterleaved4(d, reinterpret_cast<const uint32_t *>(upper), above[0], above[1], above[2],
-                         above[3]);
-    hn::LoadInterleaved4(d, reinterpret_cast<const uint32_t *>(lower), below[0], below[1], below[2],
-                         below[3]);
     const auto averageRow = [&](Pixels left, Pixels right) HWY_ATTR {
         const auto average = averageDown(d8, hn::BitCast(d8, left), hn::BitCast(d8, right));
         return hn::SaturatedSub(average, hn::Set(d8, uint8_t{1}));
@@ -65,14 +70,15 @@ HWY_INLINE void averageSplitQuarters(uint8_t *dst, const uint8_t *upper, const u
 template <bool kToEnd>
 struct QuarterBody {
     static constexpr size_t kDstBytes = 4;
+    static constexpr size_t kMovingUnits = 2 * kVectorPixels;
     uint8_t *dst;
     const uint8_t *upper, *lower;
     uint32_t whole;
 
     template <class C, class Access>
-    HWY_INLINE void operator()(C /*chunk*/, size_t i, Access access) const {
-        if constexpr (C::kUnits == 2 * kVectorPixels)
-            return averageSplitQuarters(dst + 4 * i, upper + 8 * i, lower + 8 * i);
+    HWY_INLINE void operator()([[maybe_unused]] C chunk, size_t i, Access access) const {
+        if constexpr (C::kUnits == kMovingUnits)
+            return movedTo(i).takeNext(chunk);
         const PixelTag<C> d;
         auto above = loadComplements(d, upper + 8 * i);
         auto below = loadComplements(d, lower + 8 * i);
@@ -87,6 +93,28 @@ struct QuarterBody {
             const auto unordered = averageQuarters(d, above, below);
             access.store(d, laneOrderRestored(d, unordered), dst + 4 * i);
         }
+    }
+
+    HWY_INLINE QuarterBody movedTo(size_t i) const {
+        return {dst + 4 * i, upper + 8 * i, lower + 8 * i, whole - static_cast<uint32_t>(i)};
+    }
+    template <class C>
+    HWY_INLINE void takeNext(C /*chunk*/) {
+        static_assert(C::kUnits == kMovingUnits);
+        SplitPixels above, below;
+        loadSplitPixels(upper, above);
+        loadSplitPixels(lower, below);
+        if constexpr (kToEnd) {
+            // The last pixel of the row is the only one that may have no right half.
+            const Widest<uint32_t> d;
+            const auto isWhole = hn::Lt(hn::Add(hn::Iota(d, 0), hn::Iota(d, 1)), hn::Set(d, whole));
+            above[3] = hn::IfThenElseZero(isWhole, above[3]);
+            below[3] = hn::IfThenElseZero(isWhole, below[3]);
+        }
+        storeSplitQuarters(above, below, dst);
+        upper = advancedInRegister(upper, 8 * C::kUnits);
+        lower = advancedInRegister(lower, 8 * C::kUnits);
+        dst = advancedInRegister(dst, 4 * C::kUnits);
     }
 
 private:
@@ -121,10 +149,10 @@ public:
     HWY_INLINE void operator()(uint8_t *dst, const uint8_t *upper, const uint8_t *lower) const {
         const size_t offset = size_t{4} * first_;
         const QuarterBody<true> toEnd = {dst, upper + offset, lower + offset, whole_};
-        if (averaged_ < kVectorPixels)
+        if constexpr (std::is_same_v<Access, NonTemporal>)
+            walkPixelsBy<NonTemporal>(averaged_, toEnd);
+        else if (averaged_ < kUnits)
             walkPixels(averaged_, toEnd);
-        else if constexpr (std::is_same_v<Access, NonTemporal>)
-            walkAlignedRow<NonTemporal>(Chunk<kVectorPixels>(), averaged_, toEnd);
         else
             averageLongRow(toEnd);
         if (averaged_ != count_) {
@@ -135,21 +163,16 @@ public:
     }
 
 private:
+    static constexpr size_t kUnits = kHasInterleavedAccess ? 2 * kVectorPixels : kVectorPixels;
+
     // What whole chunks leave of the averages fits into the last chunk of the row.
     HWY_INLINE void averageLongRow(const QuarterBody<true> &toEnd) const {
         constexpr RowPolicy kInner = {.tail = Tail::kNone};
-        const Chunk<kVectorPixels> chunk;
+        const Chunk<kUnits> chunk;
         const QuarterBody<false> inside = {toEnd.dst, toEnd.upper, toEnd.lower, whole_};
-        size_t begin = 0;
-        if constexpr (kHasInterleavedAccess) {
-            constexpr RowPolicy kSplit = {.tail = Tail::kNone, .unroll = 2};
-            constexpr Chunk<2 * kVectorPixels> kChunk;
-            walkRow<kSplit>(kChunk, whole_, inside);
-            begin = whole_ - whole_ % kChunk.kUnits;
-        }
-        walkFrom<kInner, Unaligned>(chunk, begin, whole_, inside);
-        if (whole_ - whole_ % kVectorPixels != averaged_)
-            toEnd(chunk, averaged_ - kVectorPixels, Unaligned());
+        walkRow<kInner>(chunk, whole_, inside);
+        if (whole_ - whole_ % kUnits != averaged_)
+            toEnd(chunk, averaged_ - kUnits, Unaligned());
     }
 
     uint32_t first_, last_, count_;

@@ -26,6 +26,11 @@ bool isValidScale(double scale) {
     return scale > kMinScale && scale <= kMaxScale;
 }
 
+// Out of line, as it is seldom needed and takes a frame of its own.
+[[gnu::noinline]] uint32_t extendedStepOf(double scale) {
+    return (Extended(kScaleOne) / Extended(scale)).truncated();
+}
+
 // 65536 / scale, rounded to a 64-bit significand and truncated; its low 32 bits.
 uint32_t stepOf(double scale) {
     // The quotient of doubles is below 2^32 and off by 2^-22 at most: truncation
@@ -37,7 +42,7 @@ uint32_t stepOf(double scale) {
     const bool isPowerOfTwo = std::bit_cast<uint64_t>(scale) << 12 == 0;
     if (isPowerOfTwo || (fraction > 0x1p-20 && fraction < 1 - 0x1p-20))
         return static_cast<uint32_t>(whole);
-    return (Extended(kScaleOne) / Extended(scale)).truncated();
+    return extendedStepOf(scale);
 }
 
 // The axis of the destination pixels from first to end, of which there is one at

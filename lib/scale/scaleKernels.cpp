@@ -104,8 +104,9 @@ HWY_INLINE void walkBox(const ScaleJob &job, const Row &row, void *block) {
     }
 }
 
+// Not inlined: its frame is large, and calls that do not come here do without.
 template <class Row>
-void walkRows(const ScaleJob &job, const Row &row, void *block) {
+HWY_NOINLINE void walkRows(const ScaleJob &job, const Row &row, void *block) {
     switch (job.y.method) {
     case ScaleMethod::kNearest:
         return walkDirect<true>(job, row);
@@ -116,13 +117,30 @@ void walkRows(const ScaleJob &job, const Row &row, void *block) {
     }
 }
 
-// Each row is made of two source rows at once: row is called with
-// (uint8_t *dst, const uint8_t *upper, const uint8_t *lower).
-template <class RowOfTwo>
-HWY_INLINE void walkPairs(const ScaleJob &job, const RowOfTwo &row) {
-    for (RowWalk walk(job); !walk.isDone(); walk.next())
-        row(walk.dst, job.src.row(rowOf(job.y, walk.y)),
-            job.src.row(rowOf(job.y, walk.y + kScaleOne)));
+// Steps of whole source rows, without a cache.  Each row is made of kSpan of these, of which
+// row gets the first and, if it is another, the last.  Inside the source they come at a
+// constant distance.
+template <uint32_t kSpan, class RowOfSpan>
+HWY_INLINE void walkWholeSteps(const ScaleJob &job, const RowOfSpan &row) {
+    const ScaleAxis axis = job.y;
+    const auto dstStride = static_cast<uint64_t>(job.dst.stride);
+    const uint64_t srcStep = (axis.step >> 16) * static_cast<uint64_t>(job.src.stride);
+    uint8_t *dst = job.dst.first;
+    uint32_t y = axis.start, count = 0;
+    for (uint32_t left = axis.dstSize; left != 0; left -= count, y += count * axis.step) {
+        const uint32_t inside = stepsBefore(y, (axis.srcSize + 1 - kSpan) << 16, axis.step);
+        const uint8_t *first = job.src.row(rowOf(axis, y));
+        const uint8_t *last = job.src.row(rowOf(axis, y + (kSpan - 1) * kScaleOne));
+        count = std::min(std::max(inside, 1U), left);
+        for (uint32_t i = 0; i < count; ++i, dst = advance(dst, dstStride)) {
+            if constexpr (kSpan == 1)
+                row(dst, first);
+            else
+                row(dst, first, last);
+            first = advance(first, srcStep);
+            last = advance(last, srcStep);
+        }
+    }
 }
 
 // ---- The kernel, by what becomes of the columns -----------------------------
@@ -151,6 +169,23 @@ void walkAlignedNearestRows(const ScaleJob &job) {
         walkDirect<true>(job, Row<Aligned, kNumber...>(job.x));
     else
         walkNearestRows<Row, kNumber...>(job);
+}
+
+// Where a row takes few instructions, those between rows count, too.
+template <uint32_t kStep>
+void walkFirstOfEachRows(const ScaleJob &job) {
+    const bool isWhole = job.y.step % kScaleOne == 0 && !isNonTemporal(job.dstExtent());
+    if (kHasInterleavedAccess && isWhole) {
+        const NearestFirstOfEach<Unaligned, kStep> row(job.x);
+        if (!row.isInside())
+            return walkWholeSteps<1>(job, row);
+        return walkWholeSteps<1>(job, [&](uint8_t *dst, const uint8_t *src)
+                                          HWY_ATTR { row.copyInside(dst, src); });
+    }
+    if constexpr (kStep < 8)
+        walkAlignedNearestRows<NearestFirstOfEach, kStep>(job);
+    else
+        walkNearestRows<NearestFirstOfEach, kStep>(job);
 }
 
 void walkDoubledRows(const ScaleJob &job) {
@@ -189,11 +224,11 @@ void scaleNearest(const ScaleJob &job, void *cache) {
     else if (step < kScaleOne)
         walkNearestRows<NearestPicked, 1>(job);
     else if (step == 2 * kScaleOne)
-        walkAlignedNearestRows<NearestFirstOfEach, 2>(job);
+        walkFirstOfEachRows<2>(job);
     else if (step == 4 * kScaleOne)
-        walkAlignedNearestRows<NearestFirstOfEach, 4>(job);
+        walkFirstOfEachRows<4>(job);
     else if (step == 8 * kScaleOne && picksEighthsFromVectors(job))
-        walkNearestRows<NearestFirstOfEach, 8>(job);
+        walkFirstOfEachRows<8>(job);
     else if (canPick(2))
         walkNearestRows<NearestPicked, 2>(job);
     else if (canPick(3))
@@ -206,9 +241,9 @@ void scaleNearest(const ScaleJob &job, void *cache) {
 
 void scaleQuarter(const ScaleJob &job) {
     if (isNonTemporal(job.dstExtent()))
-        walkPairs(job, QuarterRow<NonTemporal>(job.x));
+        walkWholeSteps<2>(job, QuarterRow<NonTemporal>(job.x));
     else
-        walkPairs(job, QuarterRow<Unaligned>(job.x));
+        walkWholeSteps<2>(job, QuarterRow<Unaligned>(job.x));
 }
 
 void scaleColumns(const ScaleJob &job, void *cache) {
@@ -238,7 +273,7 @@ void scaleKernel(const ScaleJob &job, void *cache) {
 void scaleKernel(const ScaleJob &job, void *cache) {
     const ScaleAxis &x = job.x;
     if (job.isQuarter())
-        walkPairs(job, [&](uint8_t *dst, const uint8_t *upper, const uint8_t *lower) {
+        walkWholeSteps<2>(job, [&](uint8_t *dst, const uint8_t *upper, const uint8_t *lower) {
             quarterRowPlain(x, dst, upper, lower);
         });
     else

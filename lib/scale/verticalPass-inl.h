@@ -112,10 +112,11 @@ private:
 
 // ---- Source rows ----------------------------------------------------------
 
-// The index of the source row of a vertical position.
+// The index of the source row of a vertical position.  Those above the first row are
+// negative.
 HWY_INLINE uint32_t rowOf(const ScaleAxis &axis, uint32_t position) {
-    const bool isAbove = position >> 31 != 0;
-    return isAbove ? 0 : std::min(position >> 16, axis.srcSize - 1);
+    const auto inside = static_cast<uint32_t>(std::max(static_cast<int32_t>(position), 0));
+    return std::min(inside >> 16, axis.srcSize - 1);
 }
 
 // The source rows that neighbouring destination rows share, after the horizontal pass,

@@ -42,6 +42,16 @@ HWY_INLINE V inRegister(V v) {
     return v;
 }
 
+// The pointer moved on, in a register of its own, which an instruction that loads or
+// stores through it may move by itself.  The compiler would compute every address from
+// that of the first one.
+template <class Byte>
+HWY_INLINE Byte *advancedInRegister(Byte *pointer, size_t bytes) {
+    pointer += bytes;
+    asm("" : "+r"(pointer));
+    return pointer;
+}
+
 // Keeps the stores before it ahead of those after it in the code.  Processors write
 // two vectors to one cache line at once where their stores come one after the other,
 // and GCC takes any order.  Elsewhere two stores may become one instruction.

@@ -77,6 +77,9 @@ inline constexpr bool kHasInterleavedAccess = QUILLON_NEON;
 // Products of bytes in lanes of twice the size, in one instruction for half a vector.
 inline constexpr bool kHasWideningProducts = QUILLON_NEON;
 
+// Registers of the processor that are not vectors.
+inline constexpr size_t kGeneralRegisters = HWY_ARCH_X86 ? 16 : 32;
+
 // Whether to prefetch: what the processor does not do of itself is measured on x86.
 inline constexpr bool kPrefetchesAhead = HWY_ARCH_X86;
 
