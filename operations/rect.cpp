@@ -8,6 +8,7 @@
 #include <algorithm>
 #include <cstring>
 #include <limits>
+
 namespace quillon::test {
 namespace {
 

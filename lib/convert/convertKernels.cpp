@@ -89,6 +89,8 @@ HWY_INLINE void convertRowsBy(DstRows dst, SrcRows src, Extent extent, const Bod
 template <PixelFormat kFrom, PixelFormat kTo>
 void convertRectangle(DstRows dst, SrcRows src, Extent extent, const uint32_t *palette) {
     constexpr FormatTraits from = traitsOf(kFrom), to = traitsOf(kTo);
+    static_assert(from.bytesPerPixel > 1 || kFrom == PixelFormat::kIndex,
+                  "SourceOf takes single bytes for palette indices");
     if constexpr (from.bytesPerPixel == 2 && to.bytesPerPixel <= 2) {
         convertRowsBy(dst, src, extent, ConvertFrom16Body<kFrom, kTo>{{dst.first, src.first}});
     } else {

@@ -1,8 +1,7 @@
-// The video operations stated as plainly as they can be, as in raster.h beside
-// this file.
+// The video operations stated as plainly as they can be, one pixel at a time.
 #pragma once
 
-#include <quillon/raster.h> // in brackets: there is a file of this name here
+#include <quillon/raster.h>
 
 namespace quillon::reference {
 

@@ -7,8 +7,6 @@
 #include <gtest/gtest.h>
 #include <quillon/imageUtil.h>
 
-#include <gtest/gtest.h>
-
 namespace quillon::test {
 
 struct Format {

@@ -123,7 +123,7 @@ protected:
     int32_t stride_ = 0;
     Size size_;
     Format format_ = Format::kBgra32;
-    bool hasSpareColumn_ = false; // a pixel behind every row, of which nobody knows
+    bool hasSpareColumn_ = false; // memory for a pixel behind every row, part of no surface
 
 private:
     friend class Surface;
