@@ -30,7 +30,7 @@ public:
 
     HWY_INLINE explicit LookupTable(const uint8_t *entries) {
         for (size_t i = 0; i < 4; ++i)
-            pairs[i] = _mm512_loadu_si512(entries + 64 * i);
+            pairs_[i] = _mm512_loadu_si512(entries + 64 * i);
     }
 
     // In lanes of words, which have two indices each and look up pairs of entries.
@@ -50,11 +50,11 @@ public:
     }
 
 private:
-    __m512i pairs[4];
+    __m512i pairs_[4];
 
     HWY_INLINE __m512i pairsAt(__m512i index, __mmask32 isHigh) const {
-        const __m512i low = _mm512_permutex2var_epi16(pairs[0], index, pairs[1]);
-        const __m512i high = _mm512_permutex2var_epi16(pairs[2], index, pairs[3]);
+        const __m512i low = _mm512_permutex2var_epi16(pairs_[0], index, pairs_[1]);
+        const __m512i high = _mm512_permutex2var_epi16(pairs_[2], index, pairs_[3]);
         return _mm512_mask_blend_epi16(isHigh, low, high);
     }
 };
@@ -66,7 +66,7 @@ public:
 
     HWY_INLINE explicit LookupTable(const uint8_t *entries) {
         for (size_t i = 0; i < 8; ++i)
-            words[i] = _mm512_loadu_si512(entries + 64 * i);
+            words_[i] = _mm512_loadu_si512(entries + 64 * i);
     }
 
     template <class C, class Access>
@@ -82,11 +82,11 @@ public:
     }
 
 private:
-    __m512i words[8];
+    __m512i words_[8];
 
     template <size_t kQuarter>
     HWY_INLINE __m512i quarter(__m512i index) const {
-        return _mm512_permutex2var_epi16(words[2 * kQuarter], index, words[2 * kQuarter + 1]);
+        return _mm512_permutex2var_epi16(words_[2 * kQuarter], index, words_[2 * kQuarter + 1]);
     }
 };
 
@@ -112,20 +112,20 @@ class LookupTable<1> {
 public:
     static constexpr size_t kUnits = 64;
 
-    explicit LookupTable(const uint8_t *entries) : bytes(entries) {}
+    explicit LookupTable(const uint8_t *entries) : bytes_(entries) {}
 
     template <class C, class Access>
     HWY_INLINE void lookUp(C /*chunk*/, const uint8_t *from, uint8_t *to, Access /*access*/) const {
         uint8x16_t index[4], found[4];
         for (size_t v = 0; v < 4; ++v)
             index[v] = vld1q_u8(from + 16 * v);
-        lookUpBytes(bytes, index, found);
+        lookUpBytes(bytes_, index, found);
         for (size_t v = 0; v < 4; ++v)
             vst1q_u8(to + 16 * v, found[v]);
     }
 
 private:
-    const uint8_t *bytes;
+    const uint8_t *bytes_;
 };
 
 template <>
@@ -136,8 +136,8 @@ public:
     explicit LookupTable(const uint8_t *entries) {
         for (size_t i = 0; i < 256; i += 16) {
             const uint8x16x2_t split = vld2q_u8(entries + 2 * i);
-            vst1q_u8(low + i, split.val[0]);
-            vst1q_u8(high + i, split.val[1]);
+            vst1q_u8(low_ + i, split.val[0]);
+            vst1q_u8(high_ + i, split.val[1]);
         }
     }
 
@@ -146,10 +146,10 @@ public:
         uint8x16_t index[4], lowFound[4], highFound[4];
         for (size_t v = 0; v < 4; ++v)
             index[v] = vld1q_u8(from + 16 * v);
-        lookUpBytes(low, index, lowFound);
+        lookUpBytes(low_, index, lowFound);
         // Not both at once, for which there are not enough registers.
         asm volatile("" ::: "memory");
-        lookUpBytes(high, index, highFound);
+        lookUpBytes(high_, index, highFound);
         for (size_t v = 0; v < 4; ++v) {
             vst1q_u8(to + 32 * v, vzip1q_u8(lowFound[v], highFound[v]));
             vst1q_u8(to + 32 * v + 16, vzip2q_u8(lowFound[v], highFound[v]));
@@ -157,7 +157,7 @@ public:
     }
 
 private:
-    HWY_ALIGN uint8_t low[256], high[256];
+    HWY_ALIGN uint8_t low_[256], high_[256];
 };
 
 #endif
