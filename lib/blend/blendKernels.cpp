@@ -110,7 +110,8 @@ HWY_INLINE void walkBlendRow(size_t width, const Body &body) {
         constexpr RowPolicy kWhole = {.tail = Tail::kNone}, kRest = {.tail = Tail::kExact};
         walkRow<kWhole>(Chunk<kVectorBytes>(), width, body);
         const size_t rest = width % kVectorBytes;
-        walkFrom<kRest, Unaligned>(Chunk<kVectorBytes / 4>(), width - rest, width, body);
+        if (rest != 0)
+            walkFrom<kRest, Unaligned>(Chunk<kVectorBytes / 4>(), width - rest, width, body);
     } else {
         walkRowOnce<4>(width, body);
     }

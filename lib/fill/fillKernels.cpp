@@ -66,7 +66,8 @@ void fillShortRows(D d, DstRows dst, ByteExtent extent, const PixelPattern &patt
 
 template <class Access>
 void fillLongRows(DstRows dst, ByteExtent extent, const PixelPattern &pattern) {
-    constexpr RowPolicy kPolicy = {.tail = Tail::kNone, .unroll = 6};
+    // Multiples of the three vectors of a pattern.
+    constexpr RowPolicy kPolicy = {.tail = Tail::kNone, .unroll = kHasPairedStores ? 12 : 6};
     constexpr Chunk<kVectorBytes> kChunk;
     const Widest<uint32_t> d;
     const auto first = pattern.from(d, 0);

@@ -135,7 +135,14 @@ HWY_INLINE void walkWholeChunks(size_t begin, size_t tail, const Body &body,
             body.prefetch(Chunk<kStep>(), i, distance);
         walkTurns<Access, kUnits>(i, body, std::make_index_sequence<kPolicy.unroll>());
     }
-    walkRestOfTurns<Access, kUnits, kPolicy.unroll, 0>(i, tail, body);
+    // One test for half of the chunks that may be left, where these are many.
+    constexpr bool kHasHalfStep = kPolicy.unroll >= 12;
+    constexpr size_t kRest = kHasHalfStep ? kPolicy.unroll / 2 : kPolicy.unroll;
+    if (kHasHalfStep && tail - i >= kRest * kUnits) {
+        walkTurns<Access, kUnits>(i, body, std::make_index_sequence<kRest>());
+        i += kRest * kUnits;
+    }
+    walkRestOfTurns<Access, kUnits, kRest, 0>(i, tail, body);
 }
 
 // Tail::kOverlapInLoop: the last chunk is moved back to end with the row.

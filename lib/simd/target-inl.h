@@ -77,6 +77,9 @@ inline constexpr bool kHasInterleavedAccess = QUILLON_NEON;
 // Products of bytes in lanes of twice the size, in one instruction for half a vector.
 inline constexpr bool kHasWideningProducts = QUILLON_NEON;
 
+// Stores of two vectors side by side in one instruction, which compilers make of two.
+inline constexpr bool kHasPairedStores = QUILLON_NEON;
+
 // Registers of the processor that are not vectors.
 inline constexpr size_t kGeneralRegisters = HWY_ARCH_X86 ? 16 : 32;
 
