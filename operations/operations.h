@@ -21,7 +21,7 @@ void tryBits(Random &random, std::optional<Shape> shape = {});
 void tryConvert(Random &random, std::optional<Shape> shape = {});
 void tryColorKey(Random &random, std::optional<Shape> shape = {});
 
-// A stencil over a page that begins or ends in the midst of it.
+// A stencil over a page that begins or ends within it.
 void tryStencilBesidePage(Random &random);
 // One pixel; the placing of a component in a channel; a mode.
 void tryConvertOne(Random &random);

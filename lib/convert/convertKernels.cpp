@@ -34,7 +34,7 @@ HWY_NOINLINE void convertShortRows(Chunk<kUnits> chunk, DstRows dst, SrcRows src
                                    .unroll = kIsUnrolled ? 4 : 1,
                                    .prefetches = kUnits >= kConvertPrefetchRow};
     const PrefetchDistance nextRow = {dst.stride, src.stride};
-    // With rows that might be empty, compilers set up constants anew in each.
+    // With rows that might be empty, compilers set up constants again in each.
     if (extent.width < kUnits || extent.height == 0)
         __builtin_unreachable();
     Body body = constants;

@@ -18,7 +18,7 @@ namespace {
 
 // ---- Fill -----------------------------------------------------------------
 
-// A row whose first and last vector are stored as they come and overlap those
+// A row whose first and last vector are stored unaligned and overlap those
 // between, which are aligned.
 template <class D>
 struct FillBody {

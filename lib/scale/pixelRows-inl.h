@@ -59,7 +59,7 @@ HWY_INLINE void walkPixels(size_t count, const Body &body, size_t limit = kMost)
                                            WalkWithChunk<Body>{count, body});
 }
 
-// The same, whose stores are as they come (Unaligned), or begin with a cache line and
+// The same, whose stores are unaligned (Unaligned), or begin with a cache line and
 // go through the caches (Aligned) or around them (NonTemporal).  The access is chosen
 // once for all rows: a row that decides by itself costs short ones a fifth.
 template <class Access, size_t kMost = kVectorPixels, class Body>

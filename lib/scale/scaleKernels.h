@@ -40,7 +40,7 @@ inline constexpr uint32_t kScaleNoRow = 0xFFFFFFFF;
 // The row cache has a slot for every source row that one destination row can need,
 // so that none is scaled twice.  Row 0 goes to slot 0, any other row r to slot
 // 1 + r % (slotCount - 1), the divisor being a power of two: a position that wraps
-// comes back to row 0 in the midst of a span, and must not take the place of a row
+// comes back to row 0 within a span, and must not take the place of a row
 // of that span.
 struct ScaleCacheShape {
     static constexpr size_t kAlignment = 64;

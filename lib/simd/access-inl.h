@@ -33,7 +33,7 @@ HWY_INLINE void storeBytes(D d, hn::Vec<D> v, uint8_t *to) {
 }
 
 // The vector itself.  Where every use of a loaded vector can have an operand in
-// memory, GCC loads it for each of them anew: this makes it one load.
+// memory, GCC loads it again for each of them: this makes it one load.
 template <class V>
 HWY_INLINE V inRegister(V v) {
 #if QUILLON_X86_AVX512
@@ -176,8 +176,8 @@ HWY_INLINE void storeSelected(D d, hn::Mask<D> mask, hn::Vec<D> v, uint8_t *to) 
 
 inline constexpr size_t kLineBytes = 64; // of a cache line
 
-// How far ahead of the chunk at hand to ask for memory, in bytes; 0 not at all.
-// The processor itself asks ahead inside a page, but not beyond, and not for the
+// How far ahead of the current chunk to prefetch, in bytes; 0 not at all.
+// The processor itself prefetches inside a page, but not beyond, and not for the
 // next row.
 struct PrefetchDistance {
     ptrdiff_t dst, src;

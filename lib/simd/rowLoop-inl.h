@@ -216,7 +216,7 @@ HWY_INLINE size_t headOf(const uint8_t *dst) {
 }
 
 // The same, whose whole chunks begin with a cache line and have the given access.
-// Rows of which no group begins a line, and short ones, are walked as they come, and
+// Rows of which no group begins a line, and short ones, are walked unaligned, and
 // without prefetching.
 template <class Access, RowPolicy kPolicy = RowPolicy{}, size_t kUnits, class Body>
 HWY_INLINE void walkAlignedRow(Chunk<kUnits> chunk, size_t count, const Body &body,

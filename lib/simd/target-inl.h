@@ -1,4 +1,4 @@
-// What the instruction set at hand can do.  Kernels ask these constants, and
+// What the current instruction set can do.  Kernels ask these constants, and
 // never for a target: a newer Highway has targets that this source does not know,
 // and what fits one of them by its name would be wrong on the next.
 //

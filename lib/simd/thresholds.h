@@ -49,7 +49,7 @@ constexpr bool isPrefetchedStencil(ByteExtent dst) {
 
 // ---- Lengths of rows, in bytes ---------------------------------------------
 
-// The fill: rows of up to so many vectors are stored as they come, without a loop.
+// The fill: rows of up to so many vectors are stored unaligned, without a loop.
 inline constexpr size_t kFillShortVectors = 8;
 
 // The copy: rows up to here are held in registers, where the call of memmove would
@@ -60,7 +60,7 @@ inline constexpr size_t kCopyShortRow = 128;
 // memcpy, which has more means for longer ones.
 inline constexpr size_t kCopyMediumRow = 8192;
 
-// Bits to pixels: rows of up to so many vectors are stored as they come.  To align
+// Bits to pixels: rows of up to so many vectors are stored unaligned.  To align
 // them costs two chunks that are in part stored twice, more than the vectors that
 // lie across two cache lines.
 inline constexpr size_t kExpandUnalignedVectors = 16;

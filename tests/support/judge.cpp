@@ -51,7 +51,7 @@ void forEachCase(uint64_t count, const std::function<void(Random &)> &run) {
     const uint64_t end = only ? *only + 1 : (count + share - 1) / share;
     for (uint64_t number = only.value_or(0); number < end; ++number) {
         running.number = number;
-        // Mixed once more, lest neighbouring cases share their numbers.
+        // Mixed once more, so that neighbouring cases do not share their numbers.
         Random random(Random(baseSeed() + number).bits());
         run(random);
         if (testing::Test::HasFailure()) {

@@ -114,7 +114,7 @@ private:
             return std::nullopt;
         const auto width = static_cast<size_t>(size.width);
         const auto height = static_cast<size_t>(size.height);
-        // A byte at least, lest an empty cursor be taken for one without memory.
+        // A byte at least: for an empty cursor calloc may give null, too.
         const auto block = [&] {
             return detail::Block(static_cast<uint8_t *>(std::calloc(width * height * 4 + 1, 1)));
         };
