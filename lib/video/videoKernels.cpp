@@ -160,7 +160,6 @@ struct PlanarFrame {
 
 #endif
 
-// NOLINTNEXTLINE(readability-non-const-parameter): the frame writes to dst
 void convertInterleavedKernel(uint8_t *dst, int32_t bppdepth, const uint8_t *src, uint32_t format,
                               size_t pixels) {
     if (format == RASTER_VIDEO_YUY2)
