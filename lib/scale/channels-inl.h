@@ -15,7 +15,6 @@
 #include "hwy/highway.h"
 
 #include "simd/access-inl.h"
-#include "simd/products-inl.h"
 #include "simd/shuffle-inl.h"
 #include "simd/target-inl.h"
 
@@ -49,26 +48,6 @@ struct ChannelPairs {
         return hn::BitCast(D16(), hn::Or(values, hn::ShiftLeft<16>(values)));
     }
 };
-
-// a and b by weights that sum to 255, of which b's stand in the lanes of its pixels.
-template <class D>
-HWY_INLINE hn::Vec<D> blendPixels(D d, hn::Vec<D> a, hn::Vec<D> b, hn::Vec<D> weightOfB) {
-    if constexpr (kHasWideningProducts && kBytesOf<D> == kVectorBytes) {
-        const hn::Repartition<uint8_t, D> d8;
-        const auto weights = hn::Mul(weightOfB, hn::Set(d, 0x01010101));
-        return hn::BitCast(
-            d, blendBytes(d8, hn::BitCast(d8, a), hn::BitCast(d8, b), hn::BitCast(d8, weights)));
-    } else {
-        using Channels = ChannelPairs<D>;
-        const auto weightA = Channels::weights(hn::Sub(hn::Set(d, 0xFF), weightOfB));
-        const auto weightB = Channels::weights(weightOfB);
-        const auto evens =
-            hn::Add(hn::Mul(Channels::even(a), weightA), hn::Mul(Channels::even(b), weightB));
-        const auto odds =
-            hn::Add(hn::Mul(Channels::odd(a), weightA), hn::Mul(Channels::odd(b), weightB));
-        return Channels::interleave(Channels::highBytes(evens), Channels::highBytes(odds));
-    }
-}
 
 // Of two vectors of pixels end to end those with even places, and their neighbours
 // to the right.

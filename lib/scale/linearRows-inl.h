@@ -11,7 +11,7 @@
 
 #include "hwy/highway.h"
 
-#include "scale/channels-inl.h"
+#include "scale/pixelBlend-inl.h"
 #include "scale/pixelRows-inl.h"
 #include "scale/scaleAxis.h"
 
@@ -33,15 +33,13 @@ struct LinearBody {
     HWY_INLINE void operator()(C /*chunk*/, size_t i, Access access) const {
         const PixelTag<C> d;
         const uint32_t first = start + static_cast<uint32_t>(i) * step;
-        const auto x = positionsFrom(d, first, step);
         const uint32_t base = std::min(first >> 16, srcSize - 1 - uint32_t{C::kUnits});
+        const auto x = positionsFrom(d, first - (base << 16), step);
         const uint8_t *window = src + size_t{4} * base;
-        const auto index = hn::Sub(hn::ShiftRight<16>(x), hn::Set(d, base));
+        const auto index = hn::ShiftRight<16>(x);
         const auto left = pickFromWindows<1>(d, window, index);
         const auto right = pickFromWindows<1>(d, window + 4, index);
-
-        const auto rightWeight = hn::And(hn::ShiftRight<8>(x), hn::Set(d, 0xFFu));
-        access.store(d, blendPixels(d, left, right, rightWeight), dst + 4 * i);
+        access.store(d, PixelBlend<decltype(d)>(d, x)(d, left, right), dst + 4 * i);
     }
 };
 

@@ -13,6 +13,7 @@
 #include "hwy/highway.h"
 
 #include "scale/channels-inl.h"
+#include "scale/pixelBlend-inl.h"
 #include "scale/pixelRows-inl.h"
 #include "scale/scaleKernels.h"
 #include "scale/scalePlain.h"
@@ -38,7 +39,8 @@ struct BlendRowsBody {
     HWY_INLINE void operator()(C /*chunk*/, size_t i, Access access) const {
         const PixelTag<C> d;
         const auto above = access.load(d, upper + 4 * i), below = access.load(d, lower + 4 * i);
-        access.store(d, blendPixels(d, above, below, hn::Set(d, lowerWeight)), dst + 4 * i);
+        const PixelBlend<PixelTag<C>> blend(d, lowerWeight);
+        access.store(d, blend(d, above, below), dst + 4 * i);
     }
 };
 

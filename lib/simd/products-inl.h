@@ -70,18 +70,24 @@ HWY_INLINE hn::Vec<D> weightedByteSum(D d, hn::Vec<D> v, uint32_t bytes, uint32_
 #endif
 }
 
-// Of each 16-bit lane the sum of its two signed bytes by an unsigned factor each,
-// which fits 16 bits.
-template <uint8_t kLower, uint8_t kUpper, class D16>
-HWY_INLINE hn::Vec<D16> weightedPairSum(D16 d, hn::Vec<D16> v) {
+// Of each 16-bit lane the sum of its two signed bytes, each by the unsigned byte of factors
+// at its place, which fits 16 bits.
+template <class D16>
+HWY_INLINE hn::Vec<D16> pairSum(D16 d, hn::Vec<D16> factors, hn::Vec<D16> v) {
 #if QUILLON_X86_SSSE3
-    const auto factors = hn::Set(d, static_cast<int16_t>(kUpper << 8 | kLower));
     return detail::multiplyBytes(d, factors, v);
 #else
+    const auto byte = hn::Set(d, 0xFF);
     const auto lower = hn::ShiftRight<8>(hn::ShiftLeft<8>(v));
-    return hn::Add(hn::Mul(lower, hn::Set(d, kLower)),
-                   hn::Mul(hn::ShiftRight<8>(v), hn::Set(d, kUpper)));
+    return hn::Add(hn::Mul(lower, hn::And(factors, byte)),
+                   hn::Mul(hn::ShiftRight<8>(v), hn::And(hn::ShiftRight<8>(factors), byte)));
 #endif
+}
+
+// The same by two factors.
+template <uint8_t kLower, uint8_t kUpper, class D16>
+HWY_INLINE hn::Vec<D16> weightedPairSum(D16 d, hn::Vec<D16> v) {
+    return pairSum(d, hn::Set(d, static_cast<int16_t>(kUpper << 8 | kLower)), v);
 }
 
 // Vectors of lanes of twice the size: of the lower lanes of a vector and the upper ones.

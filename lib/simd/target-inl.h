@@ -83,6 +83,9 @@ inline constexpr bool kHasPairedStores = QUILLON_NEON;
 // Registers of the processor that are not vectors.
 inline constexpr size_t kGeneralRegisters = HWY_ARCH_X86 ? 16 : 32;
 
+// Products of unsigned by signed bytes, added in pairs, in one instruction.
+inline constexpr bool kHasPairProducts = QUILLON_X86_SSSE3;
+
 // Whether to prefetch: what the processor does not do of itself is measured on x86.
 inline constexpr bool kPrefetchesAhead = HWY_ARCH_X86;
 
