@@ -253,8 +253,8 @@ HWY_INLINE void walkRowOnce(size_t count, const Body &body) {
         if (count < 8 * kUnits || past % kUnitBytes != 0)
             return walkRow<kPolicy>(chunk, count, body);
         const size_t head = past == 0 ? 0 : kUnits - past / kUnitBytes;
-        if (head != 0)
-            body(chunk, 0, FirstLanes{head});
+        // Not by a masked chunk: the next load would wait for all of that to be stored.
+        walkHalves<kUnits / 2>(0, head, body);
         walkFrom<kPolicy, Unaligned>(chunk, head, count, body);
     } else {
         constexpr RowPolicy kPolicy = {.tail = Tail::kExact, .unroll = 2};
@@ -277,14 +277,13 @@ template <size_t kUnitBytes, class Body>
 HWY_INLINE void walkRowOnceBackward(size_t count, const Body &body) {
     constexpr size_t kUnits = kVectorBytes / kUnitBytes;
     const Chunk<kUnits> chunk;
+    if (kHasMaskedTails && count < kUnits)
+        return body(chunk, 0, FirstLanes{count});
     for (; count >= kUnits; count -= kUnits)
         body(chunk, count - kUnits, Unaligned());
-    if constexpr (kHasMaskedTails) {
-        if (count != 0)
-            body(chunk, 0, FirstLanes{count});
-    } else {
+    // Not by a masked chunk: its load would wait for the chunk that was stored before.
+    if (count != 0)
         walkHalvesBackward<kUnits / 2>(count, body);
-    }
 }
 
 #endif
