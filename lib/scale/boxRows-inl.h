@@ -73,6 +73,28 @@ private:
 
 // ---- Short spans ----------------------------------------------------------
 
+// Lookups that give both halves of a lane its bytes kLower and kUpper, or 0 for kNoByte.
+inline constexpr uint8_t kNoByte = 0x80;
+template <uint8_t kLower, uint8_t kUpper>
+struct BytesInHalves {
+    alignas(16) uint8_t from[16] = {};
+    constexpr BytesInHalves() {
+        for (size_t i = 0; i < 16; ++i) {
+            const uint8_t byte = i % 2 == 0 ? kLower : kUpper;
+            from[i] = byte == kNoByte ? byte : static_cast<uint8_t>(i / 4 * 4 + byte);
+        }
+    }
+};
+template <uint8_t kLower, uint8_t kUpper>
+inline constexpr BytesInHalves<kLower, kUpper> kBytesInHalves;
+
+template <uint8_t kLower, uint8_t kUpper, class D>
+HWY_INLINE hn::Vec<D> bytesToHalves(D d, hn::Vec<D> v) {
+    const hn::Repartition<uint8_t, D> d8;
+    const auto from = hn::LoadDup128(d8, kBytesInHalves<kLower, kUpper>.from);
+    return hn::BitCast(d, hn::TableLookupBytesOr0(hn::BitCast(d8, v), from));
+}
+
 // Averages over kWhole pixels and a fraction, none of which reaches to the last
 // pixel.
 template <uint32_t kWhole>
@@ -91,31 +113,29 @@ struct ShortSpansBody {
     template <class C, class Access>
     HWY_INLINE void operator()(C /*chunk*/, size_t i, Access access) const {
         const PixelTag<C> d;
-        using Channels = ChannelPairs<PixelTag<C>>;
+        const hn::Repartition<uint16_t, PixelTag<C>> d16;
         const uint32_t start = axis.start + static_cast<uint32_t>(i) * axis.step;
-        const auto x = positionsFrom(d, start, axis.step);
-        const auto end = hn::Add(x, hn::Set(d, axis.step));
-        const auto first = hn::ShiftRight<16>(x);
-        const auto last = hn::ShiftRight<16>(end);
-
-        const auto fraction = hn::Set(d, 0xFFFFu);
-        const auto head = hn::ShiftRight<8>(hn::Sub(hn::Set(d, kScaleOne), hn::And(x, fraction)));
-        const auto tail = hn::ShiftRight<8>(hn::And(end, fraction));
-        // The pixel kWhole behind the first is the last one, or one before it.
-        const auto isLast = hn::Eq(last, hn::Add(first, hn::Set(d, kWhole)));
-        const auto middle = hn::IfThenElse(isLast, tail, hn::Set(d, 256u));
-        const auto behind = hn::IfThenZeroElse(isLast, tail);
-
         const uint32_t base =
             std::min(start >> 16, axis.srcSize - kWindows - kWindows * uint32_t{C::kUnits});
-        const auto index = hn::Sub(first, hn::Set(d, base));
+        const auto x = positionsFrom(d, start - (base << 16), axis.step);
+        const auto end = hn::Add(x, hn::Set(d, axis.step));
+        const auto index = hn::ShiftRight<16>(x);
+
+        // Weights are 256ths, once for each half of a lane.
+        const auto rest = hn::Sub(hn::Set(d, kScaleOne), hn::And(x, hn::Set(d, 0xFFFFu)));
+        const auto head = bytesToHalves<1, 2>(d, rest), tail = bytesToHalves<1, kNoByte>(d, end);
+        // The pixel kWhole behind the first is the last one, or one before it.
+        const auto isLast = hn::Eq(hn::ShiftRight<16>(end), hn::Add(index, hn::Set(d, kWhole)));
+        const auto middle = hn::IfThenElse(isLast, tail, hn::Set(d, 0x01000100u));
+        const auto behind = hn::IfThenZeroElse(isLast, tail);
+
         const uint8_t *window = src + size_t{4} * base;
         ChannelSums<PixelTag<C>> sums;
-        sums.add(pickFromWindows<kWindows>(d, window, index), Channels::weights(head));
+        sums.add(pickFromWindows<kWindows>(d, window, index), hn::BitCast(d16, head));
         for (uint32_t whole = 1; whole < kWhole; ++whole)
             sums.add(pickFromWindows<kWindows>(d, window += 4, index));
-        sums.add(pickFromWindows<kWindows>(d, window += 4, index), Channels::weights(middle));
-        sums.add(pickFromWindows<kWindows>(d, window += 4, index), Channels::weights(behind));
+        sums.add(pickFromWindows<kWindows>(d, window += 4, index), hn::BitCast(d16, middle));
+        sums.add(pickFromWindows<kWindows>(d, window += 4, index), hn::BitCast(d16, behind));
         access.store(d, sums.average(axis.normaliser), dst + 4 * i);
     }
 };

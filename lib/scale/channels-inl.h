@@ -40,6 +40,21 @@ struct ChannelPairs {
     }
     static HWY_INLINE Pairs highBytes(Pairs sums) { return hn::ShiftRight<8>(sums); }
 
+    // Channels by weights of up to 256, divided by 256.
+    static HWY_INLINE Pairs weightedEven(Pixels pixels, Pairs weights) {
+        if constexpr (kHasHighProducts)
+            return hn::MulHigh(hn::ShiftLeft<8>(hn::BitCast(D16(), pixels)), weights);
+        else
+            return highBytes(hn::Mul(even(pixels), weights));
+    }
+    static HWY_INLINE Pairs weightedOdd(Pixels pixels, Pairs weights) {
+        if constexpr (kHasHighProducts)
+            return hn::MulHigh(hn::And(hn::BitCast(D16(), pixels), hn::Set(D16(), 0xFF00)),
+                               weights);
+        else
+            return highBytes(hn::Mul(odd(pixels), weights));
+    }
+
     static HWY_INLINE Pairs weight(uint32_t value) {
         return hn::Set(D16(), static_cast<uint16_t>(value));
     }
@@ -87,8 +102,8 @@ public:
         odds_ = hn::Add(odds_, Channels::odd(pixels));
     }
     HWY_INLINE void add(hn::Vec<D> pixels, typename ChannelPairs<D>::Pairs weight) {
-        evens_ = hn::Add(evens_, Channels::highBytes(hn::Mul(Channels::even(pixels), weight)));
-        odds_ = hn::Add(odds_, Channels::highBytes(hn::Mul(Channels::odd(pixels), weight)));
+        evens_ = hn::Add(evens_, Channels::weightedEven(pixels, weight));
+        odds_ = hn::Add(odds_, Channels::weightedOdd(pixels, weight));
     }
 
     // The sums by a normaliser below 65536 and divided by 65536, which fit 8 bits.

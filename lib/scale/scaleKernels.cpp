@@ -96,7 +96,7 @@ HWY_INLINE void walkBox(const ScaleJob &job, const Row &row, void *block) {
             const uint32_t toNext = kScaleOne - (position & 0xFFFF);
             const uint32_t covered = std::min(toNext, remaining);
             const uint32_t weight = std::min<uint32_t>(covered >> 8, 255);
-            taps[tapCount++] = {cache.fetch(position), weight};
+            taps[tapCount++] = {cache.fetch(position), weight * 0x00010001};
             position += covered;
             remaining -= covered;
         }

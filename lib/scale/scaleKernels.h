@@ -26,7 +26,7 @@ struct ScaleJob {
 // A source row in the average of a destination row.
 struct ScaleTap {
     const uint8_t *pixels; // after the horizontal pass
-    uint32_t weight;       // 0 to 255
+    uint32_t weights;      // 0 to 255, once for each half
 };
 inline constexpr size_t kScaleMaxTaps = 32;
 

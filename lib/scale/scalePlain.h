@@ -122,7 +122,7 @@ inline void averageRowsPlain(uint8_t *dst, const ScaleTap *taps, size_t tapCount
     for (size_t i = 0; i < width; ++i) {
         PlainSum sum;
         for (size_t tap = 0; tap < tapCount; ++tap)
-            sum.add(pixelAt(taps[tap].pixels, i), taps[tap].weight);
+            sum.add(pixelAt(taps[tap].pixels, i), taps[tap].weights & 0xFF);
         putPixel(dst, i, sum.average(normaliser));
     }
 }

@@ -54,10 +54,11 @@ struct AverageRowsBody {
     template <class C, class Access>
     HWY_INLINE void operator()(C /*chunk*/, size_t i, Access access) const {
         const PixelTag<C> d;
+        const hn::Repartition<uint16_t, PixelTag<C>> d16;
         ChannelSums<PixelTag<C>> sums;
         for (const ScaleTap *tap = taps; tap != taps + tapCount; ++tap)
             sums.add(access.load(d, tap->pixels + 4 * i),
-                     ChannelPairs<PixelTag<C>>::weight(tap->weight));
+                     hn::BitCast(d16, hn::Set(d, tap->weights)));
         access.store(d, sums.average(normaliser), dst + 4 * i);
     }
 };

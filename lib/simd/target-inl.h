@@ -83,6 +83,9 @@ inline constexpr bool kHasPairedStores = QUILLON_NEON;
 // Registers of the processor that are not vectors.
 inline constexpr size_t kGeneralRegisters = HWY_ARCH_X86 ? 16 : 32;
 
+// The upper halves of 16-bit products, in one instruction.
+inline constexpr bool kHasHighProducts = HWY_ARCH_X86;
+
 // Products of unsigned by signed bytes, added in pairs, in one instruction.
 inline constexpr bool kHasPairProducts = QUILLON_X86_SSSE3;
 
