@@ -177,6 +177,7 @@ bool taken(bool isMade, ImageInfo &image) {
 }
 
 bool taken(bool isMade, DynBuf &buffer) {
+    EXPECT_EQ(buffer.data != nullptr, isMade);
     DynBuf_Destroy(&buffer);
     return isMade;
 }
