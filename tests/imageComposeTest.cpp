@@ -257,7 +257,7 @@ TEST(CropAndScale, Refusals) {
     ImageInfo far = image.info; // one row of it
     far.bytesPerLine = 0x80000000;
     Result scaled;
-    EXPECT_FALSE((Request{.bottom = 1, .width = 20}).run(far, scaled));
+    EXPECT_FALSE((Request{.bottom = 1, .width = 20, .height = 1}).run(far, scaled));
     for (const Request &request : {Request{}, Request{.width = 20}}) {
         ImageInfo empty = image.info, narrow = image.info;
         empty.data = nullptr;

@@ -145,6 +145,10 @@ TEST(ImageWrite, WhatCannotBeWritten) {
         ImageInfo info = image.info;
         info.data = nullptr;
         EXPECT_TRUE(fileOf(info, format).empty());
+        DynBuf buffer = {};
+        EXPECT_FALSE(format == kPng ? ImageUtil_ConstructPNGBuffer(nullptr, nullptr, &buffer)
+                                    : ImageUtil_ConstructBMPBuffer(nullptr, &buffer));
+        EXPECT_FALSE(encode(image.info, format, nullptr));
     }
 }
 
