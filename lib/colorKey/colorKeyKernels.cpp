@@ -29,10 +29,16 @@ struct ColorKeyBody {
     template <class C, class Access>
     HWY_INLINE void operator()(C /*chunk*/, size_t i, Access access) const {
         const hn::CappedTag<uint32_t, C::kUnits> d;
-        const auto isKey = hn::Eq(loadKeys(d, i, access), hn::Set(d, key));
-        const auto over = access.load(d, overlay + 4 * i);
-        const auto under = access.load(d, background + 4 * i);
-        access.store(d, hn::IfThenElse(isKey, over, under), dst + 4 * i);
+        constexpr size_t n = kLanes<decltype(d)>;
+        hn::Vec<decltype(d)> results[C::kUnits / n];
+        for (size_t v = 0; v < C::kUnits / n; ++v) {
+            const auto isKey = hn::Eq(loadKeys(d, i + v * n, access), hn::Set(d, key));
+            const auto over = access.load(d, overlay + 4 * (i + v * n));
+            const auto under = access.load(d, background + 4 * (i + v * n));
+            results[v] = hn::IfThenElse(isKey, over, under);
+        }
+        for (size_t v = 0; v < C::kUnits / n; ++v)
+            access.store(d, results[v], dst + 4 * (i + v * n));
     }
 
 private:
@@ -53,11 +59,12 @@ private:
 // that any overlap with those counts.
 template <class KeyPixel>
 bool hasHazard(const ColorKeyBody<KeyPixel> &row, size_t width) {
-    if (hasOverlapHazard(row.dst, row.background, kVectorBytes) ||
-        hasOverlapHazard(row.dst, row.overlay, kVectorBytes))
+    constexpr size_t kChunkBytes = kVectorsAtOnce * kVectorBytes;
+    if (hasOverlapHazard(row.dst, row.background, kChunkBytes) ||
+        hasOverlapHazard(row.dst, row.overlay, kChunkBytes))
         return true;
     if constexpr (sizeof(KeyPixel) == 4)
-        return hasOverlapHazard(row.dst, row.keys, kVectorBytes);
+        return hasOverlapHazard(row.dst, row.keys, kChunkBytes);
     const auto dst = reinterpret_cast<uintptr_t>(row.dst);
     const auto keys = reinterpret_cast<uintptr_t>(row.keys);
     return dst < keys + sizeof(KeyPixel) * width && keys < dst + 4 * width;
@@ -85,7 +92,7 @@ void composeRows(const ColorKeySurfaces &surfaces, Extent extent, uint32_t key) 
             composeRowPlain<KeyPixel>(body.dst, body.background, body.overlay, body.keys,
                                       extent.width, key);
         else
-            walkRowOnce<4>(extent.width, body);
+            walkRowOnce<4, kVectorsAtOnce>(extent.width, body);
     }
     if (isAround)
         hwy::FlushStream();

@@ -57,7 +57,7 @@ struct ConvertByChannelsBody : ConvertThrough32Body<SourceOf<kFrom>, Destination
     HWY_INLINE void operator()(C chunk, size_t i, Access access) const {
         if constexpr (C::kUnits == kVectorBytes) {
             const Widest<uint8_t> d;
-            storeChannels<kTo>(d, loadChannels<kFrom>(d, this->src + i * this->kSrcBytes),
+            storeChannels<kTo>(d, loadChannels<kFrom, kTo>(d, this->src + i * this->kSrcBytes),
                                this->dst + i * this->kDstBytes);
         } else {
             ConvertThrough32Body<SourceOf<kFrom>, DestinationOf<kTo>>::operator()(chunk, i, access);

@@ -91,7 +91,7 @@ void convertRectangle(DstRows dst, SrcRows src, Extent extent, const uint32_t *p
     constexpr FormatTraits from = traitsOf(kFrom), to = traitsOf(kTo);
     static_assert(from.bytesPerPixel > 1 || kFrom == PixelFormat::kIndex,
                   "SourceOf takes single bytes for palette indices");
-    if constexpr (from.bytesPerPixel == 2 && to.bytesPerPixel <= 2) {
+    if constexpr (!kHasInterleavedAccess && from.bytesPerPixel == 2 && to.bytesPerPixel <= 2) {
         convertRowsBy(dst, src, extent, ConvertFrom16Body<kFrom, kTo>{{dst.first, src.first}});
     } else {
         using Through32 = ConvertThrough32Body<SourceOf<kFrom>, DestinationOf<kTo>>;

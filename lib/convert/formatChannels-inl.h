@@ -45,30 +45,35 @@ struct TwoByteLayout {
 
 // ---- Loads ----------------------------------------------------------------
 
-// Below its bits a channel again.
-template <int kBits, class D8>
+// Below its bits a channel again, if more of them are needed.
+template <int kBits, uint32_t kMaskTo, class D8>
 HWY_INLINE hn::Vec<D8> widenChannel(D8 d, hn::Vec<D8> v) {
-    return insertBelow<kBits>(d, v, v);
+    if constexpr (std::popcount(kMaskTo) > kBits)
+        return insertBelow<kBits>(d, v, v);
+    else
+        return v;
 }
 
-template <PixelFormat kFormat, class D8>
+template <PixelFormat kFormat, PixelFormat kTo, class D8>
 HWY_INLINE Channels<D8> loadTwoBytes(D8 d, const uint8_t *src) {
     constexpr TwoByteLayout k(traitsOf(kFormat).masks);
+    constexpr ChannelMasks to = traitsOf(kTo).masks;
     hn::Vec<D8> low, high;
     hn::LoadInterleaved2(d, src, low, high);
     const auto red = hn::ShiftLeft<k.padding>(high);
     const auto green = insertBelow<k.greenInHigh>(d, hn::ShiftLeft<k.inHigh>(high), low);
     const auto blue = hn::ShiftLeft<k.greenInLow>(low);
-    return {widenChannel<k.blue>(d, blue), widenChannel<k.green>(d, green),
-            widenChannel<k.red>(d, red), hn::Set(d, 0xFF)};
+    return {widenChannel<k.blue, to.blue>(d, blue), widenChannel<k.green, to.green>(d, green),
+            widenChannel<k.red, to.red>(d, red), hn::Set(d, 0xFF)};
 }
 
-// As many pixels as there are lanes; alpha is 255 where the format has none.
-template <PixelFormat kFormat, class D8>
+// As many pixels as there are lanes, with the bits that the other format needs; alpha is
+// 255 where the format has none.
+template <PixelFormat kFormat, PixelFormat kTo, class D8>
 HWY_INLINE Channels<D8> loadChannels(D8 d, const uint8_t *src) {
     constexpr int32_t kBytes = traitsOf(kFormat).bytesPerPixel;
     if constexpr (kBytes == 2) {
-        return loadTwoBytes<kFormat>(d, src);
+        return loadTwoBytes<kFormat, kTo>(d, src);
     } else if constexpr (kBytes == 3) {
         hn::Vec<D8> blue, green, red;
         hn::LoadInterleaved3(d, src, blue, green, red);

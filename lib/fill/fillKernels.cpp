@@ -122,8 +122,9 @@ struct FillAlphaBody {
     HWY_INLINE void operator()(C /*chunk*/, size_t i, Access access) const {
         const hn::CappedTag<uint32_t, C::kUnits> d;
         uint8_t *pixels = dst + 4 * i;
-        const auto colour = hn::And(access.load(d, pixels), hn::Set(d, 0x00FFFFFF));
-        access.store(d, hn::Or(colour, hn::Set(d, alpha)), pixels);
+        const auto isAlpha = hn::Set(d, 0xFF000000);
+        access.store(d, hn::IfVecThenElse(isAlpha, hn::Set(d, alpha), access.load(d, pixels)),
+                     pixels);
     }
 };
 

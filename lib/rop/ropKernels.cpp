@@ -19,8 +19,45 @@ namespace {
 
 // ---- Against a constant ---------------------------------------------------
 
+// D becomes (D & keep) ^ flip, which by what these are is one operation.  AVX-512 has one
+// for all, and elsewhere on x86 memory is what limits.
+enum class RopFill { kAny, kAnd, kXor, kOr, kAndNot, kOrNot };
+
+constexpr RopFill ropFillOf(RopConstant constant) {
+    const auto [keep, flip] = constant;
+    return flip == 0       ? RopFill::kAnd
+           : keep == ~0U   ? RopFill::kXor
+           : flip == ~keep ? RopFill::kOr
+           : flip == keep  ? RopFill::kAndNot
+           : flip == ~0U   ? RopFill::kOrNot
+                           : RopFill::kAny;
+}
+
+template <RopFill kFill, class V>
+HWY_INLINE V ropAgainst(V v, V keep, V flip) {
+    switch (kFill) {
+    case RopFill::kAnd:
+        return hn::And(v, keep);
+    case RopFill::kXor:
+        return hn::Xor(v, flip);
+    case RopFill::kOr:
+        return hn::Or(v, flip);
+    case RopFill::kAndNot:
+        return hn::AndNot(v, flip);
+    case RopFill::kOrNot: {
+        // flip is the complement of keep.  Of bytes, as GCC makes one instruction of it.
+        const hn::DFromV<V> d;
+        const hn::Repartition<uint8_t, decltype(d)> d8;
+        return hn::BitCast(d, hn::Or(hn::BitCast(d8, flip), hn::Not(hn::BitCast(d8, v))));
+    }
+    default:
+        return hn::Xor(hn::And(v, keep), flip);
+    }
+}
+
 // The pattern of keep and flip as vectors, from the first byte of the row on, and
 // in memory from the tail on.
+template <RopFill kFill>
 struct RopFillBody {
     using Words = Widest<uint32_t>;
 
@@ -33,33 +70,60 @@ struct RopFillBody {
     HWY_INLINE void operator()(C /*chunk*/, size_t i, Access access) const {
         if constexpr (C::kUnits == kVectorBytes && std::is_same_v<Access, Unaligned>) {
             const Words d;
-            const auto kept = hn::And(access.load(d, dst + i), keep.template get<C::kTurn>());
-            access.store(d, hn::Xor(kept, flip.template get<C::kTurn>()), dst + i);
+            const auto result =
+                ropAgainst<kFill>(access.load(d, dst + i), keep.template get<C::kTurn>(),
+                                  flip.template get<C::kTurn>());
+            access.store(d, result, dst + i);
         } else {
             const hn::CappedTag<uint8_t, C::kUnits> d;
-            const auto kept = hn::And(access.load(d, dst + i), loadBytes(d, keepTail + i - tail));
-            access.store(d, hn::Xor(kept, loadBytes(d, flipTail + i - tail)), dst + i);
+            const auto result =
+                ropAgainst<kFill>(access.load(d, dst + i), loadBytes(d, keepTail + i - tail),
+                                  loadBytes(d, flipTail + i - tail));
+            access.store(d, result, dst + i);
         }
     }
 };
 
-void ropFillKernel(DstRows dst, ByteExtent extent, int32_t bytesPerPixel, RopConstant constant) {
-    constexpr RowPolicy kPolicy = {.tail = Tail::kExact, .unroll = 3};
-    const RopFillBody::Words d;
-    if (areContiguous(dst, extent.rowBytes))
-        extent = asOneRow(extent);
-
+template <RopFill kFill>
+void ropFillRowsBy(DstRows dst, ByteExtent extent, int32_t bytesPerPixel, RopConstant constant) {
+    // Multiples of the three vectors of a pattern.
+    constexpr RowPolicy kPolicy = {.tail = Tail::kExact, .unroll = kHasPairedStores ? 12 : 3};
+    const Widest<uint32_t> d;
+    if (kFill == RopFill::kOrNot)
+        constant.flip = ~constant.keep;
     const PixelPattern keep(constant.keep, bytesPerPixel), flip(constant.flip, bytesPerPixel);
     const size_t tail = extent.rowBytes - extent.rowBytes % kVectorBytes;
     HWY_ALIGN uint8_t keepTail[kVectorBytes];
     HWY_ALIGN uint8_t flipTail[kVectorBytes];
     storeBytes(d, keep.from(d, tail), keepTail);
     storeBytes(d, flip.from(d, tail), flipTail);
-    RopFillBody body = {dst.first, {d, keep, 0}, {d, flip, 0}, keepTail, flipTail, tail};
+    RopFillBody<kFill> body = {dst.first, {d, keep, 0}, {d, flip, 0}, keepTail, flipTail, tail};
     for (size_t y = 0; y < extent.height; ++y) {
         body.dst = dst.row(y);
         walkRow<kPolicy>(Chunk<kVectorBytes>(), extent.rowBytes, body);
     }
+}
+
+void ropFillKernel(DstRows dst, ByteExtent extent, int32_t bytesPerPixel, RopConstant constant) {
+    if (areContiguous(dst, extent.rowBytes))
+        extent = asOneRow(extent);
+    if constexpr (kHasPairedStores) {
+        switch (ropFillOf(constant)) {
+        case RopFill::kAnd:
+            return ropFillRowsBy<RopFill::kAnd>(dst, extent, bytesPerPixel, constant);
+        case RopFill::kXor:
+            return ropFillRowsBy<RopFill::kXor>(dst, extent, bytesPerPixel, constant);
+        case RopFill::kOr:
+            return ropFillRowsBy<RopFill::kOr>(dst, extent, bytesPerPixel, constant);
+        case RopFill::kAndNot:
+            return ropFillRowsBy<RopFill::kAndNot>(dst, extent, bytesPerPixel, constant);
+        case RopFill::kOrNot:
+            return ropFillRowsBy<RopFill::kOrNot>(dst, extent, bytesPerPixel, constant);
+        case RopFill::kAny:
+            break;
+        }
+    }
+    ropFillRowsBy<RopFill::kAny>(dst, extent, bytesPerPixel, constant);
 }
 
 // ---- Two surfaces ---------------------------------------------------------
@@ -101,8 +165,13 @@ struct RopCopyBody {
     template <class C, class Access>
     HWY_INLINE void operator()(C /*chunk*/, size_t i, Access access) const {
         const hn::CappedTag<uint8_t, C::kUnits> d;
-        const auto s = access.load(d, src + i);
-        access.store(d, combine<kRop>(s, access.load(d, dst + i)), dst + i);
+        constexpr size_t n = kLanes<decltype(d)>;
+        hn::Vec<decltype(d)> results[C::kUnits / n];
+        for (size_t v = 0; v < C::kUnits / n; ++v)
+            results[v] =
+                combine<kRop>(access.load(d, src + i + v * n), access.load(d, dst + i + v * n));
+        for (size_t v = 0; v < C::kUnits / n; ++v)
+            access.store(d, results[v], dst + i + v * n);
     }
 };
 
@@ -115,12 +184,12 @@ void ropCopyRowsBy(DstRows dst, SrcRows src, ByteExtent extent, int32_t bytesPer
         // Backward, it is a destination behind the source that is read again after
         // it has been written.
         if (isBackward ? hasOverlapHazard(body.src, body.dst, kVectorBytes)
-                       : hasOverlapHazard(body.dst, body.src, kVectorBytes))
+                       : hasOverlapHazard(body.dst, body.src, kVectorsAtOnce * kVectorBytes))
             ropRowPlain(kRop, body.dst, body.src, extent.rowBytes, bytesPerPixel, direction);
         else if (isBackward)
             walkRowOnceBackward<1>(extent.rowBytes, body);
         else
-            walkRowOnce<1>(extent.rowBytes, body);
+            walkRowOnce<1, kVectorsAtOnce>(extent.rowBytes, body);
     }
 }
 

@@ -136,7 +136,7 @@ HWY_INLINE void walkWholeChunks(size_t begin, size_t tail, const Body &body,
         walkTurns<Access, kUnits>(i, body, std::make_index_sequence<kPolicy.unroll>());
     }
     // One test for half of the chunks that may be left, where these are many.
-    constexpr bool kHasHalfStep = kPolicy.unroll >= 12;
+    constexpr bool kHasHalfStep = kPolicy.unroll >= 8;
     constexpr size_t kRest = kHasHalfStep ? kPolicy.unroll / 2 : kPolicy.unroll;
     if (kHasHalfStep && tail - i >= kRest * kUnits) {
         walkTurns<Access, kUnits>(i, body, std::make_index_sequence<kRest>());
@@ -238,8 +238,8 @@ HWY_INLINE void walkAlignedRow(Chunk<kUnits> chunk, size_t count, const Body &bo
 }
 
 // A row of any length, each unit of kUnitBytes bytes once, in rising order: for
-// bodies that read what they write.
-template <size_t kUnitBytes, class Body>
+// bodies that read what they write.  Without masks chunks are of kVectors vectors.
+template <size_t kUnitBytes, size_t kVectors = 1, class Body>
 HWY_INLINE void walkRowOnce(size_t count, const Body &body) {
     constexpr size_t kUnits = kVectorBytes / kUnitBytes;
     const Chunk<kUnits> chunk;
@@ -257,8 +257,9 @@ HWY_INLINE void walkRowOnce(size_t count, const Body &body) {
         walkHalves<kUnits / 2>(0, head, body);
         walkFrom<kPolicy, Unaligned>(chunk, head, count, body);
     } else {
-        constexpr RowPolicy kPolicy = {.tail = Tail::kExact, .unroll = 2};
-        walkFrom<kPolicy, Unaligned>(chunk, 0, count, body);
+        constexpr size_t kTurns = kHasPairedStores ? 8 / kVectors : 2;
+        constexpr RowPolicy kPolicy = {.tail = Tail::kExact, .unroll = kTurns};
+        walkFrom<kPolicy, Unaligned>(Chunk<kVectors * kUnits>(), 0, count, body);
     }
 }
 

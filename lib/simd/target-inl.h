@@ -80,6 +80,10 @@ inline constexpr bool kHasWideningProducts = QUILLON_NEON;
 // Stores of two vectors side by side in one instruction, which compilers make of two.
 inline constexpr bool kHasPairedStores = QUILLON_NEON;
 
+// Vectors that bodies with several rows load before they store one: across a store to
+// another row compilers pair nothing.
+inline constexpr size_t kVectorsAtOnce = kHasPairedStores ? 4 : 1;
+
 // Registers of the processor that are not vectors.
 inline constexpr size_t kGeneralRegisters = HWY_ARCH_X86 ? 16 : 32;
 
