@@ -122,9 +122,12 @@ struct FillAlphaBody {
     HWY_INLINE void operator()(C /*chunk*/, size_t i, Access access) const {
         const hn::CappedTag<uint32_t, C::kUnits> d;
         uint8_t *pixels = dst + 4 * i;
-        const auto isAlpha = hn::Set(d, 0xFF000000);
-        access.store(d, hn::IfVecThenElse(isAlpha, hn::Set(d, alpha), access.load(d, pixels)),
-                     pixels);
+        const auto old = access.load(d, pixels);
+        const auto alphas = hn::Set(d, alpha);
+        if constexpr (kHasBitInsertion)
+            access.store(d, hn::IfVecThenElse(hn::Set(d, 0xFF000000), alphas, old), pixels);
+        else
+            access.store(d, hn::Or(hn::And(old, hn::Set(d, 0x00FFFFFF)), alphas), pixels);
     }
 };
 

@@ -77,6 +77,10 @@ inline constexpr bool kHasInterleavedAccess = QUILLON_NEON;
 // Products of bytes in lanes of twice the size, in one instruction for half a vector.
 inline constexpr bool kHasWideningProducts = QUILLON_NEON;
 
+// Bits of one vector in the place of those of another, by a third, in one instruction:
+// hn::IfVecThenElse.
+inline constexpr bool kHasBitInsertion = QUILLON_NEON;
+
 // Stores of two vectors side by side in one instruction, which compilers make of two.
 inline constexpr bool kHasPairedStores = QUILLON_NEON;
 
