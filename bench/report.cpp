@@ -29,7 +29,8 @@ constexpr const char *kIntroduction =
     "- 1920x1080: each call on memory that has left every cache\n\n"
     "AVX3 is AVX-512. Where it is not the best instruction set, AVX2 is forced upon this library "
     "and the limits, while the peers keep theirs. Means are geometric. For arm64, "
-    "[arm64.md](arm64.md) counts instructions.\n\n";
+    "[arm64.md](arm64.md) counts instructions. What bounds the operations that "
+    "memory does not is in [limits.md](limits.md).\n\n";
 
 constexpr const char *kHeadOfTable =
     "| Operation | A call, ns | / limit | / best peer |\n|---|--:|--:|--:|\n";
