@@ -103,7 +103,7 @@ struct StencilBody {
     template <class C>
     HWY_INLINE void prefetch(C /*chunk*/, size_t i, PrefetchDistance /*distance*/) const {
         if (i < prefetchEnd)
-            prefetchLines(dst + i * kBytes, C::kUnits * kBytes, kPrefetchStencil);
+            prefetchLines(dst + i * kBytes, C::kUnits * kBytes, kPrefetchUncached);
     }
 
     template <class Use>
@@ -120,7 +120,7 @@ void stencilRowsBy(DstRows dst, SrcRows bits, Extent extent, uint32_t pixel) {
     constexpr RowPolicy kPolicy = {
         .tail = Tail::kPartial, .prefetches = kPrefetches, .hasForChunksFrom = true};
     constexpr Chunk<64> chunk;
-    const size_t prefetchEnd = kPrefetches ? extent.width - kPrefetchStencil / kBytes : 0;
+    const size_t prefetchEnd = kPrefetches ? extent.width - kPrefetchUncached / kBytes : 0;
     const Stencil<kBytes> stencil(pixel);
     for (size_t y = 0; y < extent.height; ++y) {
         const BitReader reader = {bits.row(y), extent.width};

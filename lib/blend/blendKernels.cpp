@@ -133,7 +133,7 @@ void blendKernel(DstRows dst, SrcRows src, Extent extent) {
     if (areContiguous(dst, rowBytes) && areContiguous(src, rowBytes))
         extent = asOneRow(extent);
     const ByteExtent bytes = inBytes(extent, 4);
-    const ptrdiff_t ahead = isNonTemporal(bytes) ? kPrefetchBlendUncached : kPrefetchInCaches;
+    const ptrdiff_t ahead = isNonTemporal(bytes) ? kPrefetchUncached : kPrefetchInCaches;
     if (extent.width >= kPrefetchLongRow)
         blendRowsBy<kPrefetchesAhead>(dst, src, extent, {ahead, ahead});
     else if (extent.width >= kPrefetchNextRow)

@@ -59,7 +59,7 @@ HWY_NOINLINE void convertLongRows(DstRows dst, SrcRows src, Extent extent, const
     constexpr RowPolicy kPolicy = {.unroll = kIsUnrolled ? 4 : 1, .prefetches = true};
     constexpr PrefetchDistance kDistance =
         std::is_same_v<Access, NonTemporal>
-            ? PrefetchDistance{0, kPrefetchConvertUncached}
+            ? PrefetchDistance{0, kPrefetchUncached}
             : PrefetchDistance{kPrefetchInCaches, kPrefetchInCaches};
     Body body = constants;
     for (size_t y = 0; y < extent.height; ++y) {

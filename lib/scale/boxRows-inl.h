@@ -26,6 +26,7 @@ namespace {
 
 // ---- Averages of 2, 4 and 8 whole pixels ----------------------------------
 
+template <bool kPrefetches>
 struct HalfBody {
     uint8_t *dst;
     const uint8_t *src;
@@ -33,6 +34,7 @@ struct HalfBody {
     template <class C, class Access>
     HWY_INLINE void operator()(C /*chunk*/, size_t i, Access access) const {
         const PixelTag<C> d;
+        prefetchSource<kPrefetches>(src + 8 * i, 8 * C::kUnits);
         const auto pixels = Neighbours<PixelTag<C>>::load(d, src + 8 * i);
         const auto halfDifference =
             hn::And(hn::ShiftRight<1>(hn::Xor(pixels.left, pixels.right)), hn::Set(d, 0x7F7F7F7Fu));
@@ -40,7 +42,7 @@ struct HalfBody {
     }
 };
 
-template <uint32_t kLog2Step>
+template <bool kPrefetches, uint32_t kLog2Step>
 struct WholeSpansBody {
     uint8_t *dst;
     const uint8_t *src;
@@ -49,7 +51,9 @@ struct WholeSpansBody {
     template <class C, class Access>
     HWY_INLINE void operator()(C /*chunk*/, size_t i, Access access) const {
         const PixelTag<C> d;
-        const auto sums = sumOfEach<kLog2Step>(d, src + 4 * (i << kLog2Step));
+        const uint8_t *from = src + 4 * (i << kLog2Step);
+        prefetchSource<kPrefetches>(from, 4 * (C::kUnits << kLog2Step));
+        const auto sums = sumOfEach<kLog2Step>(d, from);
         access.store(d, sums.average(normaliser), dst + 4 * i);
     }
 
@@ -97,7 +101,7 @@ HWY_INLINE hn::Vec<D> bytesToHalves(D d, hn::Vec<D> v) {
 
 // Averages over kWhole pixels and a fraction, none of which reaches to the last
 // pixel.
-template <uint32_t kWhole>
+template <bool kPrefetches, uint32_t kWhole>
 struct ShortSpansBody {
     static constexpr uint32_t kWindows = kWhole + 1;
 
@@ -130,6 +134,7 @@ struct ShortSpansBody {
         const auto behind = hn::IfThenZeroElse(isLast, tail);
 
         const uint8_t *window = src + size_t{4} * base;
+        prefetchSource<kPrefetches>(window, 4 * kWindows * C::kUnits);
         ChannelSums<PixelTag<C>> sums;
         sums.add(pickFromWindows<kWindows>(d, window, index), hn::BitCast(d16, head));
         for (uint32_t whole = 1; whole < kWhole; ++whole)
@@ -148,8 +153,8 @@ struct ShortSpansBody {
 template <class T>
 class BoxRow {
 public:
-    explicit BoxRow(const ScaleAxis &axis)
-        : axis_(axis),
+    BoxRow(const ScaleAxis &axis, bool prefetches)
+        : axis_(axis), prefetches_(prefetches),
           inner_(std::min(stepsBefore(axis.start, axis.lastPosition(), axis.step), axis.dstSize)) {}
 
     HWY_NOINLINE void operator()(uint8_t *dst, const uint8_t *src) const {
@@ -169,20 +174,25 @@ private:
         // Steps of whole pixels begin on whole pixels.
         const uint8_t *first = src + size_t{4} * (axis_.start >> 16);
         if (axis_.isHalf())
-            return walkPixels(count, HalfBody{dst, first});
+            return walkPixelsOf<HalfBody>(prefetches_, count, count, dst, first);
         if (axis_.step == 4 * kScaleOne)
-            return walkPixels(count, WholeSpansBody<2>{dst, first, axis_.normaliser});
+            return walkPixelsOf<WholeSpansBody, 2>(prefetches_, count, count, dst, first,
+                                                   axis_.normaliser);
         if (axis_.step == 8 * kScaleOne)
-            return walkPixels(count, WholeSpansBody<3>{dst, first, axis_.normaliser});
+            return walkPixelsOf<WholeSpansBody, 3>(prefetches_, count, count, dst, first,
+                                                   axis_.normaliser);
         const uint32_t whole = axis_.step >> 16;
         if (whole <= kMostWhole && averageShortSpans<kMostWhole>(whole, dst, src, count))
             return;
         // The number of pixels between the ends changes by one.  The extra one is
         // weighted away, as a branch over it would be mispredicted every few pixels.
         uint32_t start = axis_.start;
-        for (size_t i = 0; i < count; ++i, start += axis_.step)
-            averageSpan<T>(BoxSpan(start, start + axis_.step), whole - 1, axis_.normaliser,
-                           dst + 4 * i, src);
+        const ptrdiff_t distance = prefetches_ ? kPrefetchUncached : 0;
+        for (size_t i = 0; i < count; ++i, start += axis_.step) {
+            const BoxSpan span(start, start + axis_.step);
+            prefetchLines(src + 4 * span.first, size_t{4} * whole, distance);
+            averageSpan<T>(span, whole - 1, axis_.normaliser, dst + 4 * i, src);
+        }
     }
 
     static constexpr uint32_t kMostWhole =
@@ -197,15 +207,15 @@ private:
         } else {
             if (whole != kWhole)
                 return averageShortSpans<kWhole - 1>(whole, dst, src, count);
-            using Body = ShortSpansBody<kWhole>;
-            const size_t limit = Body::limit(axis_.srcSize);
+            const size_t limit = ShortSpansBody<false, kWhole>::limit(axis_.srcSize);
             if (limit != 0)
-                walkPixels(count, Body{dst, src, axis_}, limit);
+                walkPixelsOf<ShortSpansBody, kWhole>(prefetches_, count, limit, dst, src, axis_);
             return limit != 0;
         }
     }
 
     ScaleAxis axis_;
+    bool prefetches_;
     uint32_t inner_;
 };
 

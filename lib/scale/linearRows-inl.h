@@ -24,6 +24,7 @@ namespace {
 
 // Blends of neighbours with weights that sum to 255.  srcSize is larger than a
 // chunk.
+template <bool kPrefetches>
 struct LinearBody {
     uint8_t *dst;
     const uint8_t *src;
@@ -36,6 +37,7 @@ struct LinearBody {
         const uint32_t base = std::min(first >> 16, srcSize - 1 - uint32_t{C::kUnits});
         const auto x = positionsFrom(d, first - (base << 16), step);
         const uint8_t *window = src + size_t{4} * base;
+        prefetchSource<kPrefetches>(window, 4 * C::kUnits);
         const auto index = hn::ShiftRight<16>(x);
         const auto left = pickFromWindows<1>(d, window, index);
         const auto right = pickFromWindows<1>(d, window + 4, index);
@@ -47,8 +49,8 @@ struct LinearBody {
 // last pixel.
 class LinearRow {
 public:
-    explicit LinearRow(const ScaleAxis &axis)
-        : step_(axis.step), srcSize_(axis.srcSize), leading_(0) {
+    LinearRow(const ScaleAxis &axis, bool prefetches)
+        : prefetches_(prefetches), step_(axis.step), srcSize_(axis.srcSize), leading_(0) {
         const bool isNegative = axis.start >> 31 != 0;
         if (isNegative)
             leading_ =
@@ -62,13 +64,14 @@ public:
     HWY_NOINLINE void operator()(uint8_t *dst, const uint8_t *src) const {
         fillPixels(dst, src, 0, leading_);
         dst += size_t{4} * leading_;
-        const LinearBody body = {dst, src, innerStart_, step_, srcSize_};
-        walkPixels(inner_, body, srcSize_ - 1);
+        walkPixelsOf<LinearBody>(prefetches_, inner_, srcSize_ - 1, dst, src, innerStart_, step_,
+                                 srcSize_);
         dst += size_t{4} * inner_;
         fillPixels(dst, src, srcSize_ - 1, trailing_);
     }
 
 private:
+    bool prefetches_;
     uint32_t step_, srcSize_;
     uint32_t leading_, inner_, trailing_; // pixels
     uint32_t innerStart_;

@@ -19,6 +19,7 @@
 #include "scale/scalePlain.h"
 #include "simd/rowLoop-inl.h"
 #include "simd/shuffle-inl.h"
+#include "simd/thresholds.h"
 
 #include <algorithm>
 #include <type_traits>
@@ -69,6 +70,23 @@ HWY_INLINE void walkPixelsBy(size_t count, const Body &body) {
             return walkAlignedRow<Access>(Chunk<kMost>(), count, body);
     }
     walkPixels<kMost>(count, body);
+}
+
+// The same, by a kind of body that prefetches its source or does not, and the numbers that
+// it is for, if any.  Rows that are worth it have whole vectors.
+template <template <bool kPrefetches, uint32_t...> class Body, uint32_t... kNumbers,
+          class... Members>
+HWY_INLINE void walkPixelsOf(bool prefetches, size_t count, size_t limit, Members... members) {
+    if (prefetches && std::min(count, limit) >= kVectorPixels)
+        walkRow(Chunk<kVectorPixels>(), count, Body<true, kNumbers...>{members...});
+    else
+        walkPixels(count, Body<false, kNumbers...>{members...}, limit);
+}
+
+template <bool kPrefetches>
+HWY_INLINE void prefetchSource(const uint8_t *from, size_t bytes) {
+    if constexpr (kPrefetches)
+        prefetchLines(from, bytes, kPrefetchUncached);
 }
 
 struct FillPixelsBody {

@@ -74,11 +74,16 @@ struct QuarterBody {
     uint8_t *dst;
     const uint8_t *upper, *lower;
     uint32_t whole;
+    bool prefetches; // around the caches
 
     template <class C, class Access>
     HWY_INLINE void operator()([[maybe_unused]] C chunk, size_t i, Access access) const {
         if constexpr (C::kUnits == kMovingUnits)
             return movedTo(i).takeNext(chunk);
+        if (std::is_same_v<Access, NonTemporal> && prefetches) {
+            prefetchSource<true>(upper + 8 * i, 8 * C::kUnits);
+            prefetchSource<true>(lower + 8 * i, 8 * C::kUnits);
+        }
         const PixelTag<C> d;
         auto above = loadComplements(d, upper + 8 * i);
         auto below = loadComplements(d, lower + 8 * i);
@@ -96,7 +101,8 @@ struct QuarterBody {
     }
 
     HWY_INLINE QuarterBody movedTo(size_t i) const {
-        return {dst + 4 * i, upper + 8 * i, lower + 8 * i, whole - static_cast<uint32_t>(i)};
+        return {dst + 4 * i, upper + 8 * i, lower + 8 * i, whole - static_cast<uint32_t>(i),
+                prefetches};
     }
     template <class C>
     HWY_INLINE void takeNext(C /*chunk*/) {
@@ -139,8 +145,9 @@ HWY_NOINLINE void copyLastQuarter(uint8_t *dst, const uint8_t *upper, const uint
 template <class Access>
 class QuarterRow {
 public:
-    explicit QuarterRow(const ScaleAxis &axis)
-        : first_(axis.start >> 16), last_(axis.srcSize - 1), count_(axis.dstSize) {
+    QuarterRow(const ScaleAxis &axis, bool prefetches)
+        : first_(axis.start >> 16), last_(axis.srcSize - 1), count_(axis.dstSize),
+          prefetches_(prefetches) {
         const uint32_t before = first_ < last_ ? last_ - first_ : 0;
         whole_ = std::min(before / 2, count_);
         averaged_ = std::min((before + 1) / 2, count_);
@@ -148,7 +155,7 @@ public:
 
     HWY_INLINE void operator()(uint8_t *dst, const uint8_t *upper, const uint8_t *lower) const {
         const size_t offset = size_t{4} * first_;
-        const QuarterBody<true> toEnd = {dst, upper + offset, lower + offset, whole_};
+        const QuarterBody<true> toEnd = {dst, upper + offset, lower + offset, whole_, prefetches_};
         if constexpr (std::is_same_v<Access, NonTemporal>)
             walkPixelsBy<NonTemporal>(averaged_, toEnd);
         else if (averaged_ < kUnits)
@@ -169,7 +176,7 @@ private:
     HWY_INLINE void averageLongRow(const QuarterBody<true> &toEnd) const {
         constexpr RowPolicy kInner = {.tail = Tail::kNone};
         const Chunk<kUnits> chunk;
-        const QuarterBody<false> inside = {toEnd.dst, toEnd.upper, toEnd.lower, whole_};
+        const QuarterBody<false> inside = {toEnd.dst, toEnd.upper, toEnd.lower, whole_, false};
         walkRow<kInner>(chunk, whole_, inside);
         if (whole_ - whole_ % kUnits != averaged_)
             toEnd(chunk, averaged_ - kUnits, Unaligned());
@@ -178,6 +185,7 @@ private:
     uint32_t first_, last_, count_;
     uint32_t whole_;    // pixels that are averages of four
     uint32_t averaged_; // the same, and the one of two
+    bool prefetches_;
 };
 
 #endif

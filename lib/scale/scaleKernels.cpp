@@ -241,9 +241,9 @@ void scaleNearest(const ScaleJob &job, void *cache) {
 
 void scaleQuarter(const ScaleJob &job) {
     if (isNonTemporal(job.dstExtent()))
-        walkWholeSteps<2>(job, QuarterRow<NonTemporal>(job.x));
+        walkWholeSteps<2>(job, QuarterRow<NonTemporal>(job.x, job.isPrefetched()));
     else
-        walkWholeSteps<2>(job, QuarterRow<Unaligned>(job.x));
+        walkWholeSteps<2>(job, QuarterRow<Unaligned>(job.x, false));
 }
 
 void scaleColumns(const ScaleJob &job, void *cache) {
@@ -251,11 +251,11 @@ void scaleColumns(const ScaleJob &job, void *cache) {
     case ScaleMethod::kNearest:
         return scaleNearest(job, cache);
     case ScaleMethod::kLinear:
-        return walkRows(job, LinearRow(job.x), cache);
+        return walkRows(job, LinearRow(job.x, job.isPrefetched()), cache);
     case ScaleMethod::kBox:
         return job.x.step <= kMostPixelsIn16 * kScaleOne
-                   ? walkRows(job, BoxRow<uint16_t>(job.x), cache)
-                   : walkRows(job, BoxRow<uint32_t>(job.x), cache);
+                   ? walkRows(job, BoxRow<uint16_t>(job.x, job.isPrefetched()), cache)
+                   : walkRows(job, BoxRow<uint32_t>(job.x, job.isPrefetched()), cache);
     }
 }
 

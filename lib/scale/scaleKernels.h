@@ -3,6 +3,7 @@
 
 #include "core/surface.h"
 #include "scale/scaleAxis.h"
+#include "simd/thresholds.h"
 
 #include <algorithm>
 #include <bit>
@@ -17,6 +18,8 @@ struct ScaleJob {
     ScaleAxis x, y;
 
     ByteExtent dstExtent() const { return {size_t{4} * x.dstSize, y.dstSize}; }
+    ByteExtent srcExtent() const { return {size_t{4} * x.srcSize, y.srcSize}; }
+    bool isPrefetched() const { return isPrefetchedScale(srcExtent(), src.stride, dstExtent()); }
 
     // Whether every pixel is the average of two by two: those are made straight from
     // two source rows.

@@ -72,7 +72,7 @@ struct InterleavedFrame {
         const InterleavedBody<kGroup, kLayout> body = {dst, src};
         if (isNonTemporal({kLayout.bytesPerPixel * pixels, 1})) {
             walkAlignedRow<NonTemporal, kPrefetchingPolicy>(Chunk<kMostPixels>(), pixels, body,
-                                                            {0, kPrefetchInterleavedVideo});
+                                                            {0, kPrefetchUncached});
             hwy::FlushStream();
         } else {
             withVideoChunk(pixels, [&](auto chunk) HWY_ATTR { walkRow(chunk, pixels, body); });
