@@ -17,6 +17,11 @@ namespace {
 
 #if QUILLON_HAS_VECTORS
 
+// Rows of a vector or less are one chunk each, whose mask is made once for all.
+constexpr bool isOneMaskedVector(ByteExtent extent) {
+    return kHasMaskedTails && extent.rowBytes <= kVectorBytes;
+}
+
 // ---- Against a constant ---------------------------------------------------
 
 // D becomes (D & keep) ^ flip, which by what these are is one operation.  AVX-512 has one
@@ -92,15 +97,20 @@ void ropFillRowsBy(DstRows dst, ByteExtent extent, int32_t bytesPerPixel, RopCon
     if (kFill == RopFill::kOrNot)
         constant.flip = ~constant.keep;
     const PixelPattern keep(constant.keep, bytesPerPixel), flip(constant.flip, bytesPerPixel);
-    const size_t tail = extent.rowBytes - extent.rowBytes % kVectorBytes;
+    const bool isShort = isOneMaskedVector(extent);
+    const size_t tail = isShort ? 0 : extent.rowBytes - extent.rowBytes % kVectorBytes;
     HWY_ALIGN uint8_t keepTail[kVectorBytes];
     HWY_ALIGN uint8_t flipTail[kVectorBytes];
     storeBytes(d, keep.from(d, tail), keepTail);
     storeBytes(d, flip.from(d, tail), flipTail);
     RopFillBody<kFill> body = {dst.first, {d, keep, 0}, {d, flip, 0}, keepTail, flipTail, tail};
+    constexpr Chunk<kVectorBytes> chunk;
     for (size_t y = 0; y < extent.height; ++y) {
         body.dst = dst.row(y);
-        walkRow<kPolicy>(Chunk<kVectorBytes>(), extent.rowBytes, body);
+        if (isShort)
+            body(chunk, 0, FirstLanes{extent.rowBytes});
+        else
+            walkRow<kPolicy>(chunk, extent.rowBytes, body);
     }
 }
 
@@ -193,12 +203,30 @@ void ropCopyRowsBy(DstRows dst, SrcRows src, ByteExtent extent, int32_t bytesPer
     }
 }
 
+// Of surfaces without a byte in common the order does not matter.
+template <uint32_t kRop>
+void ropCopyRowsApart(DstRows dst, SrcRows src, ByteExtent extent) {
+    const auto forEachRow = [&](const auto &walk) HWY_ATTR {
+        for (size_t y = 0; y < extent.height; ++y)
+            walk(RopCopyBody<kRop>{dst.row(y), src.row(y)});
+    };
+    if (isOneMaskedVector(extent))
+        forEachRow([&](const auto &body)
+                       HWY_ATTR { body(Chunk<kVectorBytes>(), 0, FirstLanes{extent.rowBytes}); });
+    else
+        forEachRow([&](const auto &body)
+                       HWY_ATTR { walkRowOnce<1, kVectorsAtOnce>(extent.rowBytes, body); });
+}
+
 template <uint32_t... kRops>
 void ropCopyRowsByCode(uint32_t rop, DstRows dst, SrcRows src, ByteExtent extent,
                        int32_t bytesPerPixel, RowDirection direction) {
-    (void)((rop == kRops &&
-            (ropCopyRowsBy<kRops>(dst, src, extent, bytesPerPixel, direction), true)) ||
-           ...);
+    if (rowsOverlap(dst, src, extent))
+        (void)((rop == kRops &&
+                (ropCopyRowsBy<kRops>(dst, src, extent, bytesPerPixel, direction), true)) ||
+               ...);
+    else
+        (void)((rop == kRops && (ropCopyRowsApart<kRops>(dst, src, extent), true)) || ...);
 }
 
 // The one operation of these that does not read what it writes.
