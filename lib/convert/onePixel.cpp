@@ -48,16 +48,13 @@ uint32_t Raster_ConvertOnePixel(uint32_t pixel, int32_t srcDepth, int32_t dstDep
         srcDepth = 32;
     }
     const PixelFormat from = formatAt(srcDepth);
-    if (!traitsOf(from).isSource) {
-        rejectDepth(kBadOneSrcDepth, srcDepth);
-        return 0;
-    }
-    const PixelFormat to = formatAt(dstDepth);
-    if (!traitsOf(to).isDestination) {
+    if (const PixelFunction convert = kPixelFunctions.at(from, formatAt(dstDepth)))
+        return convert(pixel);
+    if (traitsOf(from).isSource)
         rejectDepth(kBadOneDstDepth, dstDepth);
-        return 0;
-    }
-    return kPixelFunctions.at(from, to)(pixel);
+    else
+        rejectDepth(kBadOneSrcDepth, srcDepth);
+    return 0;
 }
 
 void RasterRGB_MakeRGBParam(RasterRGBParam *param, int32_t componentBits, uint32_t mask) {
