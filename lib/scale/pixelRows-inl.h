@@ -77,7 +77,7 @@ HWY_INLINE void walkPixelsBy(size_t count, const Body &body) {
 template <template <bool kPrefetches, uint32_t...> class Body, uint32_t... kNumbers,
           class... Members>
 HWY_INLINE void walkPixelsOf(bool prefetches, size_t count, size_t limit, Members... members) {
-    if (prefetches && std::min(count, limit) >= kVectorPixels)
+    if (kPrefetchesAhead && prefetches && std::min(count, limit) >= kVectorPixels)
         walkRow(Chunk<kVectorPixels>(), count, Body<true, kNumbers...>{members...});
     else
         walkPixels(count, Body<false, kNumbers...>{members...}, limit);
