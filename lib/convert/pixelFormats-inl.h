@@ -189,8 +189,9 @@ struct To24Bits : Storage<3, false> {
     template <class D, size_t kVectors, class Access>
     HWY_INLINE static void store(D d, const hn::Vec<D> (&pixels)[kVectors], uint8_t *dst,
                                  const NarrowingWeights & /*weights*/, Access access) {
-        // Whole vectors across two cache lines would cost more than these pieces.
-        if constexpr (kVectors == 4 && !std::is_same_v<Access, Unaligned>)
+        // Beside aligned chunks, whole vectors across two cache lines would cost more than
+        // these pieces.
+        if constexpr (kVectors == 4 && !std::is_same_v<Access, RowEnd>)
             storeRgb24(d, pixels, dst, access);
         else
             for (size_t v = 0; v < kVectors; ++v)

@@ -76,6 +76,9 @@ struct Unaligned {
 // rely on it that no whole vector lies across two lines.
 struct Aligned : Unaligned {};
 
+// As Unaligned, for the ends of rows whose other chunks begin a cache line.
+struct RowEnd : Unaligned {};
+
 // Stores around the caches; the destination of every chunk begins a cache line.
 // Call hwy::FlushStream() once, after the last row.
 struct NonTemporal : Unaligned {

@@ -179,8 +179,9 @@ HWY_INLINE void walkFrom(Chunk<kUnits> chunk, size_t begin, size_t end, const Bo
     }
 
     if constexpr (kPolicy.tail == Tail::kOverlap) {
+        using End = std::conditional_t<std::is_same_v<Access, Unaligned>, Unaligned, RowEnd>;
         if (tail != end)
-            body(chunk, end - kUnits, Unaligned());
+            body(chunk, end - kUnits, End());
     } else if constexpr (kPolicy.tail == Tail::kExact) {
         if constexpr (kHasMaskedTails) {
             if (tail != end)
@@ -232,7 +233,7 @@ HWY_INLINE void walkAlignedRow(Chunk<kUnits> chunk, size_t count, const Body &bo
             body(chunk, 0, FirstUnits{head});
     } else {
         for (size_t i = 0; i < head; i += kUnits)
-            body(chunk, i, Unaligned());
+            body(chunk, i, RowEnd());
     }
     walkFrom<kPolicy, Access>(chunk, head, count, body, distance);
 }
