@@ -8,6 +8,7 @@
 #include "hwy/foreach_target.h"
 #include "hwy/highway.h"
 
+#include "rop/ropCopyRow-inl.h"
 #include "simd/pixelPattern-inl.h"
 #include "simd/rowLoop-inl.h"
 
@@ -138,53 +139,6 @@ void ropFillKernel(DstRows dst, ByteExtent extent, int32_t bytesPerPixel, RopCon
 
 // ---- Two surfaces ---------------------------------------------------------
 
-template <uint32_t kRop, class V>
-HWY_INLINE V combine(V s, V d) {
-    switch (kRop) {
-    case RASTER_ROP_AND:
-        return hn::And(s, d);
-    case RASTER_ROP_AND_REVERSE:
-        return hn::AndNot(d, s);
-    case RASTER_ROP_AND_INVERTED:
-        return hn::AndNot(s, d);
-    case RASTER_ROP_XOR:
-        return hn::Xor(s, d);
-    case RASTER_ROP_OR:
-        return hn::Or(s, d);
-    case RASTER_ROP_NOR:
-        return hn::Not(hn::Or(s, d));
-    case RASTER_ROP_EQUIV:
-        return hn::Not(hn::Xor(s, d));
-    case RASTER_ROP_OR_REVERSE:
-        return hn::Or(s, hn::Not(d));
-    case RASTER_ROP_COPY_INVERTED:
-        return hn::Not(s);
-    case RASTER_ROP_OR_INVERTED:
-        return hn::Or(hn::Not(s), d);
-    default:
-        return hn::Not(hn::And(s, d));
-    }
-}
-
-template <uint32_t kRop>
-struct RopCopyBody {
-    static constexpr size_t kDstBytes = 1;
-    uint8_t *dst;
-    const uint8_t *src;
-
-    template <class C, class Access>
-    HWY_INLINE void operator()(C /*chunk*/, size_t i, Access access) const {
-        const hn::CappedTag<uint8_t, C::kUnits> d;
-        constexpr size_t n = kLanes<decltype(d)>;
-        hn::Vec<decltype(d)> results[C::kUnits / n];
-        for (size_t v = 0; v < C::kUnits / n; ++v)
-            results[v] =
-                combine<kRop>(access.load(d, src + i + v * n), access.load(d, dst + i + v * n));
-        for (size_t v = 0; v < C::kUnits / n; ++v)
-            access.store(d, results[v], dst + i + v * n);
-    }
-};
-
 template <uint32_t kRop>
 void ropCopyRowsBy(DstRows dst, SrcRows src, ByteExtent extent, int32_t bytesPerPixel,
                    RowDirection direction) {
@@ -213,6 +167,9 @@ void ropCopyRowsApart(DstRows dst, SrcRows src, ByteExtent extent) {
     if (isOneMaskedVector(extent))
         forEachRow([&](const auto &body)
                        HWY_ATTR { body(Chunk<kVectorBytes>(), 0, FirstLanes{extent.rowBytes}); });
+    else if (kPrefetchesAhead && isNonTemporal(extent))
+        forEachRow([&](const auto &body)
+                       HWY_ATTR { ropCopyRowUncached<kRop>(body.dst, body.src, extent.rowBytes); });
     else
         forEachRow([&](const auto &body)
                        HWY_ATTR { walkRowOnce<1, kVectorsAtOnce>(extent.rowBytes, body); });
@@ -220,13 +177,13 @@ void ropCopyRowsApart(DstRows dst, SrcRows src, ByteExtent extent) {
 
 template <uint32_t... kRops>
 void ropCopyRowsByCode(uint32_t rop, DstRows dst, SrcRows src, ByteExtent extent,
-                       int32_t bytesPerPixel, RowDirection direction) {
-    if (rowsOverlap(dst, src, extent))
+                       int32_t bytesPerPixel, RowDirection direction, bool areApart) {
+    if (areApart)
+        (void)((rop == kRops && (ropCopyRowsApart<kRops>(dst, src, extent), true)) || ...);
+    else
         (void)((rop == kRops &&
                 (ropCopyRowsBy<kRops>(dst, src, extent, bytesPerPixel, direction), true)) ||
                ...);
-    else
-        (void)((rop == kRops && (ropCopyRowsApart<kRops>(dst, src, extent), true)) || ...);
 }
 
 // The one operation of these that does not read what it writes.
@@ -243,12 +200,13 @@ void ropCopyKernel(DstRows dst, SrcRows src, ByteExtent extent, int32_t bytesPer
     if (direction == RowDirection::kLeftToRight && areContiguous(dst, extent.rowBytes) &&
         areContiguous(src, extent.rowBytes))
         extent = asOneRow(extent);
-    if (rop == RASTER_ROP_COPY_INVERTED && isNonTemporal(extent) && !rowsOverlap(dst, src, extent))
+    const bool areApart = !rowsOverlap(dst, src, extent);
+    if (rop == RASTER_ROP_COPY_INVERTED && areApart && isNonTemporal(extent))
         return copyInvertedNonTemporal(dst, src, extent);
     ropCopyRowsByCode<RASTER_ROP_AND, RASTER_ROP_AND_REVERSE, RASTER_ROP_AND_INVERTED,
                       RASTER_ROP_XOR, RASTER_ROP_OR, RASTER_ROP_NOR, RASTER_ROP_EQUIV,
                       RASTER_ROP_OR_REVERSE, RASTER_ROP_COPY_INVERTED, RASTER_ROP_OR_INVERTED,
-                      RASTER_ROP_NAND>(rop, dst, src, extent, bytesPerPixel, direction);
+                      RASTER_ROP_NAND>(rop, dst, src, extent, bytesPerPixel, direction, areApart);
 }
 
 #else

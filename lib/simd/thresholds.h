@@ -49,6 +49,11 @@ constexpr bool isPrefetchedScale(ByteExtent src, int64_t srcStride, ByteExtent d
     return bytes >= kNonTemporalBytes && src.rowBytes >= (isContiguous ? 1 : 4) * kPrefetchUncached;
 }
 
+// Raster operations between surfaces, by vectors of up to 32 bytes: what is prefetched of
+// one surface before the other one's turn, twice its size ahead.  0.87 to 0.94 of the time
+// of AVX2; line by line gains nothing, and with 64 bytes in a vector pages of 4 KB lose.
+inline constexpr size_t kRopPrefetchBlock = 512;
+
 // ---- Lengths of rows, in bytes ---------------------------------------------
 
 // The fill: rows of up to so many vectors are stored unaligned, without a loop.
