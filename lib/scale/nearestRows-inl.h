@@ -123,6 +123,7 @@ struct NearestCopied : NearestRow {
 // Each pixel twice.  The units are source pixels.
 struct DoubleBody {
     static constexpr size_t kDstBytes = 8;
+    static constexpr bool kTestsEnd = true;
     uint8_t *dst;
     const uint8_t *src;
 
@@ -169,6 +170,7 @@ private:
 // Steps of up to kWindows pixels.  srcSize is kWindows chunks or more.
 template <uint32_t kWindows>
 struct NearestBody {
+    static constexpr bool kTestsEnd = kWindows > 1;
     uint8_t *dst;
     const uint8_t *src;
     uint32_t start, step;

@@ -29,6 +29,7 @@ struct FirstOfEachBody {
     static constexpr size_t kDstBytes = 4;
     // More than a chunk has where pointers do not move.
     static constexpr size_t kMovingUnits = 2 * kVectorPixels;
+    static constexpr bool kTestsEnd = true;
     uint8_t *dst;
     const uint8_t *src;
 

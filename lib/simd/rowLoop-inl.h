@@ -1,7 +1,7 @@
 // The walk along a row, written once for all kernels.
 //
-// A row is counted in units: pixels or bytes, as the kernel sees fit.  A kernel is
-// a body: a struct that holds what is constant along the row, and whose
+// A row is counted in units: pixels or bytes.  A kernel is a body: a struct that holds
+// what is constant along the row, and whose
 //
 //     template <class C, class Access>
 //     void operator()(C chunk, size_t i, Access access) const
@@ -12,8 +12,7 @@
 //     uint8_t *dst;                          // the row's first unit
 //     static constexpr size_t kDstBytes;     // of a unit
 //
-// one whose units go together in groups, of which rows and chunks have a whole
-// number, has
+// one whose units go in groups, of which rows and chunks have a whole number, has
 //
 //     static constexpr size_t kUnitsPerGroup;
 //
@@ -34,11 +33,13 @@
 //     template <class C> void takeNext(C chunk)      // not const
 //
 // the last of which handles the units at the pointers and moves these behind them; the
-// turns of an unrolled loop are one larger chunk.
+// turns of an unrolled loop are one larger chunk.  A body whose loop is faster where it
+// tests for its end, not for what is left, has
 //
-// A row is a head up to the first cache line, whole chunks, and a tail.  All three
-// run the same body, so that there is no second algorithm for the ends of rows,
-// and no byte outside the row is touched.
+//     static constexpr bool kTestsEnd
+//
+// A row is a head up to the first cache line, whole chunks, and a tail.  All three run the
+// same body: there is no second algorithm for the ends, and no byte outside is touched.
 //
 // Included once per instruction set; the usual guards do not apply.
 
@@ -68,8 +69,8 @@ enum class Tail {
     // One more chunk that ends with the row, over units that are done already: for
     // bodies that store the same bytes when run again.
     kOverlap,
-    // The same in the one loop there is, which is half the code, prefetches there, too,
-    // and has less to set up: for large bodies and short rows.
+    // The same in the one loop there is, which is half the code, prefetches too, and has
+    // less to set up: for large bodies and short rows.
     kOverlapInLoop,
     // Each unit once: a chunk of which only the first lanes are touched, where
     // kHasMaskedTails, else chunks of half the size, a quarter and so on.
@@ -129,8 +130,11 @@ HWY_INLINE void walkWholeChunks(size_t begin, size_t tail, const Body &body,
             moving.takeNext(Chunk<kUnits>());
         return;
     }
+    constexpr bool kTestsEnd = kPolicy.unroll == 1 && requires {
+        requires Body::kTestsEnd;
+    };
     size_t i = begin;
-    for (; tail - i >= kStep; i += kStep) {
+    for (; kTestsEnd ? i != tail : tail - i >= kStep; i += kStep) {
         if constexpr (kPolicy.prefetches)
             body.prefetch(Chunk<kStep>(), i, distance);
         walkTurns<Access, kUnits>(i, body, std::make_index_sequence<kPolicy.unroll>());
