@@ -19,6 +19,11 @@ TEST(Scale, equalsItsStatement) {
     // the cache must still hold, to the first.
     for (const uint32_t height : {21u, 22u, 23u, 43u})
         tryScaling(random, {{5, height, 20}, {5, 3, 20}, 0, 1637, 1, 0.05, 2});
+    // Every eighth pixel of rows that begin anywhere in a cache line.
+    for (uint32_t width = 520; width < 600; ++width) {
+        const auto stride = static_cast<int32_t>(4 * width);
+        tryScaling(random, {{width, 3, stride}, {76, 1, 304}, 0, 0, 0.125, 0.125, 0});
+    }
     // The whole of a source that is as wide as can be.
     for (const double scale : {std::nextafter(kMinScale, 1), 0.5, 1.0 / 3000, 1.0 / 257, 1.0})
         for (const uint32_t width : {1u, 40u, 32767u})

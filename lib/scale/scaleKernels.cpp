@@ -195,15 +195,11 @@ void walkDoubledRows(const ScaleJob &job) {
         walkDirect<false>(job, NearestDoubled<Unaligned>(job.x));
 }
 
-// Whether every eighth pixel is picked from whole vectors, not by itself: with 64 bytes
-// in a vector these take 0.7 of the time where none crosses a cache line and 1.2 where
-// all do, and 0.8 out of memory that no cache holds, as they ask for a row's lines at
-// once.
-bool picksEighthsFromVectors(const ScaleJob &job) {
-    const auto first = reinterpret_cast<uintptr_t>(job.src.first) + 4 * (job.x.start >> 16);
-    const auto stride = static_cast<uintptr_t>(job.src.stride);
-    const bool isAligned = kVectorBytes == 64 && (first | stride) % 64 == 0;
-    return kHasInterleavedAccess || isAligned || isNonTemporal(job.dstExtent());
+// Whether every eighth pixel is loaded by a loop for that.  Gathers take 0.8 of its time in
+// short rows, which are too short for vectors that begin with cache lines.
+bool loadsEighths(const ScaleJob &job) {
+    return !kHasFastGather || job.x.dstSize >= kEighthsInLinesFrom ||
+           isNonTemporal(job.dstExtent());
 }
 
 // Columns are nearest pixels.  Rows can be blends or averages only where columns are
@@ -227,7 +223,7 @@ void scaleNearest(const ScaleJob &job, void *cache) {
         walkFirstOfEachRows<2>(job);
     else if (step == 4 * kScaleOne)
         walkFirstOfEachRows<4>(job);
-    else if (step == 8 * kScaleOne && picksEighthsFromVectors(job))
+    else if (step == 8 * kScaleOne && loadsEighths(job))
         walkFirstOfEachRows<8>(job);
     else if (canPick(2))
         walkNearestRows<NearestPicked, 2>(job);
