@@ -86,21 +86,31 @@ struct BitReader {
     }
 };
 
-// The bits of a row of 1 to 64 pixels, by loads that may overlap; the bits behind
-// them are 0.
-HWY_INLINE uint64_t readShortRow(const uint8_t *row, size_t width) {
-    const size_t bytes = (width + 7) / 8;
-    uint64_t bits = row[0];
-    if (bytes < 4) {
-        const size_t middle = bytes / 2, last = bytes - 1;
-        bits |= uint64_t{row[middle]} << 8 * middle | uint64_t{row[last]} << 8 * last;
-    } else {
-        uint32_t first4 = 0, last4 = 0;
-        hwy::CopyBytes<4>(row, &first4);
-        hwy::CopyBytes<4>(row + bytes - 4, &last4);
-        bits = first4 | uint64_t{last4} << 8 * (bytes - 4);
+// The bits of rows of 1 to 64 pixels, by loads that may overlap; the bits behind them are 0.
+// kHasWords tells that a row has four bytes or more.
+template <bool kHasWords>
+class ShortRowReader {
+public:
+    explicit ShortRowReader(size_t width)
+        : bytes_((width + 7) / 8), pixels_(leftmostPixels(width)) {}
+
+    HWY_INLINE uint64_t read(const uint8_t *row) const {
+        if constexpr (kHasWords) {
+            uint32_t first4 = 0, last4 = 0;
+            hwy::CopyBytes<4>(row, &first4);
+            hwy::CopyBytes<4>(row + bytes_ - 4, &last4);
+            return (first4 | uint64_t{last4} << 8 * (bytes_ - 4)) & pixels_;
+        } else {
+            const size_t middle = bytes_ / 2, last = bytes_ - 1;
+            return (row[0] | uint64_t{row[middle]} << 8 * middle |
+                    uint64_t{row[last]} << 8 * last) &
+                   pixels_;
+        }
     }
-    return bits & leftmostPixels(width);
-}
+
+private:
+    size_t bytes_;
+    uint64_t pixels_;
+};
 
 } // namespace quillon

@@ -134,15 +134,23 @@ void stencilRowsBy(DstRows dst, SrcRows bits, Extent extent, uint32_t pixel) {
     }
 }
 
+template <size_t kBytes, bool kHasWords>
+HWY_NOINLINE void stencilShortRows(DstRows dst, SrcRows bits, Extent extent, uint32_t pixel) {
+    const Stencil<kBytes> stencil(pixel);
+    const ShortRowReader<kHasWords> reader(extent.width);
+    for (size_t y = 0; y < extent.height; ++y)
+        stencil.storeFirst(reader.read(bits.row(y)), dst.row(y), extent.width);
+}
+
 template <size_t kBytes>
 void stencilRows(DstRows dst, SrcRows bits, Extent extent, uint32_t pixel) {
     if (extent.width < kStencilShortRow) {
         for (size_t y = 0; y < extent.height; ++y)
             stencilRowPlain<kBytes>(dst.row(y), bits.row(y), extent.width, pixel);
+    } else if (extent.width <= 24) {
+        stencilShortRows<kBytes, false>(dst, bits, extent, pixel);
     } else if (extent.width < 64) {
-        const Stencil<kBytes> stencil(pixel);
-        for (size_t y = 0; y < extent.height; ++y)
-            stencil.storeFirst(readShortRow(bits.row(y), extent.width), dst.row(y), extent.width);
+        stencilShortRows<kBytes, true>(dst, bits, extent, pixel);
     } else if (isPrefetchedStencil(inBytes(extent, kBytes))) {
         stencilRowsBy<kBytes, true>(dst, bits, extent, pixel);
     } else {
